@@ -1,0 +1,45 @@
+# Language level, output folders, warnings, sanitizers: what every target of this tree shares.
+
+set(CMAKE_CXX_STANDARD 20)
+set(CMAKE_CXX_STANDARD_REQUIRED ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+set(CMAKE_C_VISIBILITY_PRESET hidden)
+set(CMAKE_CXX_VISIBILITY_PRESET hidden)
+set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
+
+if(PROJECT_IS_TOP_LEVEL)
+  set(CMAKE_EXPORT_COMPILE_COMMANDS ON)
+  set(CMAKE_RUNTIME_OUTPUT_DIRECTORY "${CMAKE_BINARY_DIR}/bin")
+  set(CMAKE_LIBRARY_OUTPUT_DIRECTORY "${CMAKE_BINARY_DIR}/lib")
+  # The static pieces are an inner matter; lib/ shows only what a user links.
+  set(CMAKE_ARCHIVE_OUTPUT_DIRECTORY "${CMAKE_BINARY_DIR}/archive")
+
+  if(NOT CMAKE_BUILD_TYPE AND NOT CMAKE_CONFIGURATION_TYPES)
+    set(CMAKE_BUILD_TYPE Release CACHE STRING "Build type" FORCE)
+  endif()
+
+  find_program(ZR_CCACHE ccache)
+  if(ZR_CCACHE AND NOT CMAKE_CXX_COMPILER_LAUNCHER)
+    set(CMAKE_C_COMPILER_LAUNCHER "${ZR_CCACHE}")
+    set(CMAKE_CXX_COMPILER_LAUNCHER "${ZR_CCACHE}")
+  endif()
+endif()
+
+# Linked PRIVATE by every target of our own; generated code included.
+add_library(zr_warnings INTERFACE)
+target_compile_options(zr_warnings INTERFACE -Wall -Wextra -Wpedantic -Wshadow -Werror)
+
+if(ZR_SANITIZE)
+  add_compile_options(-fsanitize=${ZR_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
+  add_link_options(-fsanitize=${ZR_SANITIZE})
+endif()
+
+# zr_add_folders(FOLDER...): add_subdirectory() for each that is there.
+function(zr_add_folders)
+  foreach(folder IN LISTS ARGN)
+    if(EXISTS "${PROJECT_SOURCE_DIR}/${folder}/CMakeLists.txt")
+      add_subdirectory("${PROJECT_SOURCE_DIR}/${folder}" "${PROJECT_BINARY_DIR}/${folder}")
+    endif()
+  endforeach()
+endfunction()
