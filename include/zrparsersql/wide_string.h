@@ -205,6 +205,40 @@ class ZR_API CString {
         return static_cast<std::size_t>(mix(state ^ rest));
     }
 
+    // Friends found through an operand that is a CString, so that they take no part in anyone else's
+    // comparisons.
+    friend bool operator==(const CString& left, const CString& right) noexcept {
+        return left.rep_ == right.rep_ || left.View() == right.View();
+    }
+    friend bool operator==(const CString& left, std::u16string_view right) noexcept {
+        return left.View() == right;
+    }
+    friend bool operator==(const CString& left, const std::u16string& right) noexcept {
+        return left.View() == std::u16string_view(right);
+    }
+    friend bool operator==(const CString& left, const char16_t* right) noexcept {
+        return left.View() == std::u16string_view(right);
+    }
+    friend bool operator<(const CString& left, const CString& right) noexcept {
+        return left.Compare(right) < 0;
+    }
+
+    friend CString operator+(const CString& left, const CString& right) {
+        return concatenate(left.View(), right.View());
+    }
+    friend CString operator+(const CString& left, std::u16string_view right) {
+        return concatenate(left.View(), right);
+    }
+    friend CString operator+(std::u16string_view left, const CString& right) {
+        return concatenate(left, right.View());
+    }
+    friend CString operator+(const CString& left, const char16_t* right) {
+        return concatenate(left.View(), right);
+    }
+    friend CString operator+(const char16_t* left, const CString& right) {
+        return concatenate(left, right.View());
+    }
+
     friend void swap(CString& a, CString& b) noexcept {
         Rep* rep = a.rep_;
         a.rep_ = b.rep_;
@@ -212,9 +246,6 @@ class ZR_API CString {
     }
 
  private:
-    friend ZR_API CString operator+(const CString& left, std::u16string_view right);
-    friend ZR_API CString operator+(std::u16string_view left, const CString& right);
-
     // Header of a shared buffer; the units and a zero stand behind it.
     struct Rep {
         std::atomic<std::uint32_t> owners;
@@ -254,34 +285,6 @@ class ZR_API CString {
 };
 
 inline zr::FormatArgument::FormatArgument(const CString& value) : kind(Kind::Text), text(value.View()) {}
-
-inline bool operator==(const CString& left, const CString& right) noexcept {
-    return left.View() == right.View();
-}
-inline bool operator==(const CString& left, std::u16string_view right) noexcept {
-    return left.View() == right;
-}
-inline bool operator==(const CString& left, const char16_t* right) noexcept {
-    return left.View() == std::u16string_view(right);
-}
-inline bool operator==(const CString& left, const std::u16string& right) noexcept {
-    return left.View() == right;
-}
-inline bool operator<(const CString& left, const CString& right) noexcept {
-    return left.Compare(right) < 0;
-}
-
-ZR_API CString operator+(const CString& left, std::u16string_view right);
-ZR_API CString operator+(std::u16string_view left, const CString& right);
-inline CString operator+(const CString& left, const CString& right) {
-    return left + right.View();
-}
-inline CString operator+(const CString& left, const char16_t* right) {
-    return left + std::u16string_view(right);
-}
-inline CString operator+(const char16_t* left, const CString& right) {
-    return std::u16string_view(left) + right;
-}
 
 template <>
 struct std::hash<CString> {
