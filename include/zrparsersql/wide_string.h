@@ -163,8 +163,6 @@ class ZR_API CString {
         append(std::u16string_view(&unit, 1));
         return *this;
     }
-    // Makes room for a text of that many units, so that appending up to it copies nothing.
-    void Reserve(int units);
 
     // Replaces the text by a printf-like picture. Conversions: %s (char16_t text or CString), %c (a unit), %d
     // %i %u %x %X with the sizes h, hh, l, ll and I64, %f with an optional precision, %%; flags '-', '+', ' '
@@ -264,7 +262,11 @@ class ZR_API CString {
         if (rep) rep->owners.fetch_add(1, std::memory_order_relaxed);
     }
     static void release(Rep* rep) noexcept {
-        if (rep && rep->owners.fetch_sub(1, std::memory_order_acq_rel) == 1) destroy(rep);
+        if (!rep) return;
+        // The last owner needs no read-modify-write: nobody else can take a share any more.
+        if (rep->owners.load(std::memory_order_acquire) == 1 ||
+            rep->owners.fetch_sub(1, std::memory_order_acq_rel) == 1)
+            destroy(rep);
     }
     static Rep* create(std::size_t length, std::size_t capacity);
     static void destroy(Rep* rep) noexcept;
