@@ -1,0 +1,37 @@
+#pragma once
+
+#include <antlr3.h>
+#include <zrparsersql/recognizers/MSSQL.h>
+
+#include <type_traits>
+
+namespace zr {
+
+// The recognisers of one grammar as the pipeline calls them.
+template <auto LexerNewSSD, auto ParserNewSSD, auto StartRule>
+struct Recognizers {
+    static constexpr bool areThere = true;
+    using Lexer =
+        std::invoke_result_t<decltype(LexerNewSSD), pANTLR3_INPUT_STREAM, pANTLR3_RECOGNIZER_SHARED_STATE>;
+    using Parser = std::invoke_result_t<decltype(ParserNewSSD), pANTLR3_COMMON_TOKEN_STREAM,
+                                        pANTLR3_RECOGNIZER_SHARED_STATE>;
+
+    static Lexer newLexer(pANTLR3_INPUT_STREAM input) { return LexerNewSSD(input, nullptr); }
+    static Parser newParser(pANTLR3_COMMON_TOKEN_STREAM tokens) { return ParserNewSSD(tokens, nullptr); }
+    static ZRRuleReturn run(Parser parser) { return (parser->*StartRule)(parser); }
+};
+
+// Stands for a grammar that is not written yet: its facade parses nothing.
+struct NoRecognizers {
+    static constexpr bool areThere = false;
+};
+
+// The grammar of each facade.
+using MssqlRecognizers =
+    Recognizers<MSSQLLexerNewSSD, MSSQLParserNewSSD, &MSSQLParser_Ctx_struct::start_rule>;
+using OracleRecognizers = NoRecognizers;
+using MySqlRecognizers = NoRecognizers;
+using PostgreSqlRecognizers = NoRecognizers;
+using MsAccessRecognizers = NoRecognizers;
+
+}  // namespace zr
