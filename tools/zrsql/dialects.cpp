@@ -1,0 +1,76 @@
+#include "dialects.h"
+
+#include <zrparsersql/recognizers/MSSQL.h>
+#include <zrparsersql/recognizers/MSSQL_tokens.h>
+
+#include <new>
+#include <type_traits>
+
+namespace zr::tool {
+
+namespace {
+
+template <class Context>
+std::shared_ptr<void> keep(Context* context) {
+    if (!context) throw std::bad_alloc();
+    return {context, [](void* kept) {
+                auto* typed = static_cast<Context*>(kept);
+                typed->free(typed);
+            }};
+}
+
+template <auto NewLexer, auto NewParser, auto StartRule, auto QueryRule, auto TokenName>
+constexpr Grammar grammarOf() {
+    using Parser = std::remove_pointer_t<decltype(NewParser(nullptr))>;
+    return {
+        [](pANTLR3_INPUT_STREAM input, pANTLR3_TOKEN_SOURCE& source) {
+            auto* lexer = NewLexer(input);
+            auto kept = keep(lexer);
+            source = lexer->pLexer->rec->state->tokSource;
+            return kept;
+        },
+        [](pANTLR3_COMMON_TOKEN_STREAM tokens) { return keep(NewParser(tokens)); },
+        [](void* parser) -> pANTLR3_BASE_TREE {
+            auto* typed = static_cast<Parser*>(parser);
+            return (typed->*StartRule)(typed).tree;
+        },
+        [](void* parser) {
+            auto* typed = static_cast<Parser*>(parser);
+            (typed->*QueryRule)(typed);
+        },
+        TokenName,
+    };
+}
+
+#define ZR_GRAMMAR(NAME, QUERY_RULE)                                                                \
+    grammarOf<NAME##LexerNew, NAME##ParserNew, &std::remove_pointer_t<p##NAME##Parser>::start_rule, \
+              &std::remove_pointer_t<p##NAME##Parser>::QUERY_RULE, NAME##_token_name>()
+
+constexpr Grammar kMssql = ZR_GRAMMAR(MSSQL, all_sql_query);
+
+#undef ZR_GRAMMAR
+
+constexpr Dialect kDialects[] = {
+    {"mssql", &kMssql, DB_MSSQL},           {"mssqlfrom", nullptr, DB_NONE},
+    {"mysql", nullptr, DB_MYSQL},           {"oracle", nullptr, DB_ORACLE},
+    {"postgresql", nullptr, DB_POSTGRESQL}, {"msaccess", nullptr, DB_MSACCESS},
+};
+
+}  // namespace
+
+const Dialect* findDialect(std::string_view name) {
+    for (const Dialect& dialect : kDialects)
+        if (dialect.name == name) return &dialect;
+    return nullptr;
+}
+
+std::string dialectNames() {
+    std::string names;
+    for (const Dialect& dialect : kDialects) {
+        if (!names.empty()) names += ", ";
+        names += dialect.name;
+    }
+    return names;
+}
+
+}  // namespace zr::tool

@@ -1,0 +1,119 @@
+#include "options.h"
+
+#include <CLI/CLI.hpp>
+#include <iostream>
+
+namespace zr::tool {
+
+namespace {
+
+constexpr unsigned kMostJobs = 256;
+
+// What the command line says, before it is checked as a whole.
+struct Words {
+    std::string dialect;
+    std::string text;
+    std::string file;
+    std::string jsonLines;
+    std::string format;
+    std::string catalog;
+    unsigned jobs = 1;
+};
+
+CLI::App* addCommand(CLI::App& app, Words& words, const std::string& name, const std::string& help) {
+    CLI::App* command = app.add_subcommand(name, help);
+    command->add_option("-d,--dialect", words.dialect, "Dialect of the text: " + dialectNames())
+        ->required()
+        ->type_name("DIALECT");
+    CLI::Option* text =
+        command->add_option("TEXT", words.text, "The SQL text; - or nothing reads standard input");
+    CLI::Option* file = command
+                            ->add_option("-f,--file", words.file,
+                                         "Read the SQL text from a file (UTF-8); - is standard input")
+                            ->type_name("FILE")
+                            ->excludes(text);
+    CLI::Option* jsonLines =
+        command
+            ->add_option("--jsonl", words.jsonLines,
+                         "Read {\"id\": ..., \"sql\": \"...\"} a line and write one JSON object a line; "
+                         "- is standard input")
+            ->type_name("FILE")
+            ->excludes(text)
+            ->excludes(file);
+    command->add_option("--jobs", words.jobs, "Threads to work on the lines of --jsonl")
+        ->check(CLI::Range(1u, kMostJobs))
+        ->needs(jsonLines)
+        ->type_name("N");
+    return command;
+}
+
+void addFormat(CLI::App* command, Words& words, const std::vector<std::string>& formats) {
+    command->add_option("--format", words.format, "Form of the output: " + CLI::detail::join(formats, ", "))
+        ->check(CLI::IsMember(formats))
+        ->type_name("FORMAT");
+}
+
+TreeFormat treeFormat(const std::string& name) {
+    if (name == "json") return TreeFormat::Json;
+    if (name == "dot") return TreeFormat::Dot;
+    return name == "pretty" ? TreeFormat::Pretty : TreeFormat::Sexpr;
+}
+
+// Empty, or why the dialect can't serve the command.
+std::string complaintAbout(const Dialect* dialect, const Words& words, Command command) {
+    if (!dialect) return "there is no dialect \"" + words.dialect + "\"; there are " + dialectNames();
+    if (command == Command::Analyze && dialect->kind == DB_NONE)
+        return words.dialect + " has tokens and a tree only; there is no analysis of it";
+    if (!dialect->grammar) return "the grammar of " + words.dialect + " is not part of this build yet";
+    return {};
+}
+
+}  // namespace
+
+std::optional<Options> readOptions(int argc, char** argv, int& exitStatus) {
+    CLI::App app("Shows what the library libzrparsersql sees in a SQL text.", "zrsql");
+    app.set_version_flag("--version", std::string("zrsql " ZR_VERSION));
+    app.require_subcommand(1);
+    Words words;
+    const CLI::App* tokens = addCommand(app, words, "tokens", "Show the tokens of the text");
+    CLI::App* tree = addCommand(app, words, "tree", "Show the syntax tree of the text");
+    addFormat(tree, words, {"sexpr", "json", "dot", "pretty"});
+    CLI::App* analyze = addCommand(app, words, "analyze", "Show the query's descriptor");
+    addFormat(analyze, words, {"json", "pretty"});
+    analyze
+        ->add_option("--catalog", words.catalog,
+                     "Tables of the database (JSON), to resolve the query's sources")
+        ->type_name("FILE");
+
+    try {
+        app.parse(argc, argv);
+    } catch (const CLI::Success& asked) {  // help or version
+        exitStatus = app.exit(asked);
+        return std::nullopt;
+    } catch (const CLI::ParseError& wrong) {
+        std::cerr << "zrsql: " << wrong.what() << "\nzrsql: try \"zrsql --help\"\n";
+        exitStatus = 2;
+        return std::nullopt;
+    }
+
+    Options options;
+    options.command = tokens->parsed() ? Command::Tokens : tree->parsed() ? Command::Tree : Command::Analyze;
+    options.dialect = findDialect(words.dialect);
+    if (const std::string complaint = complaintAbout(options.dialect, words, options.command);
+        !complaint.empty()) {
+        std::cerr << "zrsql: " << complaint << '\n';
+        exitStatus = 2;
+        return std::nullopt;
+    }
+    CLI::App* used = app.get_subcommands().front();
+    if (used->count("TEXT") && words.text != "-") options.text = words.text;
+    if (!words.file.empty()) options.file = words.file;
+    options.jsonLines = words.jsonLines;
+    options.treeFormat = treeFormat(words.format);
+    options.asPicture = words.format == "pretty";
+    options.catalog = words.catalog;
+    options.jobs = words.jobs;
+    return options;
+}
+
+}  // namespace zr::tool

@@ -1,0 +1,313 @@
+#include "picture.h"
+
+#include <algorithm>
+#include <deque>
+#include <map>
+#include <optional>
+#include <set>
+#include <vector>
+
+#include "descriptor_access.h"
+#include "expression_text.h"
+#include "zrparsersql/database_info.h"
+
+namespace zr::tool {
+
+namespace {
+
+using Text = std::u16string;
+
+template <class Integer>
+Text number(Integer value) {
+    const std::string digits = std::to_string(value);
+    return Text(digits.begin(), digits.end());
+}
+
+Text lowered(const CString& name) {
+    CString lower = name;
+    return Text(lower.MakeLower().View());
+}
+
+// Calls visit for an item and everything below it, nested queries left out, in order.
+template <class Visit>
+void forEachItem(const SelectItem& root, Visit visit) {
+    std::vector<const SelectItem*> todo = {&root};
+    while (!todo.empty()) {
+        const SelectItem* item = todo.back();
+        todo.pop_back();
+        visit(*item);
+        std::vector<const SelectItem*> below(item->m_items.begin(), item->m_items.end());
+        todo.insert(todo.end(), below.rbegin(), below.rend());
+    }
+}
+
+void joinTo(Text& text, const Text& part, std::u16string_view between) {
+    if (!text.empty()) text += between;
+    text += part;
+}
+
+// Lines of cells, each column as wide as its widest cell, up to a bound.
+class Table {
+ public:
+    void add(std::vector<Text> cells) { lines_.push_back(std::move(cells)); }
+    void appendTo(Text& out) const {
+        static constexpr std::size_t widest = 40;
+        std::vector<std::size_t> widths;
+        for (const auto& cells : lines_) {
+            widths.resize(std::max(widths.size(), cells.size()));
+            for (std::size_t at = 0; at < cells.size(); ++at)
+                widths[at] = std::max(widths[at], std::min(cells[at].size(), widest));
+        }
+        for (const auto& cells : lines_) {
+            Text line = u" ";
+            for (std::size_t at = 0; at < cells.size(); ++at) {
+                line += u' ' + cells[at];
+                if (at + 1 < cells.size())
+                    line.append(widths[at] + 1 - std::min(cells[at].size(), widths[at]), u' ');
+            }
+            line.erase(line.find_last_not_of(u' ') + 1);
+            out += line + u'\n';
+        }
+    }
+
+ private:
+    std::vector<std::vector<Text>> lines_;
+};
+
+// Query descriptors get numbers as they are met; the picture shows them one below the other.
+class Numbering {
+ public:
+    Text nameOf(const CZRQueryInfo& query) { return u"query " + number(numberOf(query)); }
+    std::size_t numberOf(const CZRQueryInfo& query) {
+        const auto [found, isNew] = numbers_.try_emplace(&query, numbers_.size() + 1);
+        if (isNew) queries_.push_back(&query);
+        return found->second;
+    }
+    const CZRQueryInfo* next() {
+        if (queries_.empty()) return nullptr;
+        const CZRQueryInfo* query = queries_.front();
+        queries_.pop_front();
+        return query;
+    }
+
+ private:
+    std::map<const CZRQueryInfo*, std::size_t> numbers_;
+    std::deque<const CZRQueryInfo*> queries_;
+};
+
+// Which name of the FROM clause means what.
+class FromNames {
+ public:
+    FromNames(const CZRQueryInfo& query, Numbering& numbering) {
+        for (const SelectItem* from : query.m_fromItems)
+            forEachItem(*from, [&](const SelectItem& item) {
+                if (isAlias(item))
+                    addAlias(*item.m_items.GetHead(), item.m_items.GetTail()->m_text, numbering);
+            });
+    }
+
+    // What an alias stands for; empty for a name that is none.
+    Text meaningOf(const CString& alias) const {
+        const auto found = meanings_.find(lowered(alias));
+        return found == meanings_.end() ? Text() : found->second;
+    }
+    // The aliases of a table, in order.
+    Text aliasesOf(const CString& table) const {
+        Text aliases;
+        for (const auto& [name, alias] : tableAliases_)
+            if (name == lowered(table)) joinTo(aliases, Text(alias.View()), u", ");
+        return aliases;
+    }
+
+ private:
+    void addAlias(const SelectItem& source, const CString& alias, Numbering& numbering) {
+        const ItemClass itemClass = classOf(source);
+        if (itemClass.query) {
+            meanings_[lowered(alias)] = numbering.nameOf(*itemClass.query);
+        } else if (itemClass.field) {
+            const CString& table = itemClass.field->m_sourceTable;
+            meanings_[lowered(alias)] = Text(table.View());
+            tableAliases_.emplace_back(lowered(table), alias);
+        }
+    }
+
+    std::map<Text, Text> meanings_;
+    std::vector<std::pair<Text, CString>> tableAliases_;
+};
+
+class QueryPicture {
+ public:
+    QueryPicture(Text& out, const CZRQueryInfo& query, Numbering& numbering)
+        : out_(out), query_(query), numbering_(numbering), names_(query, numbering) {}
+
+    void draw() {
+        drawColumns();
+        drawSources();
+        drawClauses();
+    }
+
+ private:
+    void drawColumns() {
+        out_ += u"\nColumns\n";
+        if (query_.m_selectItems.IsEmpty() && !query_.m_subQueries.IsEmpty()) {
+            out_ += u"  none: a nested query stands in the first clause, and there the analysis ends\n";
+            return;
+        }
+        if (query_.m_selectItems.IsEmpty()) {
+            out_ += u"  none\n";
+            return;
+        }
+        Table table;
+        std::size_t place = 0;
+        for (const SelectItem* item : query_.m_selectItems) {
+            const Text origin = originOf(*item);
+            table.add({number(++place), columnName(*item), columnExpression(*item),
+                       origin.empty() ? origin : u"from " + origin});
+        }
+        table.appendTo(out_);
+    }
+
+    static Text columnName(const SelectItem& item) {
+        if (isAlias(item)) return Text(item.m_items.GetTail()->m_text.View());
+        if (const SelectItemField* field = classOf(item).field)
+            return Text(field->m_sourceField.IsEmpty() ? field->m_text.View() : field->m_sourceField.View());
+        return u"-";
+    }
+
+    Text columnExpression(const SelectItem& item) {
+        return expression(isAlias(item) ? *item.m_items.GetHead() : item);
+    }
+
+    // The columns of sources that an expression reads, each once, in order.
+    Text originOf(const SelectItem& root) {
+        Text origin;
+        std::set<Text> seen;
+        forEachItem(root, [&](const SelectItem& item) {
+            const ItemClass itemClass = classOf(item);
+            Text one;
+            if (itemClass.field)
+                one = originOfField(*itemClass.field);
+            else if (itemClass.query)
+                one = numbering_.nameOf(*itemClass.query);
+            if (!one.empty() && seen.insert(one).second) joinTo(origin, one, u", ");
+        });
+        return origin;
+    }
+
+    Text originOfField(const SelectItemField& field) const {
+        Text source;
+        if (!field.m_tableAlias.IsEmpty())
+            source = names_.meaningOf(field.m_tableAlias);
+        else if (!field.m_sourceTable.IsEmpty())
+            source = Text(field.m_sourceTable.View());
+        else
+            source = onlySourceOf(field.m_sourceField);
+        if (field.m_sourceField.IsEmpty()) return source;
+        return (source.empty() ? u"?" : source) + u"." + Text(field.m_sourceField.View());
+    }
+
+    // The source of a column that is written without one: the only source there is, or the only one of the
+    // catalogue that has the column; empty when that leaves it open.
+    Text onlySourceOf(const CString& column) const {
+        if (query_.m_sourceTables.GetCount() == 1) return Text(query_.m_sourceTables.begin()->key.View());
+        Text source;
+        for (const auto* entry : sortedEntries(query_.m_sourceTables)) {
+            CZRSourceInfo* known = query_.FindSource(entry->key);
+            if (!known || !known->FindFieldBySrcName(column)) continue;
+            if (!source.empty()) return {};
+            source = Text(entry->key.View());
+        }
+        return source;
+    }
+
+    void drawSources() {
+        if (query_.m_sourceTables.IsEmpty()) return;
+        out_ += u"\nSources\n";
+        const bool hasCatalog = query_.m_database && !query_.m_database->Tables.IsEmpty();
+        Table table;
+        for (const auto* entry : sortedEntries(query_.m_sourceTables)) {
+            const Text aliases = names_.aliasesOf(entry->key);
+            Text resolved;
+            if (hasCatalog)
+                resolved = query_.FindSource(entry->key) ? u"known as " + Text(entry->value.View())
+                                                         : u"not in the catalogue";
+            table.add({Text(entry->key.View()), aliases.empty() ? aliases : u"as " + aliases, resolved});
+        }
+        table.appendTo(out_);
+    }
+
+    void drawClauses() {
+        Table table;
+        static constexpr std::u16string_view predicates[] = {u"", u"ALL", u"DISTINCT", u"DISTINCTROW",
+                                                             u"", u"*"};
+        if (query_.m_predicate > 0 && query_.m_predicate < static_cast<int>(std::size(predicates)))
+            table.add({u"predicate", Text(predicates[query_.m_predicate])});
+        if (query_.m_hasLimit) table.add({u"limit", limitText()});
+        addClause(table, u"from", query_.m_fromItems, u", ");
+        if (query_.m_whereItem) addClause(table, u"where", query_.m_whereItem->m_items, u" ");
+        addClause(table, u"group by", query_.m_groupItems, u", ");
+        addClause(table, u"having", query_.m_havingItems, u" ");
+        addClause(table, u"order by", query_.m_orderItems, u", ");
+        addClause(table, u"union", query_.m_unionItems, u", ");
+        Text clauses;
+        table.appendTo(clauses);
+        if (!clauses.empty()) out_ += u"\nClauses\n" + clauses;
+    }
+
+    Text limitText() const {
+        const Text count = number(query_.m_limitCount) + u" rows";
+        return query_.m_limitOffset ? count + u" from row " + number(query_.m_limitOffset) : count;
+    }
+
+    void addClause(Table& table, const Text& name, const CList<SelectItem*>& items,
+                   std::u16string_view between) {
+        Text text;
+        for (const SelectItem* item : items) joinTo(text, expression(*item), between);
+        if (!items.IsEmpty()) table.add({name, text});
+    }
+
+    Text expression(const SelectItem& item) {
+        return expressionText(
+            item, [this](const CZRQueryInfo& query) { return u"(" + numbering_.nameOf(query) + u")"; });
+    }
+
+    Text& out_;
+    const CZRQueryInfo& query_;
+    Numbering& numbering_;
+    FromNames names_;
+};
+
+void drawText(Text& out, std::u16string_view text) {
+    out += u"SQL\n";
+    while (!text.empty()) {
+        const std::size_t end = text.find_first_of(u"\r\n");
+        const std::u16string_view line = text.substr(0, end);
+        out += line.empty() ? Text(u"\n") : u"  " + Text(line) + u'\n';
+        if (end == text.npos) break;
+        text.remove_prefix(end + (text.substr(end, 2) == u"\r\n" ? 2 : 1));
+    }
+}
+
+void drawStop(Text& out, const ReadPlace& place) {
+    if (!place.stop) return;
+    out += u"\nRead " + number(place.taken) + u" of " + number(place.all) + u" tokens; stopped at line " +
+           number(place.stop->line) + u", column " + number(place.stop->column) + u", before \"" +
+           place.stop->text + u"\"\n";
+}
+
+}  // namespace
+
+void drawPicture(std::string& out, const CString& text, const CZRQueryInfo& root, const ReadPlace& place) {
+    Text picture;
+    drawText(picture, text);
+    Numbering numbering;
+    numbering.numberOf(root);
+    while (const CZRQueryInfo* query = numbering.next()) {
+        if (query != &root) picture += u"\n" + Text(u"Query ") + number(numbering.numberOf(*query)) + u'\n';
+        QueryPicture(picture, *query, numbering).draw();
+    }
+    drawStop(picture, place);
+    out += CString(picture).toUtf8();
+}
+
+}  // namespace zr::tool
