@@ -1,0 +1,50 @@
+#pragma once
+
+#include "grammar/compiler/grammar_model.h"
+#include "grammar/compiler/program.h"
+
+/// The passes behind the readers, in the order in which main.cpp runs them.
+namespace zr::gc {
+
+/// Resolves rule names, finds the statement rule, unwraps bodies that are one optional, and refuses what
+/// can't work: undefined or unreachable rules, left recursion, loops over an empty body.
+void resolve(ParserGrammar& grammar);
+
+/// What every later pass asks about a rule. Sets hold token numbers, end of file as kEof.
+struct Facts {
+    std::vector<bool> nullable;
+    std::vector<std::set<int>> first, last;
+    /// What a rule can take while no opener has been taken: its tokens without those of nested statements
+    /// (the island) and of complements such as `'\'' (~'\'')*`, which are only reached through their opener.
+    std::vector<std::set<int>> outside;
+    std::set<int> openers;
+
+    bool nullableElement(const Element& e) const;
+    bool nullableBody(const std::vector<Alternative>& alternatives) const;
+    std::set<int> firstElement(const Element& e) const;
+};
+Facts collectFacts(const ParserGrammar& grammar);
+
+/// Lowers the rules to one program of nodes; see program.h.
+Program lower(const ParserGrammar& grammar, const Facts& facts);
+
+/// The token whose optional, dropped occurrences may be taken as a run (see docs/recogniser.md), or -1 when
+/// the grammar doesn't allow it. Fills the reason why not.
+int findCloser(const ParserGrammar& grammar, const Facts& facts, const Program& program, std::string& why);
+
+/// Turns plain optional nodes of the closer into Soft nodes.
+void applyCloser(Program& program, int closer);
+
+/// FIRST sets, merge points, guards, token classes: everything the tables hold that follows from the nodes.
+void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts, int maxToken);
+
+/// Lexer: one automaton for the longest match over all rules, and one program a rule for single-rule calls.
+LexerProgram buildLexer(const LexerGrammar& grammar);
+
+struct Output {
+    std::string headerDirectory, sourceFile;
+};
+void emit(const Vocabulary& vocabulary, const LexerGrammar& lexer, const LexerProgram& lexerProgram,
+          const ParserGrammar& parser, const Facts& facts, const Program& program, const Output& output);
+
+}  // namespace zr::gc

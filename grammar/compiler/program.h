@@ -1,0 +1,87 @@
+#pragma once
+
+#include <cstdint>
+#include <set>
+#include <string>
+#include <vector>
+
+#include "grammar/compiler/grammar_model.h"
+
+/// The lowered form: what the tables will hold, still with readable containers.
+namespace zr::gc {
+
+enum class Op : std::uint8_t {
+    Token,       ///< takes the token `arg`
+    Set,         ///< takes a token of set `arg`
+    Call,        ///< runs rule `arg`
+    Choice,      ///< tries the targets in order
+    Soft,        ///< takes the closer if it is there, dropped; decided later (see docs/recogniser.md)
+    SoftStar,    ///< the same, any number
+    Root,        ///< the tree so far becomes the children of an imaginary node `arg`
+    ScopeBegin,  ///< an inlined rule starts: marks inside work on its own tree
+    ScopeEnd,    ///< and ends: its tree goes to the outer one by the mark of its ScopeBegin
+    End          ///< the rule is done
+};
+
+struct Node {
+    explicit Node(Op o) : op(o) {}
+    Op op;
+    Mark mark = Mark::None;
+    int arg = 0;
+    bool nonEmpty = false;  ///< Call: only results that take a token count
+    int next = -1;
+    std::vector<int> targets;  ///< Choice
+    // filled by analyse()
+    int run = -1;        ///< next node that the recogniser stops at (Root and Scope nodes passed over)
+    bool merge = false;  ///< more than one way leads here: a state is entered once
+    bool canEnd = false;
+    std::set<int> first;
+    int guard = -1;     ///< Call: index into guards, or -1
+    int required = -1;  ///< Call: a token that must still come behind it, or -1
+};
+
+/// What must be in the text for a Call to be worth running: a token of `follow` right behind a token of
+/// `last`, before anything outside `outside`.
+struct Guard {
+    std::set<int> follow, last, outside;
+    bool operator==(const Guard&) const = default;
+};
+
+struct Program {
+    std::vector<Node> nodes;
+    std::vector<int> entry;  ///< by rule: first node
+    std::vector<std::set<int>> sets;
+    std::vector<Guard> guards;
+    int closer = -1;
+    std::set<int> recoverFollow;
+    std::vector<int> classOf;  ///< by token number
+    int classes = 0;
+
+    static bool zeroWidth(Op op) { return op == Op::Root || op == Op::ScopeBegin || op == Op::ScopeEnd; }
+    int skip(int node) const {
+        while (zeroWidth(nodes[static_cast<std::size_t>(node)].op))
+            node = nodes[static_cast<std::size_t>(node)].next;
+        return node;
+    }
+};
+
+/// One rule of the lexer as a small nondeterministic program.
+struct LexInstruction {
+    enum class Op : std::uint8_t { Range, Split, Accept };
+    explicit LexInstruction(Op o) : op(o) {}
+    Op op;
+    int low = 0, high = 0;  ///< Range: UTF-16 units, inclusive
+    int next = -1, other = -1;
+};
+
+struct LexerProgram {
+    std::vector<LexInstruction> code;
+    std::vector<int> entry;  ///< by rule; -1 for a rule with an empty body
+    // the automaton
+    std::vector<int> unitClass;  ///< by UTF-16 unit
+    int classes = 0;
+    std::vector<std::vector<int>> next;  ///< by state, by class; -1 none
+    std::vector<int> accept;             ///< by state: rule index or -1
+};
+
+}  // namespace zr::gc

@@ -1,0 +1,172 @@
+#include "grammar/engine/lexer_engine.h"
+
+#include <algorithm>
+#include <string>
+#include <vector>
+
+#include "grammar/engine/diagnostics.h"
+
+namespace zr::engine {
+namespace {
+
+constexpr std::uint32_t kHiddenChannel = 99;
+
+std::uint32_t classOf(const LexerTable& table, char16_t unit) {
+    if (unit < 128) return table.asciiClass[unit];
+    const UnitRange* end = table.ranges + table.rangeCount;
+    return std::upper_bound(table.ranges, end, unit,
+                            [](char16_t u, const UnitRange& r) { return u < r.low; })[-1]
+        .cls;
+}
+
+const char16_t* position(pANTLR3_INPUT_STREAM in) {
+    return static_cast<const char16_t*>(in->nextChar);
+}
+const char16_t* endOf(pANTLR3_INPUT_STREAM in) {
+    return static_cast<const char16_t*>(in->data) + in->sizeBuf / sizeof(char16_t);
+}
+
+/// Moves the stream over `count` units with the line counting that the runtime's consume does.
+void advance(pANTLR3_INPUT_STREAM in, std::size_t count) {
+    const char16_t* from = position(in);
+    const char16_t* to = from + count;
+    in->charPositionInLine += static_cast<ANTLR3_INT32>(count);
+    for (; from < to; ++from) {
+        if (*from != static_cast<char16_t>(in->newlineChar)) continue;
+        ++in->line;
+        in->charPositionInLine = static_cast<ANTLR3_INT32>(to - from - 1);
+        in->currentLine = const_cast<char16_t*>(from + 1);
+    }
+    in->nextChar = const_cast<char16_t*>(to);
+}
+
+void appendNumber(std::u16string& to, std::uint32_t number) {
+    for (const char c : std::to_string(number)) to.push_back(static_cast<char16_t>(c));
+}
+
+void reportDropped(pANTLR3_LEXER lexer) {
+    ++lexer->rec->state->errorCount;
+    if (!zr::diagnosticsWanted()) return;
+    const pANTLR3_INPUT_STREAM in = lexer->input;
+    std::u16string text;
+    appendNumber(text, in->line);
+    text += u":";
+    appendNumber(text, static_cast<std::uint32_t>(in->charPositionInLine));
+    text += u": no token starts with '";
+    text += *position(in);
+    text += u"'";
+    zr::diagnose(text);
+}
+
+/// The token of `length` units at the stream's position goes to the lexer's state, as the runtime's emit
+/// would put it.
+void emit(const LexRuleRow& rule, pANTLR3_LEXER lexer, std::size_t length) {
+    const pANTLR3_RECOGNIZER_SHARED_STATE state = lexer->rec->state;
+    const pANTLR3_INPUT_STREAM in = lexer->input;
+    const char16_t* start = position(in);
+    const pANTLR3_COMMON_TOKEN token = state->tokFactory->newToken(state->tokFactory);
+    if (token == nullptr) return;
+    state->type = rule.token;
+    state->channel = rule.hidden ? kHiddenChannel : ANTLR3_TOKEN_DEFAULT_CHANNEL;
+    token->type = rule.token;
+    token->channel = state->channel;
+    token->start = reinterpret_cast<ANTLR3_MARKER>(start);
+    token->stop = reinterpret_cast<ANTLR3_MARKER>(start + length - 1);
+    token->line = in->line;
+    token->charPosition = in->charPositionInLine;
+    token->lineStart = in->currentLine;
+    if (rule.cutFront != 0 || rule.cutBack != 0) {
+        const std::size_t cut = std::min<std::size_t>(length, rule.cutFront + rule.cutBack);
+        token->tokText.text = in->strFactory->newPtr(
+            in->strFactory, reinterpret_cast<pANTLR3_UINT8>(const_cast<char16_t*>(start + rule.cutFront)),
+            static_cast<ANTLR3_UINT32>(length - cut));
+        token->textState = ANTLR3_TEXT_STRING;
+    }
+    advance(in, length);
+    state->token = token;
+}
+
+}  // namespace
+
+void nextToken(const LexerTable& table, pANTLR3_LEXER lexer) {
+    const pANTLR3_RECOGNIZER_SHARED_STATE state = lexer->rec->state;
+    const pANTLR3_INPUT_STREAM in = lexer->input;
+    const char16_t* const end = endOf(in);
+    for (;;) {
+        const char16_t* const start = position(in);
+        if (start >= end) {
+            // Only dropped characters were left; the runtime asks again and finds the end.
+            state->token = &state->tokSource->skipToken;
+            return;
+        }
+        const char16_t* best = nullptr;
+        std::uint16_t bestRule = kNone16;
+        std::uint16_t current = 0;
+        for (const char16_t* at = start; at < end; ++at) {
+            current = table.next[static_cast<std::size_t>(current) * table.classes + classOf(table, *at)];
+            if (current == kNone16) break;
+            if (table.accept[current] != kNone16) {
+                best = at + 1;
+                bestRule = table.accept[current];
+            }
+        }
+        if (best != nullptr) {
+            state->tokenStartCharIndex = reinterpret_cast<ANTLR3_MARKER>(start);
+            emit(table.rules[bestRule], lexer, static_cast<std::size_t>(best - start));
+            return;
+        }
+        reportDropped(lexer);
+        advance(in, 1);
+    }
+}
+
+void matchRule(const LexerTable& table, std::uint32_t rule, pANTLR3_LEXER lexer) {
+    const pANTLR3_INPUT_STREAM in = lexer->input;
+    const char16_t* const start = position(in);
+    const char16_t* const end = endOf(in);
+    const char16_t* best = nullptr;
+    // All ways at once, unit by unit: the rule's own program has no more than a few hundred instructions.
+    std::vector<std::int32_t> now, next;
+    std::vector<std::uint32_t> mark(table.codeCount, 0);
+    std::uint32_t generation = 0;
+    const auto add = [&](std::vector<std::int32_t>& to, std::int32_t entry) {
+        std::vector<std::int32_t> work{entry};
+        while (!work.empty()) {
+            const std::int32_t i = work.back();
+            work.pop_back();
+            if (mark[static_cast<std::size_t>(i)] == generation) continue;
+            mark[static_cast<std::size_t>(i)] = generation;
+            const LexInstructionRow& row = table.code[i];
+            if (row.op == LexInstructionRow::Split) {
+                work.push_back(row.other);
+                work.push_back(row.next);
+            } else {
+                to.push_back(i);
+            }
+        }
+    };
+    ++generation;
+    if (table.rules[rule].entry >= 0) add(now, table.rules[rule].entry);
+    for (const char16_t* at = start; !now.empty(); ++at) {
+        ++generation;
+        next.clear();
+        for (const std::int32_t i : now) {
+            const LexInstructionRow& row = table.code[i];
+            if (row.op == LexInstructionRow::Accept)
+                best = at;
+            else if (at < end && row.low <= *at && *at <= row.high)
+                add(next, row.next);
+        }
+        if (at >= end) break;
+        now.swap(next);
+    }
+    if (best != nullptr && best > start) {
+        emit(table.rules[rule], lexer, static_cast<std::size_t>(best - start));
+        return;
+    }
+    lexer->rec->exConstruct(lexer->rec);
+    lexer->rec->state->error = ANTLR3_TRUE;
+    lexer->rec->state->failed = ANTLR3_TRUE;
+}
+
+}  // namespace zr::engine

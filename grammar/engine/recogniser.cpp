@@ -1,0 +1,376 @@
+#include "grammar/engine/recogniser.h"
+
+#include <algorithm>
+#include <bit>
+
+namespace zr::engine {
+namespace {
+
+/// Up to this many merge states an entry is searched through plainly; beyond, it moves to the shared table.
+constexpr std::uint32_t kFewVisits = 6;
+
+std::uint64_t visitHash(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high) {
+    std::uint64_t h = (static_cast<std::uint64_t>(entry) << 16) ^ node;
+    h = h * 0x9E3779B97F4A7C15u ^ low;
+    h = (h ^ (h >> 29)) * 0xBF58476D1CE4E5B9u ^ high;
+    h = (h ^ (h >> 32)) * 0x94D049BB133111EBu;
+    return h ^ (h >> 29);
+}
+
+bool isZeroWidth(Op op) {
+    return op == Op::Root || op == Op::ScopeBegin || op == Op::ScopeEnd;
+}
+
+}  // namespace
+
+Recogniser::Recogniser(const ParserTable& table, const std::vector<std::uint16_t>& types,
+                       const Options& options)
+    : table_(table), options_(options), types_(types), count_(static_cast<std::uint32_t>(types.size())) {
+    index();
+}
+
+/// One pass over the tokens for everything that later questions need in constant time.
+void Recogniser::index() {
+    classes_.resize(count_ + 1);
+    lastOf_.assign(table_.maxToken + 1, 0);
+    bool closers = false;
+    for (std::uint32_t i = 0; i < count_; ++i) {
+        classes_[i] = table_.classOf[types_[i]];
+        lastOf_[types_[i]] = i + 1;
+        closers = closers || (table_.closer != 0 && types_[i] == table_.closer);
+    }
+    classes_[count_] = table_.classOf[0];
+    if (closers) {
+        runEnd_.resize(count_ + 1);
+        runEnd_[count_] = count_;
+        for (std::uint32_t i = count_; i-- > 0;) runEnd_[i] = types_[i] == table_.closer ? runEnd_[i + 1] : i;
+    }
+    candidates_.resize(table_.guardCount);
+    barriers_.resize(table_.guardCount);
+    entriesAt_.assign(count_ + 1, kNone);
+    entries_.reserve(count_ * 4 + 16);
+    states_.reserve(count_ * 16 + 64);
+    ends_.reserve(count_ * 6 + 16);
+}
+
+std::uint32_t Recogniser::addState(std::uint16_t node, std::uint32_t low, std::uint32_t high,
+                                   std::uint32_t before, std::uint32_t child, std::uint32_t childEnd) {
+    states_.push_back({low, high, before, child, childEnd, node});
+    return static_cast<std::uint32_t>(states_.size()) - 1;
+}
+
+std::uint32_t Recogniser::entryFor(std::uint16_t rule, std::uint32_t position) {
+    for (std::uint32_t i = entriesAt_[position]; i != kNone; i = entries_[i].nextHere)
+        if (entries_[i].rule == rule) return i;
+    Entry entry;
+    entry.position = position;
+    entry.rule = rule;
+    entry.nextHere = entriesAt_[position];
+    const auto made = static_cast<std::uint32_t>(entries_.size());
+    entries_.push_back(entry);
+    entriesAt_[position] = made;
+    return made;
+}
+
+void Recogniser::pushFrame(Entry& entry, Frame frame) {
+    frame.below = entry.frames;
+    if (freeFrame_ != kNone) {
+        entry.frames = freeFrame_;
+        freeFrame_ = frames_[freeFrame_].below;
+        frames_[entry.frames] = frame;
+        return;
+    }
+    entry.frames = static_cast<std::uint32_t>(frames_.size());
+    frames_.push_back(frame);
+}
+
+void Recogniser::popFrame(Entry& entry) {
+    const std::uint32_t top = entry.frames;
+    entry.frames = frames_[top].below;
+    frames_[top].below = freeFrame_;
+    freeFrame_ = top;
+}
+
+bool Recogniser::enterOnce(std::uint32_t entryIndex, std::uint16_t node, std::uint32_t low,
+                           std::uint32_t high) {
+    Entry& entry = entries_[entryIndex];
+    for (std::uint32_t v = entry.visited; v != kNone; v = visits_[v].next)
+        if (visits_[v].node == node && visits_[v].low == low && visits_[v].high == high) return false;
+    if (entry.visitedCount >= kFewVisits) return enterInTable(entryIndex, node, low, high);
+    ++entry.visitedCount;
+    visits_.push_back({entry.visited, low, high, node});
+    entry.visited = static_cast<std::uint32_t>(visits_.size()) - 1;
+    return true;
+}
+
+bool Recogniser::enterInTable(std::uint32_t entry, std::uint16_t node, std::uint32_t low,
+                              std::uint32_t high) {
+    if (visitTableUsed_ * 2 >= visitTable_.size()) growVisitTable();
+    const std::size_t mask = visitTable_.size() - 1;
+    for (std::size_t slot = visitHash(entry, node, low, high) & mask;; slot = (slot + 1) & mask) {
+        const std::uint32_t at = visitTable_[slot];
+        if (at == kNone) {
+            visits_.push_back({entry, low, high, node});
+            visitTable_[slot] = static_cast<std::uint32_t>(visits_.size()) - 1;
+            ++visitTableUsed_;
+            return true;
+        }
+        const Visit& v = visits_[at];
+        if (v.next == entry && v.node == node && v.low == low && v.high == high) return false;
+    }
+}
+
+void Recogniser::growVisitTable() {
+    const std::vector<std::uint32_t> old = std::move(visitTable_);
+    visitTable_.assign(std::max<std::size_t>(256, old.size() * 2), kNone);
+    const std::size_t mask = visitTable_.size() - 1;
+    for (const std::uint32_t at : old) {
+        if (at == kNone) continue;
+        const Visit& v = visits_[at];
+        std::size_t slot = visitHash(v.next, v.node, v.low, v.high) & mask;
+        while (visitTable_[slot] != kNone) slot = (slot + 1) & mask;
+        visitTable_[slot] = at;
+    }
+}
+
+void Recogniser::addEnd(std::uint32_t entryIndex, std::uint32_t low, std::uint32_t high,
+                        std::uint32_t state) {
+    Entry& entry = entries_[entryIndex];
+    const auto made = static_cast<std::uint32_t>(ends_.size());
+    ends_.push_back({low, high, state, kNone});
+    if (entry.firstEnd == kNone)
+        entry.firstEnd = made;
+    else
+        ends_[entry.lastEnd].next = made;
+    entry.lastEnd = made;
+}
+
+/// A token that isn't the closer can only be taken where the run of closers is over, so an undecided position
+/// becomes that one, if it is among the possible ones.
+bool Recogniser::settle(std::uint32_t& low, std::uint32_t& high) const {
+    if (low == high) return true;
+    if (high != runEnd(low)) return false;
+    low = high;
+    return true;
+}
+
+std::uint32_t Recogniser::viable(const NodeRow& node, std::uint32_t low, std::uint32_t high) const {
+    const std::uint32_t* masks = table_.choiceMask + static_cast<std::size_t>(node.arg) * table_.classes;
+    if (low == high) return masks[classes_[low]];
+    std::uint32_t mask = masks[table_.classOf[table_.closer]];
+    if (high == runEnd(low)) mask |= masks[classes_[high]];
+    return mask;
+}
+
+/// Whether the text still holds what the call and the part behind it can't do without. A cheap "no" here
+/// saves the search of an alternative that was never going to work, such as an alias behind every column.
+bool Recogniser::guarded(const NodeRow& node, std::uint32_t position) {
+    if (node.required != 0 && lastOf_[node.required] <= position) return false;
+    if (node.guard == kNone16 || position >= count_) return true;
+    const GuardRow& guard = table_.guards[node.guard];
+    std::vector<std::uint32_t>& candidates = candidates_[node.guard];
+    std::vector<std::uint32_t>& barriers = barriers_[node.guard];
+    if (candidates.empty()) {
+        candidates.resize(count_ + 1);
+        barriers.resize(count_ + 1);
+        candidates[count_] = kNone;
+        barriers[count_] = count_;
+        for (std::uint32_t i = count_; i-- > 0;) {
+            const bool here = i > 0 && inSet(guard.follow, classes_[i]) && inSet(guard.last, classes_[i - 1]);
+            candidates[i] = here ? i : candidates[i + 1];
+            barriers[i] = inSet(guard.outside, classes_[i]) ? barriers[i + 1] : i;
+        }
+    }
+    const std::uint32_t candidate = candidates[position + 1];
+    if (candidate == kNone) return false;
+    if (nextOpener_.empty()) {
+        nextOpener_.resize(count_ + 1);
+        nextOpener_[count_] = count_ + 2;
+        for (std::uint32_t i = count_; i-- > 0;)
+            nextOpener_[i] = inSet(table_.openerSet, classes_[i]) ? i : nextOpener_[i + 1];
+    }
+    const std::uint32_t barrier = barriers[position];
+    return candidate <= barrier || nextOpener_[position] <= barrier + 1;
+}
+
+/// Follows one path until it ends, fails, or comes to a call: the call is left as a frame for resume().
+bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32_t low, std::uint32_t high,
+                         std::uint32_t state) {
+    ++steps_;
+    for (;;) {
+        const NodeRow& node = table_.nodes[at];
+        if ((node.flags & kMerge) && !enterOnce(entryIndex, at, low, high)) return false;
+        switch (node.op) {
+            case Op::Token:
+                if (!settle(low, high) || low >= count_ || types_[low] != node.arg) return false;
+                high = ++low;
+                break;
+            case Op::Set:
+                if (!settle(low, high) || low >= count_ || !inSet(node.arg, classes_[low])) return false;
+                high = ++low;
+                break;
+            case Op::Hard: {
+                const std::uint32_t run = runEnd(low);
+                if (low == run) return false;
+                ++low;
+                high = std::min(high + 1, run);
+                break;
+            }
+            case Op::Soft:
+                high = std::min(high + 1, runEnd(low));
+                break;
+            case Op::SoftStar:
+                high = runEnd(low);
+                break;
+            case Op::Choice: {
+                std::uint32_t mask = viable(node, low, high);
+                // The part that recovery replaces starts with none of its tokens: look at every way to it.
+                if (recoversIn(entryIndex))
+                    mask =
+                        static_cast<std::uint32_t>((std::uint64_t{1} << table_.choices[node.arg].count) - 1);
+                if (mask == 0) return false;
+                const std::uint16_t* targets = table_.targets + table_.choices[node.arg].firstTarget;
+                const std::uint16_t target = targets[std::countr_zero(mask)];
+                mask &= mask - 1;
+                if (mask != 0)
+                    pushFrame(entries_[entryIndex], {kNone, low, high, state, kNone, kNone, mask, at});
+                state = addState(target, low, high, state, kNone, kNone);
+                at = isZeroWidth(table_.nodes[target].op) ? table_.nodes[target].run : target;
+                continue;
+            }
+            case Op::Call: {
+                if (!settle(low, high)) return false;
+                const RuleRow& rule = table_.rules[node.arg];
+                const bool recoverable = node.arg == table_.recoverRule && recoversIn(entryIndex);
+                if (!recoverable && !inSet(table_.firstSetBase + node.arg, classes_[low]) &&
+                    (!rule.nullable || (node.flags & kNonEmpty)))
+                    return false;
+                if (!recoverable && !guarded(node, low)) return false;
+                const std::uint32_t child = entryFor(node.arg, low);
+                if (recoverable) entries_[child].mayRecover = true;
+                pushFrame(entries_[entryIndex], {kNone, low, high, state, child, kNone, 0, at});
+                return false;
+            }
+            case Op::End:
+                addEnd(entryIndex, low, high, state);
+                return true;
+            case Op::Root:
+            case Op::ScopeBegin:
+            case Op::ScopeEnd:
+                break;
+        }
+        at = node.run;
+    }
+}
+
+/// Goes on with an entry's search until it has one end more, has none left, or needs an end of another entry.
+Recogniser::Outcome Recogniser::resume(std::uint32_t entryIndex, std::uint32_t& child) {
+    if (!entries_[entryIndex].started) {
+        Entry& entry = entries_[entryIndex];
+        entry.started = true;
+        const std::uint16_t first = table_.rules[entry.rule].entry;
+        const std::uint32_t position = entry.position;
+        const std::uint32_t state = addState(first, position, position, kNone, kNone, kNone);
+        const NodeRow& node = table_.nodes[first];
+        if (forward(entryIndex, isZeroWidth(node.op) ? node.run : first, position, position, state))
+            return Outcome::Yielded;
+    }
+    for (;;) {
+        Entry& entry = entries_[entryIndex];
+        if (entry.frames == kNone) {
+            if (entry.done) return Outcome::Exhausted;
+            entry.done = true;
+            return recover(entryIndex) ? Outcome::Yielded : Outcome::Exhausted;
+        }
+        Frame& frame = frames_[entry.frames];
+        const NodeRow& node = table_.nodes[frame.node];
+        if (frame.child == kNone) {
+            const std::uint16_t target =
+                table_.targets[table_.choices[node.arg].firstTarget + std::countr_zero(frame.mask)];
+            frame.mask &= frame.mask - 1;
+            const Frame taken = frame;
+            if (taken.mask == 0) popFrame(entry);
+            const std::uint32_t state = addState(target, taken.low, taken.high, taken.state, kNone, kNone);
+            const NodeRow& next = table_.nodes[target];
+            if (forward(entryIndex, isZeroWidth(next.op) ? next.run : target, taken.low, taken.high, state))
+                return Outcome::Yielded;
+            continue;
+        }
+        const Entry& asked = entries_[frame.child];
+        const std::uint32_t end = frame.lastEnd == kNone ? asked.firstEnd : ends_[frame.lastEnd].next;
+        if (end == kNone) {
+            if (!asked.done) {
+                child = frame.child;
+                return Outcome::NeedsChild;
+            }
+            popFrame(entry);
+            continue;
+        }
+        frame.lastEnd = end;
+        const End found = ends_[end];
+        const std::uint32_t before = frame.state, from = frame.child;
+        if ((node.flags & kNonEmpty) && found.high == asked.position) continue;
+        if (asked.done && found.next == kNone) popFrame(entry);
+        const std::uint32_t state = addState(node.next, found.low, found.high, before, from, end);
+        if (forward(entryIndex, node.run, found.low, found.high, state)) return Outcome::Yielded;
+    }
+}
+
+/// The recover rule had no derivation: it stands for the tokens up to the first that can follow it at the
+/// same parenthesis depth.
+bool Recogniser::recover(std::uint32_t entryIndex) {
+    Entry& entry = entries_[entryIndex];
+    if (!entry.mayRecover || entry.firstEnd != kNone) return false;
+    std::uint32_t at = entry.position, depth = 0;
+    for (; at < count_; ++at) {
+        if (depth == 0 && inSet(table_.recoverFollowSet, classes_[at])) break;
+        if (types_[at] == table_.leftParen) ++depth;
+        if (types_[at] == table_.rightParen && depth > 0) --depth;
+    }
+    entry.recovered = true;
+    addEnd(entryIndex, at, at, kNone);
+    return true;
+}
+
+Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position, bool recovering) {
+    recovering_ = recovering;
+    recoverStart_ = position;
+    Result result;
+    result.entry = entryFor(rule, position);
+    chain_.assign(1, result.entry);
+    const std::uint64_t budget = options_.baseSteps + options_.stepsPerToken * count_;
+    while (!chain_.empty()) {
+        std::uint32_t child = kNone;
+        const Outcome outcome = resume(chain_.back(), child);
+        if (outcome == Outcome::NeedsChild) {
+            if (chain_.size() >= options_.maxDepth) {
+                result.overLimit = true;
+                result.found = false;
+                return result;
+            }
+            chain_.push_back(child);
+            continue;
+        }
+        if (chain_.size() > 1) {
+            chain_.pop_back();
+        } else if (outcome == Outcome::Exhausted) {
+            break;
+        } else {
+            const End& end = ends_[entries_[result.entry].lastEnd];
+            if (!result.found || end.high > result.high) {
+                result.found = true;
+                result.endState = end.state;
+                result.low = end.low;
+                result.high = end.high;
+            }
+            if (result.high == count_) break;
+        }
+        if (steps_ > budget) {
+            result.overBudget = true;
+            break;
+        }
+    }
+    return result;
+}
+
+}  // namespace zr::engine

@@ -1,0 +1,150 @@
+#pragma once
+
+#include <cstdint>
+#include <vector>
+
+#include "grammar/engine/options.h"
+#include "grammar/engine/tables.h"
+
+/// The recogniser: finds, for a rule and a list of tokens, the derivation that the grammar's meaning fixes:
+/// of all that reach furthest the first in written order (docs/recogniser.md tells the idea and its proof).
+///
+/// Every (rule, position) that the search comes to has one entry. An entry is a resumable search: it hands
+/// out the ends its rule can reach from there, each once, in the order of the derivations, and only as many
+/// as somebody asks for. Entries ask entries; the chain of those at work is a vector on the heap, so nesting
+/// costs memory and never machine stack.
+namespace zr::engine {
+
+class Recogniser {
+ public:
+    /// One end of an entry. Inside a run of closing tokens several ends stand for one: every position from
+    /// `low` to `high` can be the end, and who of the optional closers took which is settled afterwards.
+    struct End {
+        std::uint32_t low, high;
+        std::uint32_t state;  ///< last state of the path that leads here
+        std::uint32_t next;   ///< next end of the same entry
+    };
+
+    /// A point of a path that the walk back needs: a branch taken, or a call that came back.
+    struct State {
+        std::uint32_t low, high;
+        std::uint32_t before;  ///< state before it on the path
+        std::uint32_t child;   ///< entry whose end leads here, or kNone for a branch
+        std::uint32_t childEnd;
+        std::uint16_t node;  ///< where the path goes on
+    };
+
+    struct Result {
+        bool found = false;
+        bool overLimit = false;   ///< nesting deeper than the options allow: no derivation is given
+        bool overBudget = false;  ///< the search was cut: the furthest derivation found so far stands
+        std::uint32_t entry = kNone;
+        std::uint32_t endState = kNone;
+        std::uint32_t low = 0, high = 0;
+    };
+
+    static constexpr std::uint32_t kNone = 0xFFFFFFFF;
+
+    /// `types` holds the token numbers of the on-channel tokens without end of file; it must outlive this
+    /// object.
+    Recogniser(const ParserTable& table, const std::vector<std::uint16_t>& types, const Options& options);
+
+    /// Runs `rule` from `position`. `recovering`: the recover rule of the statement that starts at `position`
+    /// may stand for anything up to a token that can follow it.
+    Result run(std::uint16_t rule, std::uint32_t position, bool recovering = false);
+
+    // What the tree builder reads.
+    const State& state(std::uint32_t index) const { return states_[index]; }
+    std::uint16_t ruleOf(std::uint32_t entry) const { return entries_[entry].rule; }
+    std::uint32_t startOf(std::uint32_t entry) const { return entries_[entry].position; }
+    const End& end(std::uint32_t index) const { return ends_[index]; }
+    /// Whether the entry stands for tokens that were skipped where its rule didn't parse.
+    bool isRecovered(std::uint32_t entry) const { return entries_[entry].recovered; }
+
+    /// Work done so far, in search steps; a benchmark figure.
+    std::uint64_t steps() const { return steps_; }
+    std::size_t entryCount() const { return entries_.size(); }
+
+ private:
+    struct Entry {
+        std::uint32_t position;
+        std::uint32_t nextHere;  ///< next entry at the same position
+        std::uint32_t firstEnd = kNone, lastEnd = kNone;
+        std::uint32_t frames = kNone;   ///< top of the entry's backtrack stack
+        std::uint32_t visited = kNone;  ///< merge states entered, newest first
+        std::uint32_t visitedCount = 0;
+        std::uint16_t rule;
+        bool started = false, done = false, mayRecover = false, recovered = false;
+    };
+
+    struct Frame {
+        std::uint32_t below;
+        std::uint32_t low, high;
+        std::uint32_t state;
+        std::uint32_t child;    ///< call: the entry asked; kNone for a choice
+        std::uint32_t lastEnd;  ///< call: the end taken last, kNone before the first
+        std::uint32_t mask;     ///< choice: targets still to try
+        std::uint16_t node;
+    };
+
+    struct Visit {
+        std::uint32_t next;  ///< older visit of the entry, or the entry itself once it is in the shared table
+        std::uint32_t low, high;
+        std::uint16_t node;
+    };
+
+    enum class Outcome { Yielded, Exhausted, NeedsChild };
+
+    void index();
+    std::uint32_t entryFor(std::uint16_t rule, std::uint32_t position);
+    void pushFrame(Entry& entry, Frame frame);
+    void popFrame(Entry& entry);
+    bool enterInTable(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high);
+    void growVisitTable();
+    Outcome resume(std::uint32_t entry, std::uint32_t& child);
+    bool forward(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high,
+                 std::uint32_t state);
+    bool enterOnce(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high);
+    void addEnd(std::uint32_t entry, std::uint32_t low, std::uint32_t high, std::uint32_t state);
+    bool recover(std::uint32_t entry);
+    bool recoversIn(std::uint32_t entry) const {
+        return recovering_ && entries_[entry].position == recoverStart_;
+    }
+    bool settle(std::uint32_t& low, std::uint32_t& high) const;
+    std::uint32_t viable(const NodeRow& node, std::uint32_t low, std::uint32_t high) const;
+    bool guarded(const NodeRow& node, std::uint32_t position);
+    std::uint32_t addState(std::uint16_t node, std::uint32_t low, std::uint32_t high, std::uint32_t before,
+                           std::uint32_t child, std::uint32_t childEnd);
+    std::uint32_t runEnd(std::uint32_t position) const {
+        return runEnd_.empty() ? position : runEnd_[position];
+    }
+    bool inSet(std::uint32_t set, std::uint32_t cls) const {
+        return (table_.classSets[set * 4 + cls / 64] >> (cls % 64)) & 1;
+    }
+
+    const ParserTable& table_;
+    const Options& options_;
+    const std::vector<std::uint16_t>& types_;
+    std::uint32_t count_;
+    std::vector<std::uint8_t> classes_;  ///< by position, the last one for the end of the text
+    std::vector<std::uint32_t> runEnd_;  ///< by position: where the run of closers from here ends
+    std::vector<std::uint32_t> lastOf_;  ///< by token number: one past the last position where it stands
+    std::vector<std::vector<std::uint32_t>> candidates_;  ///< by guard: next position that could satisfy it
+    std::vector<std::vector<std::uint32_t>> barriers_;    ///< by guard: next position outside
+    std::vector<std::uint32_t> nextOpener_;
+    std::vector<std::uint32_t> entriesAt_;
+    std::vector<Entry> entries_;
+    std::vector<End> ends_;
+    std::vector<State> states_;
+    std::vector<Frame> frames_;
+    std::uint32_t freeFrame_ = kNone;
+    std::vector<Visit> visits_;
+    std::vector<std::uint32_t> visitTable_;  ///< open addressing over visits of entries that have many
+    std::uint32_t visitTableUsed_ = 0;
+    std::vector<std::uint32_t> chain_;
+    std::uint64_t steps_ = 0;
+    bool recovering_ = false;
+    std::uint32_t recoverStart_ = 0;
+};
+
+}  // namespace zr::engine

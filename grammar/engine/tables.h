@@ -1,0 +1,141 @@
+#pragma once
+
+#include <cstdint>
+
+/// The contract between the grammar compiler and the engine: what the generated sources hold and the engine
+/// reads. Everything is constant data; nothing here knows a dialect. The layout carries a version, so that an
+/// engine never runs tables of another layout.
+namespace zr::engine {
+
+constexpr std::uint32_t kTableVersion = 1;
+
+constexpr std::uint16_t kNone16 = 0xFFFF;
+
+// ---- lexer
+// -------------------------------------------------------------------------------------------------
+
+struct LexRuleRow {
+    std::uint16_t token;
+    std::uint8_t hidden;    ///< goes to the hidden channel 99
+    std::uint8_t cutFront;  ///< UTF-16 units cut from the token's text
+    std::uint8_t cutBack;
+    std::int32_t entry;  ///< first instruction of the rule's own program, -1: never matches
+    const char* name;
+};
+
+/// One instruction of a rule's own program, run for single-rule calls: take a unit of [low, high] and go on
+/// at `next`; or go on at both `next` and `other`; or accept.
+struct LexInstructionRow {
+    enum Op : std::uint8_t { Range, Split, Accept };
+    Op op;
+    std::uint16_t low, high;
+    std::int32_t next, other;
+};
+
+struct UnitRange {
+    std::uint16_t low, high;
+    std::uint8_t cls;
+};
+
+struct LexerTable {
+    std::uint32_t version;
+    const LexRuleRow* rules;
+    std::uint32_t ruleCount;
+    const LexInstructionRow* code;
+    std::uint32_t codeCount;
+    // The automaton for the longest match over all rules: next[state * classes + class], kNone16 for none.
+    const std::uint8_t* asciiClass;  ///< 128 entries
+    const UnitRange* ranges;         ///< the units from 128 up, in order, without gaps
+    std::uint32_t rangeCount;
+    std::uint32_t classes;
+    const std::uint16_t* next;
+    const std::uint16_t* accept;  ///< by state: rule, or kNone16
+};
+
+// ---- parser
+// ------------------------------------------------------------------------------------------------
+
+enum class Op : std::uint8_t {
+    Token,
+    Set,
+    Call,
+    Choice,
+    Soft,
+    SoftStar,
+    Hard,  ///< a Token that takes the closer where it must stand
+    Root,
+    ScopeBegin,
+    ScopeEnd,
+    End
+};
+
+enum class Mark : std::uint8_t { None, Drop, Root };
+
+struct NodeRow {
+    Op op;
+    Mark mark;
+    std::uint8_t flags;      ///< NodeFlags
+    std::uint16_t arg;       ///< token number, set, rule, choice
+    std::uint16_t next;      ///< next node of the path
+    std::uint16_t run;       ///< next node that the recogniser stops at
+    std::uint16_t guard;     ///< Call: guard or kNone16
+    std::uint16_t required;  ///< Call: a token number that must still come, 0 for none
+};
+
+enum NodeFlags : std::uint8_t {
+    kMerge = 1,     ///< more than one way leads here: enter each state once
+    kNonEmpty = 2,  ///< Call: only results that take a token count
+};
+
+struct RuleRow {
+    const char* name;
+    std::uint16_t entry;
+    std::uint8_t nullable;
+};
+
+struct ChoiceRow {
+    std::uint32_t firstTarget;
+    std::uint16_t count;  ///< at most 32
+};
+
+/// Class sets, see ParserTable::classSets.
+struct GuardRow {
+    std::uint16_t follow, last, outside;
+};
+
+struct ParserTable {
+    std::uint32_t version;
+    const NodeRow* nodes;
+    const RuleRow* rules;
+    std::uint32_t ruleCount;
+    const ChoiceRow* choices;
+    std::uint32_t choiceCount;
+    const std::uint16_t* targets;
+    const std::uint32_t* choiceMask;  ///< [choice * classes + class]: bit i set when target i can go on there
+    const std::uint8_t* classOf;      ///< by token number; 0 is end of file
+    std::uint32_t classes;            ///< at most 256
+    std::uint32_t maxToken;
+    const std::uint64_t*
+        classSets;  ///< four words a set; sets of nodes first, then FIRST of each rule, then others
+    std::uint32_t firstSetBase;  ///< FIRST of rule r is set firstSetBase + r
+    std::uint32_t openerSet;     ///< tokens behind which a guard's barrier says nothing
+    std::uint32_t recoverFollowSet;
+    const GuardRow* guards;
+    std::uint32_t guardCount;
+    std::uint16_t closer;  ///< token number or 0
+    std::uint16_t startRule, statementRule;
+    std::uint16_t recoverRule;            ///< rule or kNone16
+    std::uint16_t leftParen, rightParen;  ///< token numbers for "the same parenthesis depth", 0 for none
+    std::uint8_t keepTail;
+};
+
+struct GrammarTable {
+    const char* name;
+    const char* lexerFile;
+    const char* parserFile;
+    const char* const* tokenNames;  ///< by token number; the runtime's own names for 0 to 3
+    const LexerTable* lexer;
+    const ParserTable* parser;
+};
+
+}  // namespace zr::engine
