@@ -1,0 +1,34 @@
+#include <utility>
+
+#include "analysis/driver.h"
+#include "analysis/mssql_state.h"
+#include "zrparsersql/analysis.h"
+#include "zrparsersql/sql_parsers.h"
+
+namespace {
+
+CString asItIs(CString text) {
+    return text;
+}
+
+void analyse(CZRQueryInfo& query, DBTypes kind) {
+    switch (kind) {
+        case DB_MSSQL:
+        case DB_MSSQL_20:
+            zr::analyseQuery<CZRMSSQLParser, MSSQLStateSelectQuery>(query, asItIs);
+            break;
+        default:
+            break;
+    }
+}
+
+}  // namespace
+
+void BuildQueryInfo(CZRQueryInfo* query, DBTypes kind) {
+    if (!query) return;
+    try {
+        analyse(*query, kind);
+    } catch (...) {
+        // The query keeps what was written before. Wrong SQL is nobody's failure here.
+    }
+}

@@ -1,0 +1,161 @@
+// Expressions: operators, functions, parameters, literals.
+#include "analysis/select_state.h"
+#include "parser/node_text.h"
+
+namespace zr {
+
+void SelectState::ProcessExpression(CZRSQLTree* node, ItemList* list, CZRSQLTree* parent) {
+    if (!node) return;
+    while (!IsOperator(node)) {
+        switch (roleOf(node)) {
+            case Role::SelectQuery:
+                return ProcessSubQuery(node, list);
+            case Role::ColumnSpecification:
+                return ProcessColumn(node, list);
+            case Role::TableSpecification:
+                append(list, MakeTableItem(node));
+                return;
+            case Role::NewName:
+                appendText(list, GetNodeText(node), SIK_NUMBER);
+                return;
+            case Role::JoinPrefix:
+                return ProcessParams(&appendJoinPart(list).m_items, node);
+            case Role::JoinPostfix:
+                return work().forEachChild(*this, &SelectState::joinPostfixStep, node, list, node);
+            case Role::Function:
+            case Role::GroupFunction:
+            case Role::SearchCondition:
+            case Role::ConvertFunction:
+            case Role::UserFunction:
+                return ProcessFunction(node, list);
+            case Role::SqlLiteral:
+            case Role::Style:
+            case Role::DatePart:
+                return ProcessLiteral(node->GetChild(0), list);
+            case Role::DataType:
+                return ProcessLiteral(node, list);
+            case Role::InnerKeyword:
+            case Role::LeftKeyword:
+            case Role::RightKeyword:
+            case Role::CrossKeyword:
+                return ProcessKeyword(node, list);
+            case Role::Identificator:
+                appendText(list, node->GetText(), SIK_VALUE);
+                return;
+            default:
+                if (!node->GetChildCount()) return;
+                parent = node;
+                node = node->GetChild(0);
+        }
+    }
+    ProcessOperator(node, list, parent);
+}
+
+void SelectState::joinPostfixStep(CZRSQLTree* node, ItemList* list, CZRSQLTree* parent) {
+    if (roleOf(node) == Role::JoinDef)
+        ProcessFromItem(node, &appendJoinPart(list).m_items, parent);
+    else
+        ProcessExpression(node, list, parent);
+}
+
+void SelectState::ProcessOperator(CZRSQLTree* node, ItemList* list, CZRSQLTree* parent) {
+    SelectItem& item = append(list, newItem<SelectItem>());
+    item.m_name = node->GetText().TrimLeft();
+    item.m_isOperator = 1;
+    item.m_kind = SIK_FUNCTION;
+    item.m_tokenType = static_cast<int>(node->GetType());
+    if (parent && roleOf(parent) == Role::NestedJoin) item.m_nested = 1;
+    ProcessParams(&item.m_items, node);
+}
+
+void SelectState::ProcessParams(ItemList* list, CZRSQLTree* node) {
+    work().forEachParameter(*this, &SelectState::ProcessExpression, node, list, node);
+}
+
+void SelectState::ProcessFunction(CZRSQLTree* node, ItemList* list) {
+    CZRSQLTree* const head = node->GetChild(0);
+    // A column at the head comes out by itself, ahead of the function.
+    if (roleOf(head) == Role::ColumnSpecification) ProcessExpression(head, list, node);
+    if (head->GetText().TrimLeft().EqualsNoCase(u"FN")) {
+        // So does the function inside an escape, which then stands among the escape's parameters once more.
+        work().once(*this, &SelectState::functionItemStep, node, list, nullptr);
+        work().once(*this, &SelectState::functionStep, head->GetChild(0), list, nullptr);
+        return;
+    }
+    appendFunction(node, list);
+}
+
+void SelectState::appendFunction(CZRSQLTree* node, ItemList* list) {
+    CZRSQLTree* const head = node->GetChild(0);
+    const Role role = roleOf(node);
+    SelectItem& item = append(list, newItem<SelectItem>());
+    item.m_name = head->GetText().TrimLeft();
+    item.m_tokenType = static_cast<int>(head->GetType());
+    item.m_isOperator = IsOperator(head);
+    CZRSQLTree* parameters = node->GetChildCount() > 1 ? node->GetChild(1) : nullptr;
+    if (role == Role::UserFunction) {
+        item.m_kind = SIK_USER_FUNCTION;
+        m_query->AddUserFunction(item.m_name, parameters ? static_cast<int>(parameters->GetChildCount()) : 0);
+    } else {
+        item.m_kind = SIK_FUNCTION;
+    }
+    if (role == Role::SearchCondition || item.m_name.EqualsNoCase(u"FN"))
+        parameters = head;
+    else if (roleOf(head) == Role::BetweenKeyword)
+        parameters = node;
+    if (parameters) ProcessParams(&item.m_items, parameters);
+}
+
+void SelectState::ProcessLiteral(CZRSQLTree* node, ItemList* list) {
+    SelectItem& item = append(list, newItem<SelectItem>());
+    switch (roleOf(node)) {
+        case Role::DataType:
+            item.m_kind = SIK_DATA_TYPE;
+            item.m_text = node->GetChild(0)->GetText().TrimLeft();
+            work().forEachChild(*this, &SelectState::literalStep, node, &item.m_items, nullptr, 1);
+            break;
+        case Role::NumberLiteral:
+        case Role::Asterisk: {
+            item.m_kind = SIK_NUMBER;
+            const unsigned int count = node->GetChildCount();
+            for (unsigned int index = 0; index < count; ++index) {
+                item.m_text += node->GetChild(index)->GetText();
+                if (item.m_text.EqualsNoCase(u"notnull")) item.m_text = u"NOT NULL";
+            }
+            break;
+        }
+        case Role::Date:
+            item.m_kind = SIK_DATE;
+            item.m_text = concatenatedText(*node);
+            break;
+        case Role::SqlString:
+            item.m_kind = SIK_STRING;
+            item.m_text = quotedText(*node);
+            // An empty string is stored as a blank, which hosts rely on.
+            if (item.m_text.IsEmpty() && !node->GetChildCount()) item.m_text = u" ";
+            break;
+        default:
+            item.m_text = node->GetText();
+            break;
+    }
+}
+
+void SelectState::ProcessKeyword(CZRSQLTree* node, ItemList* list) {
+    switch (roleOf(node)) {
+        case Role::NumberLiteral:
+            appendText(list, node->GetChild(0)->GetText(), SIK_NUMBER);
+            break;
+        case Role::InnerKeyword:
+        case Role::RightKeyword:
+        case Role::LeftKeyword:
+        case Role::CrossKeyword:
+        case Role::OuterKeyword:
+            appendText(list, node->GetText(), SIK_NUMBER);
+            break;
+        default:
+            appendText(list, node->GetText(), SIK_VALUE);
+            break;
+    }
+}
+
+}  // namespace zr

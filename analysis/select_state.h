@@ -1,0 +1,159 @@
+#pragma once
+
+#include <cstddef>
+#include <memory>
+
+#include "analysis/alias_names.h"
+#include "analysis/token_table.h"
+#include "analysis/work_stack.h"
+#include "zrparsersql/field_object.h"
+#include "zrparsersql/query_info.h"
+#include "zrparsersql/select_item.h"
+#include "zrparsersql/sql_tree.h"
+
+namespace zr {
+
+// What a dialect says to the common walk as data. What it does otherwise, it overrides.
+struct Dialect {
+    const TokenTable& tokens;
+    int nestedDataType;  // DataType of the descriptors of sub-queries and union branches
+    char16_t quoteOpen;  // around names
+    char16_t quoteClose;
+};
+
+// Reads the tree of one SELECT and writes what it finds into one descriptor: copies of the clauses as lists
+// of SelectItem, and on the side the aliases, the source tables and the column references. It copies and does
+// not interpret: a type of node that it does not know is passed over or stands for its first child.
+//
+// One object a SELECT. The passes CollectSubQueries, CollectAliases, CollectTables and CollectFields run to
+// their end when called. The steps named Process... do what can be done at once and leave the rest to
+// finish(), which has to be called behind them; lists come out in the order told by the steps whatever the
+// order of the work. Nested selects have states of their own that share the work of this one.
+//
+// Dialects derive from it, with a table of token numbers and overrides of the steps that differ.
+class SelectState {
+ public:
+    // The view outlives the state. The descriptor to fill is set before the first pass.
+    SelectState(const SelectState&) = delete;
+    SelectState& operator=(const SelectState&) = delete;
+    virtual ~SelectState();
+
+    CZRQueryInfo* m_query = nullptr;  // not owned
+    CZRSQLTree* m_selectNode;         // not owned
+    CList<SelectState*> m_states;     // of nested selects; owned
+    int m_afterDbName = 0;            // a DB_NAME was met and its TABLE_NAME was not
+
+    // The number of items that the walk may make before it gives up with an exception. Trees in which one
+    // part stands for several (an escape within an escape, deeply) are kept from filling the memory.
+    void setItemLimit(std::size_t items);
+
+    // Nested selects anywhere below the node: one state, and one descriptor in m_subQueries, for each.
+    void CollectSubQueries(CZRSQLTree* node);
+    void CollectAliases(CZRSQLTree* node);
+    void CollectTables();
+    void CollectFields();
+
+    // One child of the select node.
+    virtual void ProcessClause(CZRSQLTree* node);
+    // Runs what the steps have left to do.
+    void finish();
+
+    virtual void ProcessPredicate(CZRSQLTree* node);
+    // The entry for the items of all clauses but FROM.
+    virtual void ProcessSelectItem(CZRSQLTree* node, ItemList* list);
+    virtual void ProcessFromItem(CZRSQLTree* node, ItemList* list, CZRSQLTree* parent);
+    virtual void ProcessExpression(CZRSQLTree* node, ItemList* list, CZRSQLTree* parent);
+    virtual void ProcessOperator(CZRSQLTree* node, ItemList* list, CZRSQLTree* parent);
+    virtual void ProcessFunction(CZRSQLTree* node, ItemList* list);
+    // The children of a node as far as the first RIGHT_PAREN.
+    virtual void ProcessParams(ItemList* list, CZRSQLTree* node);
+    virtual void ProcessLiteral(CZRSQLTree* node, ItemList* list);
+    virtual void ProcessKeyword(CZRSQLTree* node, ItemList* list);
+    // Raises CInvalidArgException when the list is empty.
+    virtual void ProcessOrder(CZRSQLTree* node, ItemList* list);
+    virtual void ProcessColumn(CZRSQLTree* node, ItemList* list);
+    virtual void ProcessSubQuery(CZRSQLTree* node, ItemList* list);
+    // Gives the branch's descriptor, which the item in the list owns.
+    virtual CZRQueryInfo* ProcessUnion(CZRSQLTree* node, ItemList* list);
+    virtual void FillField(CZRSQLTree* node, SelectItemField& item);
+    virtual std::unique_ptr<CFieldObject> MakeFieldObject(CZRSQLTree* node);
+    virtual std::unique_ptr<SelectItem> MakeTableItem(CZRSQLTree* node);
+    // Copies aliases, tables and fields to a nested descriptor: it resolves names as its parent does.
+    void CopySources(CZRQueryInfo& target);
+
+    bool IsKnownAlias(const CString& name);
+    bool IsOperator(CZRSQLTree* node) const { return dialect_.tokens.isOperator(node->GetType()); }
+    // The clean text of a name node.
+    virtual CString GetNodeText(CZRSQLTree* node);
+
+    Role roleOf(CZRSQLTree* node) const { return dialect_.tokens.role(node->GetType()); }
+
+ protected:
+    // A state with an outer one shares its work and finds the aliases that it knows.
+    SelectState(CZRSQLTree* selectNode, const Dialect& dialect, SelectState* outer);
+
+    // A state of the same dialect for a nested select.
+    virtual std::unique_ptr<SelectState> makeNested(CZRSQLTree* selectNode) = 0;
+
+    // One ALIAS node.
+    virtual void collectAlias(CZRSQLTree* node);
+    // One node below the select node, in the order of the tree.
+    virtual void collectTable(CZRSQLTree* node);
+    void enterTable(const CString& name) { m_query->m_sourceTables[name] = name; }
+    // The first alias of a key wins.
+    void enterAlias(const CString& key, const CString& shown);
+    // Under the two texts joined; replaces what stands there.
+    void enterField(std::unique_ptr<CFieldObject> field);
+
+    // The name without its quotes, when it begins with one.
+    CString unquoted(CString name) const;
+
+    template <class Item>
+    Item& append(ItemList* list, std::unique_ptr<Item> item) {
+        list->AddTail(item.get());
+        return *item.release();
+    }
+    // All items of the walk come from here, so that they are counted.
+    template <class Item>
+    std::unique_ptr<Item> newItem() {
+        countItem();
+        return std::make_unique<Item>();
+    }
+    SelectItem& appendText(ItemList* list, const CString& text, int kind);
+    // The item that stands for a part of a join, named " ".
+    SelectItem& appendJoinPart(ItemList* list);
+
+    WorkStack& work() { return walk_->work; }
+
+ private:
+    struct Walk {
+        WorkStack work;
+        std::size_t itemsLeft;
+    };
+
+    void countItem();
+    // Steps in the form that the work stack takes.
+    void clauseStep(CZRSQLTree* node, ItemList*, CZRSQLTree*) { ProcessClause(node); }
+    void selectItemStep(CZRSQLTree* node, ItemList* list, CZRSQLTree*) { ProcessSelectItem(node, list); }
+    void literalStep(CZRSQLTree* node, ItemList* list, CZRSQLTree*) { ProcessLiteral(node, list); }
+    void functionStep(CZRSQLTree* node, ItemList* list, CZRSQLTree*) { ProcessFunction(node, list); }
+    void functionItemStep(CZRSQLTree* node, ItemList* list, CZRSQLTree*) { appendFunction(node, list); }
+    void joinPostfixStep(CZRSQLTree* node, ItemList* list, CZRSQLTree* parent);
+    void resolveStep(CZRSQLTree*, ItemList*, CZRSQLTree*) { m_query->ResolveSources(); }
+
+    void processItems(CZRSQLTree* clause, ItemList& list);
+    void appendFunction(CZRSQLTree* node, ItemList* list);
+    // A new descriptor that knows what this one knows; the owner's pointer holds it at once.
+    CZRQueryInfo& newNestedQuery(CZRQueryInfo*& owner);
+    // Fills a new nested descriptor from the first select on the chain of first children.
+    void walkNested(CZRSQLTree* from, CZRQueryInfo& target);
+    AliasNames& aliasNames();
+
+    const Dialect& dialect_;
+    std::unique_ptr<Walk> ownWalk_;  // of the outermost state
+    Walk* walk_;
+    std::unique_ptr<AliasNames> ownAliasNames_;
+    AliasNames* aliasNames_ = nullptr;  // made when first needed, or those of the outer state
+};
+
+}  // namespace zr
