@@ -2,7 +2,7 @@
 # exported; everything else keeps hidden visibility.
 
 set(zr_pieces)
-foreach(piece zr_platform zr_model zr_engine zr_grammars zr_parser zr_analysis)
+foreach(piece zr_platform zr_model zr_stream zr_engine zr_grammars zr_parser zr_analysis)
   if(TARGET ${piece})
     list(APPEND zr_pieces ${piece})
   endif()

@@ -1,0 +1,52 @@
+// Runs what the documents show. In a block that begins with ```console each line behind "$ " is a command,
+// and the lines up to the next one are what it writes.
+
+#include <gtest/gtest.h>
+
+#include "program.h"
+
+namespace zr::test {
+namespace {
+
+struct Shown {
+    std::string command;
+    std::string output;
+};
+
+std::vector<Shown> shownIn(const std::string& document) {
+    std::vector<Shown> all;
+    bool inBlock = false;
+    for (const std::string& line : splitLines(document)) {
+        if (line.starts_with("```"))
+            inBlock = line == "```console";
+        else if (inBlock && line.starts_with("$ "))
+            all.push_back({line.substr(2), {}});
+        else if (inBlock && !all.empty() && all.back().command.ends_with('\\'))
+            all.back().command += "\n" + line;
+        else if (inBlock && !all.empty())
+            all.back().output += line + "\n";
+    }
+    return all;
+}
+
+class Document : public testing::TestWithParam<std::string> {};
+
+TEST_P(Document, ShowsWhatItsCommandsWrite) {
+    const auto all = shownIn(readFile(ZR_SOURCE_DIR "/" + GetParam()));
+    EXPECT_FALSE(all.empty());
+    for (const Shown& shown : all) EXPECT_EQ(runShell(shown.command).output, shown.output) << shown.command;
+}
+
+INSTANTIATE_TEST_SUITE_P(Files, Document, testing::Values("README.md", "docs/zrsql.md"));
+
+TEST(Examples, AreAllAnalysed) {
+    const auto result = runShell(
+        "for file in examples/*/*.sql; do"
+        "  build/release/bin/zrsql analyze -d $(basename $(dirname $file)) --format pretty"
+        "    --catalog examples/catalog.json -f $file | grep -c '^Columns$' || exit 1;"
+        " done");
+    EXPECT_EQ(result.exitStatus, 0) << result.output << result.errors;
+}
+
+}  // namespace
+}  // namespace zr::test
