@@ -75,7 +75,7 @@ class RuleRun final : TreeBuilder::ErrorNodes {
             return finish(recogniser, result, start);
         // Nothing reads the statement: its mandatory part is left to recovery.
         Recogniser recovering(table_, tokens_.types, state_.options);
-        result = recovering.run(wanted, 0, true);
+        result = recovering.recover(wanted, 0);
         return finish(recovering, result, start);
     }
 

@@ -247,7 +247,10 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                     return false;
                 if (!recoverable && !guarded(node, low)) return false;
                 const std::uint32_t child = entryFor(node.arg, low);
-                if (recoverable) entries_[child].mayRecover = true;
+                if (recoverable) {
+                    if (recoverAskedAt_ == kNone || low > recoverAskedAt_) recoverAskedAt_ = low;
+                    entries_[child].mayRecover = low == recoverPlace_;
+                }
                 pushFrame(entries_[entryIndex], {kNone, low, high, state, child, kNone, 0, at});
                 return false;
             }
@@ -332,9 +335,29 @@ bool Recogniser::recover(std::uint32_t entryIndex) {
     return true;
 }
 
-Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position, bool recovering) {
-    recovering_ = recovering;
+void Recogniser::reset() {
+    entriesAt_.assign(count_ + 1, kNone);
+    entries_.clear();
+    ends_.clear();
+    states_.clear();
+    frames_.clear();
+    freeFrame_ = kNone;
+    visits_.clear();
+    visitTable_.clear();
+    visitTableUsed_ = 0;
+    steps_ = 0;
+}
+
+Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
+    recovering_ = true;
     recoverStart_ = position;
+    run(rule, position);
+    reset();
+    recoverPlace_ = recoverAskedAt_;
+    return run(rule, position);
+}
+
+Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
     Result result;
     result.entry = entryFor(rule, position);
     chain_.assign(1, result.entry);

@@ -49,9 +49,12 @@ class Recogniser {
     /// object.
     Recogniser(const ParserTable& table, const std::vector<std::uint16_t>& types, const Options& options);
 
-    /// Runs `rule` from `position`. `recovering`: the recover rule of the statement that starts at `position`
-    /// may stand for anything up to a token that can follow it.
-    Result run(std::uint16_t rule, std::uint32_t position, bool recovering = false);
+    /// Runs `rule` from `position`.
+    Result run(std::uint16_t rule, std::uint32_t position);
+
+    /// The same for a statement that run() of another object couldn't read: its recover rule, at the last
+    /// place where the statement itself asks for it, may stand for anything up to a token that can follow it.
+    Result recover(std::uint16_t rule, std::uint32_t position);
 
     // What the tree builder reads.
     const State& state(std::uint32_t index) const { return states_[index]; }
@@ -110,6 +113,7 @@ class Recogniser {
     bool recoversIn(std::uint32_t entry) const {
         return recovering_ && entries_[entry].position == recoverStart_;
     }
+    void reset();
     bool settle(std::uint32_t& low, std::uint32_t& high) const;
     std::uint32_t viable(const NodeRow& node, std::uint32_t low, std::uint32_t high) const;
     bool guarded(const NodeRow& node, std::uint32_t position);
@@ -144,7 +148,9 @@ class Recogniser {
     std::vector<std::uint32_t> chain_;
     std::uint64_t steps_ = 0;
     bool recovering_ = false;
-    std::uint32_t recoverStart_ = 0;
+    std::uint32_t recoverStart_ = 0;        ///< where the statement starts
+    std::uint32_t recoverPlace_ = kNone;    ///< the one place where the recover rule may stand for anything
+    std::uint32_t recoverAskedAt_ = kNone;  ///< last place where the statement asked for it
 };
 
 }  // namespace zr::engine
