@@ -1,0 +1,160 @@
+#include "tests/grammar/reading.h"
+
+#include <zrparsersql/input_stream.h>
+#include <zrparsersql/recognizers/MSSQL.h>
+#include <zrparsersql/recognizers/MSSQL_tokens.h>
+
+#include <new>
+#include <set>
+
+#include "tests/grammar/json_string.h"
+
+namespace zr::test {
+namespace {
+
+struct Mssql {
+    using Lexer = pMSSQLLexer;
+    using Parser = pMSSQLParser;
+    static Lexer newLexer(pANTLR3_INPUT_STREAM input) { return MSSQLLexerNew(input); }
+    static Parser newParser(pANTLR3_COMMON_TOKEN_STREAM tokens) { return MSSQLParserNew(tokens); }
+    static ZRRuleReturn readStatement(Parser parser) { return parser->all_sql_query(parser); }
+};
+
+/// A token of the text is read from the text itself: a string that the runtime makes of UTF-16 input may bear
+/// the wrong encoding. Imaginary and error nodes have plain characters for a text.
+std::u16string textOf(const ANTLR3_COMMON_TOKEN& token) {
+    if (token.textState == ANTLR3_TEXT_CHARP) {
+        const std::string_view name = reinterpret_cast<const char*>(token.tokText.chars);
+        return {name.begin(), name.end()};
+    }
+    const auto* first = reinterpret_cast<const char16_t*>(token.start);
+    const auto* last = reinterpret_cast<const char16_t*>(token.stop);
+    return last < first ? std::u16string() : std::u16string(first, last + 1);
+}
+
+std::u16string textOf(pANTLR3_BASE_TREE node) {
+    if (node->isNilNode(node)) return u"nil";
+    if (pANTLR3_COMMON_TOKEN token = node->getToken(node)) return textOf(*token);
+    pANTLR3_STRING text = node->getText(node);
+    return text == nullptr ? std::u16string() : std::u16string(text->chars, text->chars + text->len);
+}
+
+/// Lexer, token stream and parser over one text, freed in the order in which the runtime wants it.
+template <typename G>
+class Pipeline {
+ public:
+    explicit Pipeline(std::u16string_view text)
+        : input_(check(zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size())))),
+          lexer_(check(G::newLexer(input_))),
+          tokens_(check(antlr3CommonTokenStreamSourceNew(1025, lexer_->pLexer->rec->state->tokSource))),
+          parser_(check(G::newParser(tokens_))) {}
+    Pipeline(const Pipeline&) = delete;
+    Pipeline& operator=(const Pipeline&) = delete;
+    ~Pipeline() {
+        parser_->free(parser_);
+        tokens_->free(tokens_);
+        lexer_->free(lexer_);
+        input_->close(input_);
+    }
+
+    typename G::Parser parser() { return parser_; }
+
+    void rewind() { tokens_->tstream->istream->seek(tokens_->tstream->istream, 0); }
+
+    std::vector<TokenText> tokens() {
+        tokens_->tstream->_LT(tokens_->tstream, 1);  // the stream is filled when somebody looks at it
+        std::vector<TokenText> out;
+        const ANTLR3_UINT32 count = tokens_->tokens->count;
+        for (ANTLR3_UINT32 i = 0; i < count; ++i) {
+            auto* token = static_cast<pANTLR3_COMMON_TOKEN>(tokens_->tokens->get(tokens_->tokens, i));
+            const auto type = static_cast<int>(token->getType(token));
+            if (type != static_cast<int>(ANTLR3_TOKEN_EOF)) out.push_back({type, textOf(*token)});
+        }
+        return out;
+    }
+
+    std::size_t position() {
+        return static_cast<std::size_t>(tokens_->tstream->istream->index(tokens_->tstream->istream));
+    }
+
+ private:
+    template <typename T>
+    static T* check(T* made) {
+        if (made == nullptr) throw std::bad_alloc();
+        return made;
+    }
+
+    pANTLR3_INPUT_STREAM input_;
+    typename G::Lexer lexer_;
+    pANTLR3_COMMON_TOKEN_STREAM tokens_;
+    typename G::Parser parser_;
+};
+
+void copyTree(pANTLR3_BASE_TREE root, Reading& reading) {
+    struct Pending {
+        pANTLR3_BASE_TREE node;
+        std::size_t depth;
+    };
+    std::set<pANTLR3_BASE_TREE> seen;
+    std::vector<Pending> pending{{root, 0}};
+    while (!pending.empty()) {
+        const auto [node, depth] = pending.back();
+        pending.pop_back();
+        if (!seen.insert(node).second) {
+            reading.wellFormed = false;
+            return;
+        }
+        const bool nil = node->isNilNode(node);
+        const int type = nil ? 0 : static_cast<int>(node->getType(node));
+        reading.tree.add(type, quoteJson(textOf(node)), depth);
+        if (type == 0 && !nil) reading.hasErrorNode = true;
+        for (ANTLR3_UINT32 i = node->getChildCount(node); i-- > 0;)
+            pending.push_back({static_cast<pANTLR3_BASE_TREE>(node->getChild(node, i)), depth + 1});
+    }
+}
+
+template <typename G>
+std::vector<TokenText> lex(std::u16string_view text) {
+    return Pipeline<G>(text).tokens();
+}
+
+template <typename G>
+Reading read(std::u16string_view text) {
+    Reading reading;
+    {
+        Pipeline<G> pipeline(text);
+        copyTree(pipeline.parser()->start_rule(pipeline.parser()).tree, reading);
+        reading.tokens = pipeline.tokens();
+    }
+    // The start rule takes the tail as well; how far the statement went is told by its own rule.
+    Pipeline<G> pipeline(text);
+    G::readStatement(pipeline.parser());
+    reading.taken = pipeline.position();
+    return reading;
+}
+
+template <typename G>
+Reading readAgain(std::u16string_view text) {
+    Reading reading;
+    Pipeline<G> pipeline(text);
+    pipeline.parser()->start_rule(pipeline.parser());
+    pipeline.rewind();
+    copyTree(pipeline.parser()->start_rule(pipeline.parser()).tree, reading);
+    reading.tokens = pipeline.tokens();
+    pipeline.rewind();
+    G::readStatement(pipeline.parser());
+    reading.taken = pipeline.position();
+    return reading;
+}
+
+template <typename G>
+constexpr Grammar grammar(std::string_view corpus, const char* (*tokenName)(int)) {
+    return {corpus, tokenName, &lex<G>, &read<G>, &readAgain<G>};
+}
+
+}  // namespace
+
+const Grammar kGrammars[] = {grammar<Mssql>("mssql", &MSSQL_token_name)};
+const std::size_t kGrammarCount = std::size(kGrammars);
+
+}  // namespace zr::test

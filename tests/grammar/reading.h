@@ -1,0 +1,40 @@
+#pragma once
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "tests/grammar/syntax_dump.h"
+
+namespace zr::test {
+
+struct TokenText {
+    int type;
+    std::u16string text;
+    bool operator==(const TokenText&) const = default;
+};
+
+/// What lexer and parser of one grammar make of a text, copied out of the runtime's objects, which are gone.
+struct Reading {
+    std::vector<TokenText> tokens;  ///< without the end of input
+    SyntaxDump tree;                ///< what the start rule returns
+    bool wellFormed = true;         ///< no node stands in the tree twice
+    std::size_t taken = 0;          ///< tokens that the statement's own rule takes
+    bool hasErrorNode = false;
+};
+
+/// A grammar as the tests see it.
+struct Grammar {
+    std::string_view corpus;  ///< folder under tests/corpus
+    const char* (*tokenName)(int type);
+    std::vector<TokenText> (*lex)(std::u16string_view text);
+    Reading (*read)(std::u16string_view text);
+    /// The same, with lexer, token stream and parser asked twice: what the second call returns.
+    Reading (*readAgain)(std::u16string_view text);
+};
+
+extern const Grammar kGrammars[];
+extern const std::size_t kGrammarCount;
+
+}  // namespace zr::test
