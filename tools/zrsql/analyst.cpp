@@ -53,9 +53,8 @@ ReadPlace readPlace(const Grammar& grammar, std::u16string_view text) {
     place.taken = read.taken;
     place.all = read.all;
     if (read.stoppedAt) {
-        std::u16string buffer;
         place.stop = placeOf(text, recogniser.offset(read.stoppedAt));
-        place.stop->text = runtimeText(read.stoppedAt->getText(read.stoppedAt), buffer);
+        place.stop->text = runtimeText(read.stoppedAt->getText(read.stoppedAt));
     }
     return place;
 }

@@ -72,12 +72,11 @@ std::size_t Recogniser::offset(pANTLR3_COMMON_TOKEN token) const {
     return static_cast<std::size_t>(token->start - start) / sizeof(char16_t);
 }
 
-std::u16string_view runtimeText(pANTLR3_STRING string, std::u16string& buffer) {
+std::u16string_view runtimeText(pANTLR3_STRING string) {
+    // All strings come from factories over the UTF-16 input. Their encoding member says 8 bit all the same,
+    // so it can't be asked.
     if (!string || string->len == 0) return {};
-    if (string->encoding & ANTLR3_ENC_UTF16)
-        return {reinterpret_cast<const char16_t*>(string->chars), string->len};
-    buffer.assign(string->chars, string->chars + string->len);
-    return buffer;
+    return {reinterpret_cast<const char16_t*>(string->chars), string->len};
 }
 
 }  // namespace zr::tool

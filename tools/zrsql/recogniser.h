@@ -5,7 +5,6 @@
 #include <cstddef>
 #include <cstdint>
 #include <memory>
-#include <string>
 #include <string_view>
 #include <vector>
 
@@ -68,8 +67,7 @@ inline std::int32_t tokenNumber(ANTLR3_UINT32 type) {
     return static_cast<std::int32_t>(type);
 }
 
-// The units of a string of the runtime, whatever its encoding. The buffer is the caller's, for strings that
-// have to be widened; the view lives as long as both.
-std::u16string_view runtimeText(pANTLR3_STRING string, std::u16string& buffer);
+// The units of a string of the runtime, which lives as long as the recogniser that it came from.
+std::u16string_view runtimeText(pANTLR3_STRING string);
 
 }  // namespace zr::tool

@@ -6,20 +6,18 @@ namespace zr::tool {
 
 void appendTokenLines(std::string& out, const Grammar& grammar, std::u16string_view text) {
     Recogniser recogniser(grammar, text);
-    std::u16string buffer;
     for (const pANTLR3_COMMON_TOKEN token : recogniser.tokens()) {
         appendNumber(out, tokenNumber(token->type));
         out += '\t';
         out += grammar.tokenName(tokenNumber(token->type));
         out += '\t';
-        appendJsonString(out, runtimeText(token->getText(token), buffer));
+        appendJsonString(out, runtimeText(token->getText(token)));
         out += '\n';
     }
 }
 
 void appendTokenJson(std::string& out, const Grammar& grammar, std::u16string_view text) {
     Recogniser recogniser(grammar, text);
-    std::u16string buffer;
     char before = '[';
     for (const pANTLR3_COMMON_TOKEN token : recogniser.tokens()) {
         out += before;
@@ -29,7 +27,7 @@ void appendTokenJson(std::string& out, const Grammar& grammar, std::u16string_vi
         out += ',';
         appendJsonString(out, std::string_view(grammar.tokenName(tokenNumber(token->type))));
         out += ',';
-        appendJsonString(out, runtimeText(token->getText(token), buffer));
+        appendJsonString(out, runtimeText(token->getText(token)));
         out += ']';
     }
     if (before == '[') out += '[';

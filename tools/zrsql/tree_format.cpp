@@ -29,10 +29,9 @@ void walk(pANTLR3_BASE_TREE root, Visitor& visitor) {
         ANTLR3_UINT32 next;
     };
     std::vector<Step> path;
-    std::u16string buffer;
     const auto enter = [&](pANTLR3_BASE_TREE tree, ANTLR3_UINT32 place) {
         const ANTLR3_UINT32 count = tree->getChildCount(tree);
-        const auto text = runtimeText(tree->getText(tree), buffer);
+        const auto text = runtimeText(tree->getText(tree));
         visitor.enter(Node{tokenNumber(tree->getType(tree)), text, count, path.size(), place});
         path.push_back({tree, count, 0});
     };
