@@ -4,11 +4,10 @@ namespace zr {
 
 namespace {
 
+// All strings come from factories over the UTF-16 input, whatever their encoding member says.
 CString fromRuntime(const ANTLR3_STRING* text) {
-    if (!text || !text->chars) return CString();
-    if (text->encoding == ANTLR3_ENC_8BIT)
-        return CString::fromUtf8({reinterpret_cast<const char*>(text->chars), text->len});
-    return CString(reinterpret_cast<const char16_t*>(text->chars), text->len);
+    return text && text->chars ? CString(reinterpret_cast<const char16_t*>(text->chars), text->len)
+                               : CString();
 }
 
 }  // namespace
