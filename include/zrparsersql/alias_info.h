@@ -4,6 +4,11 @@
 
 class SelectItem;
 
+namespace zr {
+struct ShallowCopy;
+class DescriptorCopier;
+}  // namespace zr
+
 // An alias of a select list: a column that carries the expression it stands for.
 class ZR_API CZRAliasInfo : public CZRSourceFildInfo {
  public:
@@ -28,4 +33,9 @@ class ZR_API CZRAliasInfo : public CZRSourceFildInfo {
     void SetAliasTable(CString value) { AliasTable = std::move(value); }
     CString GetAliasField() const { return AliasField; }
     void SetAliasField(CString value) { AliasField = std::move(value); }
+
+   private:
+    friend class zr::DescriptorCopier;
+    // Leaves the expression out.
+    CZRAliasInfo(const CZRAliasInfo& other, const zr::ShallowCopy&);
 };

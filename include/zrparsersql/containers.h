@@ -174,6 +174,7 @@ class StringMap {
     template <class EntryType, class NodeType>
     class Iterator {
      public:
+        Iterator() = default;
         explicit Iterator(NodeType* node) : node_(node) {}
         EntryType& operator*() const { return node_->entry; }
         EntryType* operator->() const { return &node_->entry; }
@@ -184,7 +185,7 @@ class StringMap {
         bool operator==(const Iterator&) const = default;
 
      private:
-        NodeType* node_;
+        NodeType* node_ = nullptr;
     };
 
  public:

@@ -77,16 +77,18 @@ struct ZR_API CZRFilterValue {
     // without memory. The pointer holds until the value is changed, destroyed or asked for another encoding.
     const char* GetAs(int encoding);
     const char16_t* GetWide();
-    // Reads the text as a number, 0 where it is none. Each "," of the text becomes "." for good.
+    // Reads the text as a number, as far as it is one; 0 where it is none or out of range. Each "," of the
+    // text becomes
+    // "." for good.
     double GetDouble();
     // Answers 0 and leaves the result alone when the text is no date.
     int GetDate(zr::DateTime& result);
 
     // Compares type, text and binary part.
-    bool Equals(CZRFilterValue& other);
+    bool Equals(const CZRFilterValue& other) const;
     // Does not compare the type, and takes a binary part that is missing on either side as equal.
-    bool EqualsLoosely(CZRFilterValue& other);
-    bool NotEquals(CZRFilterValue& other) { return !Equals(other); }
+    bool EqualsLoosely(const CZRFilterValue& other) const;
+    bool NotEquals(const CZRFilterValue& other) const { return !Equals(other); }
 
     void Save(CZRStorageNode& node);
     void Load(CZRStorageNode& node);

@@ -34,8 +34,10 @@ struct ZR_API CZRQueryUnionInfo {
 //
 // Owns what its lists and maps hold, apart from m_database. What is replaced or dropped during an analysis
 // goes to the descriptor's retired objects, since a host may still hold it, and dies with the descriptor.
-// Threads: one at a time; two descriptors of one database count as one object.
-// Failure: a look-up that fails marks the query with SetCorrect(1).
+// Look-ups and validation follow queries that read from queries by this class's own rules to any depth,
+// without calling overrides of those operations on the queries in between; queries that read from each other
+// find nothing there. Threads: one at a time; two descriptors of one database count as one object. Failure: a
+// look-up that fails marks the query with SetCorrect(1).
 class ZR_API CZRQueryInfo : public CZRSourceInfo {
  public:
     std::uint16_t QueryFlag = 0;
@@ -127,8 +129,8 @@ class ZR_API CZRQueryInfo : public CZRSourceInfo {
     CZRSourceFildInfo* FindField(CString tableName, CString fieldName);
     // The first column of that name in the sources, or null.
     CZRSourceFildInfo* FindFieldInSources(CString fieldName);
-    // Answers 1 and fills found with the query, this one or one it reads from, that has an alias whose name
-    // is the table name or, in lower case, the column name; 0 otherwise.
+    // Looks for a query, this one or one it reads from, with an alias whose name is the table name or the
+    // column name. Answers 1 and fills found with that query, or 0.
     int FindInSubQueries(CString tableName, CString fieldName, CZRQueryInfo*& found);
     // 0 when all column references are known and selected, else 1.
     int CheckFieldRefs();
@@ -137,9 +139,11 @@ class ZR_API CZRQueryInfo : public CZRSourceInfo {
     void ResolveItems(CList<SelectItem*>& items);
     void ResolveAllItems();
     void ResolveItem(SelectItem* item);
-    // Looks for the entry of a list that a column means. Gives the text of the entry's column, or an empty
-    // text; found receives the entry. flag: match by column alone. mode 0: a function or sub-query not named
-    // "ALIAS" gives an empty text and ends its search.
+    // Looks in a list, and in what stands below its entries, for the column that is wanted: the first one of
+    // that table and column, or of that column alone when flag is nonzero or no table is wanted. A "*" is
+    // searched through in the select lists of the queries among m_sourceTables. Gives the column's text and
+    // fills found, or gives an empty text. With mode 0 nothing is found below functions, operators and
+    // sub-queries not named "ALIAS".
     CString MatchSelectList(const CList<SelectItem*>& items, const SelectItemField& wanted,
                             SelectItem*& found, int flag, int mode);
 

@@ -1,0 +1,43 @@
+#include "zrparsersql/filter_info.h"
+
+#include <new>
+
+namespace {
+
+// As the class promises its subclasses: this class's destructor, then the memory.
+template <class T>
+void endAs(T* object) {
+    if (!object) return;
+    object->T::~T();
+    ::operator delete(static_cast<void*>(object));
+}
+
+}  // namespace
+
+CZRFilterItemInfo::~CZRFilterItemInfo() = default;
+
+void CZRFilterItemInfo::destroy(CZRFilterItemInfo* item) {
+    endAs(item);
+}
+
+void CZRFilterItemInfo::SetAll(CString fieldID, int condition, const CZRFilterValue& value,
+                               int conditionAdd) {
+    FieldID = std::move(fieldID);
+    Condition = condition;
+    Value = value;
+    ConditionAdd = conditionAdd;
+}
+
+CZRFilterInfo::CZRFilterInfo(const CZRFilterInfo& other)
+    : SQLQuery(other.SQLQuery), UseSQLQuery(other.UseSQLQuery) {
+    for (const CZRFilterItemInfo* item : other.Items)
+        if (item) Items.AddTail(item->Clone());
+}
+
+CZRFilterInfo::~CZRFilterInfo() {
+    for (CZRFilterItemInfo* item : Items) CZRFilterItemInfo::destroy(item);
+}
+
+void CZRFilterInfo::destroy(CZRFilterInfo* filter) {
+    endAs(filter);
+}
