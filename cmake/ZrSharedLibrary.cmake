@@ -22,7 +22,8 @@ if(zr_pieces)
     target_include_directories(
       zrparsersql PUBLIC "$<BUILD_INTERFACE:$<TARGET_PROPERTY:zr_grammars,INTERFACE_INCLUDE_DIRECTORIES>>")
   endif()
-  target_link_libraries(zrparsersql PUBLIC zr::antlr3c PRIVATE ICU::i18n ICU::uc zr::uuid Threads::Threads)
+  # The character stream is not exported: a host that calls recognisers brings it along.
+  target_link_libraries(zrparsersql PUBLIC zr_stream zr::antlr3c PRIVATE ICU::i18n ICU::uc zr::uuid Threads::Threads)
   if(NOT ZR_SANITIZE)
     target_link_options(zrparsersql PRIVATE LINKER:--no-undefined)
   endif()

@@ -1,6 +1,8 @@
 #include "expression_text.h"
 
+#include <algorithm>
 #include <iterator>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -11,12 +13,13 @@ namespace zr::tool {
 namespace {
 
 using Text = std::u16string;
+using View = std::u16string_view;
 
-bool isNamed(const SelectItem& item, std::u16string_view name) {
-    return item.m_isOperator && item.m_name.EqualsNoCase(name);
+bool isNamed(const SelectItem& item, std::initializer_list<View> names) {
+    return std::any_of(names.begin(), names.end(), [&](View name) { return item.m_name.EqualsNoCase(name); });
 }
 
-Text quoted(std::u16string_view text) {
+Text quoted(View text) {
     Text result = u"'";
     for (const char16_t unit : text) {
         if (unit == u'\'') result += unit;
@@ -25,103 +28,99 @@ Text quoted(std::u16string_view text) {
     return result + u"'";
 }
 
-// What stands ahead of the operands of an item, between them and behind them.
+// The word that an ordering puts behind the operands of its first item, whatever that item is.
+bool isDirection(const SelectItem& item) {
+    return item.m_kind == SIK_VALUE && item.m_name.IsEmpty() &&
+           (item.m_text == u"ASC" || item.m_text == u"DESC");
+}
+
+// The text around the operands of an item.
 struct Form {
     Text before;
-    Text between;
+    Text afterFirst;  // between the first and the second operand
+    Text between;     // between later ones
     Text behind;
-    Text afterFirst;  // in place of between, behind the first operand
 };
 
-Form evenForm(Text before, Text between, Text behind) {
-    return {std::move(before), between, std::move(behind), between};
-}
-
-Form operatorForm(const SelectItem& item) {
+Form operatorForm(const SelectItem& item, std::size_t operands) {
     const Text name(item.m_name.View());
-    if (isAlias(item)) return evenForm(u"", u" AS ", u"");
-    if (name == u",") return evenForm(u"", u", ", u"");
-    // The name of an operator that only groups the sides of a join.
-    if (name == u" ") return evenForm(u"", u" ", u"");
-    if (isNamed(item, u"JOIN")) return {u"", u" ", u"", u" " + name + u" "};
-    if (isNamed(item, u"BETWEEN")) return {u"", u" AND ", u"", u" " + name + u" "};
-    if (item.m_items.GetCount() == 1) return evenForm(name + u" ", u"", u"");
-    return evenForm(u"", u" " + name + u" ", u"");
+    const Text spaced = u" " + name + u" ";
+    if (operands == 0) return {name, {}, {}, {}};
+    if (isAlias(item)) return {{}, u" AS ", u" AS ", {}};
+    if (name == u",") return {{}, u", ", u", ", {}};
+    // The blank is the name of an operator that groups a side of a join.
+    if (name == u" ") return {{}, u" ", u" ", {}};
+    if (isNamed(item, {u"JOIN"})) return {{}, spaced, u" ", {}};
+    if (isNamed(item, {u"BETWEEN"})) return {{}, spaced, u" AND ", {}};
+    if (operands == 1) return {name + u" ", {}, {}, {}};
+    if (operands == 2) return {{}, spaced, {}, {}};
+    return {{}, spaced + u"(", u", ", u")"};
 }
 
-Form formOf(const SelectItem& item) {
-    if (item.m_isOperator) return operatorForm(item);
+Form formOf(const SelectItem& item, std::size_t operands) {
     const Text name(item.m_name.View());
-    if (item.m_kind == SIK_DATA_TYPE) return evenForm(Text(item.m_text.View()) + u"(", u", ", u")");
-    return evenForm(name + u"(", u", ", u")");
+    if (item.m_isOperator) return operatorForm(item, operands);
+    if (isNamed(item, {u"CASE"})) return {name + u" ", u" ", u" ", u" END"};
+    if (isNamed(item, {u"WHEN", u"THEN", u"ELSE"})) return {name + u" ", u" ", u" ", {}};
+    const bool isFunction = item.m_kind == SIK_FUNCTION || item.m_kind == SIK_USER_FUNCTION;
+    if (isFunction || operands)
+        return {(isFunction ? name : Text(item.m_text.View())) + u"(", u", ", u", ", u")"};
+    if (item.m_kind == SIK_STRING) return {quoted(item.m_text), {}, {}, {}};
+    return {Text(item.m_text.IsEmpty() ? item.m_name.View() : item.m_text.View()), {}, {}, {}};
 }
 
-bool isFunction(const SelectItem& item) {
-    return (item.m_kind == SIK_FUNCTION || item.m_kind == SIK_USER_FUNCTION) && !item.m_isOperator;
-}
+// Still to be written: text, and an item behind it.
+struct Piece {
+    Text text;
+    const SelectItem* item = nullptr;
+};
 
-Text plainText(const SelectItem& item) {
-    if (item.m_kind == SIK_STRING) return quoted(item.m_text);
-    return Text(item.m_text.IsEmpty() ? item.m_name.View() : item.m_text.View());
+std::vector<Piece> piecesOf(const SelectItem& item, const NameQuery& nameQuery) {
+    std::vector<const SelectItem*> operands(item.m_items.begin(), item.m_items.end());
+    Text directions;
+    while (!operands.empty() && isDirection(*operands.back())) {
+        directions = u" " + Text(operands.back()->m_text.View()) + directions;
+        operands.pop_back();
+    }
+    const ItemClass itemClass = classOf(item);
+    if (itemClass.field) return {{fieldText(*itemClass.field) + directions}};
+    if (itemClass.query) return {{nameQuery(*itemClass.query) + directions}};
+
+    const Form form = formOf(item, operands.size());
+    std::vector<Piece> pieces = {{form.before}};
+    for (std::size_t at = 0; at < operands.size(); ++at) {
+        if (at) pieces.push_back({at == 1 ? form.afterFirst : form.between});
+        pieces.push_back({{}, operands[at]});
+    }
+    pieces.push_back({form.behind + directions});
+    return pieces;
 }
 
 }  // namespace
 
 bool isAlias(const SelectItem& item) {
-    return isNamed(item, u"ALIAS") && item.m_items.GetCount() >= 2;
+    return item.m_isOperator && item.m_items.GetCount() >= 2 && isNamed(item, {u"ALIAS"});
 }
 
 Text fieldText(const SelectItemField& field) {
     Text text;
-    const auto add = [&](const CString& part) {
-        if (part.IsEmpty()) return;
-        if (!text.empty()) text += u'.';
-        text += part.View();
-    };
-    add(field.m_dbName);
-    add(field.m_schemaName);
-    add(field.m_tableAlias);
-    add(field.m_sourceTable);
-    add(field.m_sourceField);
+    for (const CString* part : {&field.m_dbName, &field.m_schemaName, &field.m_tableAlias,
+                                &field.m_sourceTable, &field.m_sourceField}) {
+        if (!text.empty() && !part->IsEmpty()) text += u'.';
+        text += part->View();
+    }
     return text.empty() ? Text(field.m_text.View()) : text;
 }
 
 Text expressionText(const SelectItem& root, const NameQuery& nameQuery) {
-    // Still to be written, from the last to the first: an item, or text.
-    struct Piece {
-        Text text;
-        const SelectItem* item = nullptr;
-    };
     Text out;
-    std::vector<Piece> todo;
-    todo.push_back({{}, &root});
+    std::vector<Piece> todo = {{{}, &root}};  // from the last to the first
     while (!todo.empty()) {
         const Piece piece = std::move(todo.back());
         todo.pop_back();
         out += piece.text;
         if (!piece.item) continue;
-        const SelectItem& item = *piece.item;
-        const ItemClass itemClass = classOf(item);
-        const bool hasForm = item.m_isOperator || isFunction(item) || !item.m_items.IsEmpty();
-        if (itemClass.field)
-            out += fieldText(*itemClass.field);
-        else if (itemClass.query)
-            out += nameQuery(*itemClass.query);
-        else if (!hasForm)
-            out += plainText(item);
-        if (itemClass.hasQuery || (itemClass.field ? item.m_items.IsEmpty() : !hasForm)) continue;
-
-        // A column or a plain value has items only where an ordering was put: they follow.
-        const Form form = itemClass.field ? evenForm(u" ", u" ", u"") : formOf(item);
-        std::vector<Piece> pieces;
-        pieces.push_back({form.before});
-        int place = 0;
-        for (const SelectItem* operand : item.m_items) {
-            if (place) pieces.push_back({place == 1 ? form.afterFirst : form.between});
-            pieces.push_back({{}, operand});
-            ++place;
-        }
-        pieces.push_back({form.behind});
+        std::vector<Piece> pieces = piecesOf(*piece.item, nameQuery);
         todo.insert(todo.end(), std::make_move_iterator(pieces.rbegin()),
                     std::make_move_iterator(pieces.rend()));
     }

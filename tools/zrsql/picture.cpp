@@ -46,7 +46,8 @@ void joinTo(Text& text, const Text& part, std::u16string_view between) {
     text += part;
 }
 
-// Lines of cells, each column as wide as its widest cell, up to a bound.
+// Lines of cells, each column as wide as its widest cell, up to a bound. A column without any text takes no
+// room.
 class Table {
  public:
     void add(std::vector<Text> cells) { lines_.push_back(std::move(cells)); }
@@ -61,9 +62,9 @@ class Table {
         for (const auto& cells : lines_) {
             Text line = u" ";
             for (std::size_t at = 0; at < cells.size(); ++at) {
-                line += u' ' + cells[at];
-                if (at + 1 < cells.size())
-                    line.append(widths[at] + 1 - std::min(cells[at].size(), widths[at]), u' ');
+                if (widths[at])
+                    line += u' ' + cells[at] +
+                            Text(widths[at] + 1 - std::min(cells[at].size(), widths[at]), u' ');
             }
             line.erase(line.find_last_not_of(u' ') + 1);
             out += line + u'\n';
@@ -95,17 +96,20 @@ class Numbering {
     std::deque<const CZRQueryInfo*> queries_;
 };
 
-// Which name of the FROM clause means what.
+// What a FROM clause names: tables and nested queries, with their aliases.
 class FromNames {
  public:
     FromNames(const CZRQueryInfo& query, Numbering& numbering) {
         for (const SelectItem* from : query.m_fromItems)
-            forEachItem(*from, [&](const SelectItem& item) {
-                if (isAlias(item))
-                    addAlias(*item.m_items.GetHead(), item.m_items.GetTail()->m_text, numbering);
-            });
+            forEachItem(*from, [&](const SelectItem& item) { add(item, numbering); });
     }
 
+    // Names of the sources, each once, in order.
+    const std::vector<Text>& sources() const { return sources_; }
+    bool hasSource(const CString& table) const {
+        return std::any_of(sources_.begin(), sources_.end(),
+                           [&](const Text& source) { return table.EqualsNoCase(source); });
+    }
     // What an alias stands for; empty for a name that is none.
     Text meaningOf(const CString& alias) const {
         const auto found = meanings_.find(lowered(alias));
@@ -120,25 +124,36 @@ class FromNames {
     }
 
  private:
-    void addAlias(const SelectItem& source, const CString& alias, Numbering& numbering) {
-        const ItemClass itemClass = classOf(source);
-        if (itemClass.query) {
-            meanings_[lowered(alias)] = numbering.nameOf(*itemClass.query);
-        } else if (itemClass.field) {
-            const CString& table = itemClass.field->m_sourceTable;
-            meanings_[lowered(alias)] = Text(table.View());
-            tableAliases_.emplace_back(lowered(table), alias);
+    void add(const SelectItem& item, Numbering& numbering) {
+        if (isAlias(item)) {
+            const CString& alias = item.m_items.GetTail()->m_text;
+            const SelectItem& named = *item.m_items.GetHead();
+            meanings_[lowered(alias)] = sourceName(named, numbering);
+            if (const SelectItemField* table = classOf(named).field)
+                tableAliases_.emplace_back(lowered(table->m_sourceTable), alias);
+        } else if (const Text source = sourceName(item, numbering);
+                   !source.empty() && std::find(sources_.begin(), sources_.end(), source) == sources_.end()) {
+            sources_.push_back(source);
         }
     }
 
+    // Empty for an item that is no source, such as a column of a join's condition.
+    static Text sourceName(const SelectItem& item, Numbering& numbering) {
+        const ItemClass itemClass = classOf(item);
+        if (itemClass.query) return numbering.nameOf(*itemClass.query);
+        const bool isTable = itemClass.field && itemClass.field->m_sourceField.IsEmpty();
+        return isTable ? Text(itemClass.field->m_sourceTable.View()) : Text();
+    }
+
+    std::vector<Text> sources_;
     std::map<Text, Text> meanings_;
     std::vector<std::pair<Text, CString>> tableAliases_;
 };
 
 class QueryPicture {
  public:
-    QueryPicture(Text& out, const CZRQueryInfo& query, Numbering& numbering)
-        : out_(out), query_(query), numbering_(numbering), names_(query, numbering) {}
+    QueryPicture(Text& out, const CZRQueryInfo& query, bool isNested, Numbering& numbering)
+        : out_(out), query_(query), isNested_(isNested), numbering_(numbering), names_(query, numbering) {}
 
     void draw() {
         drawColumns();
@@ -202,38 +217,43 @@ class QueryPicture {
             source = Text(field.m_sourceTable.View());
         else
             source = onlySourceOf(field.m_sourceField);
-        if (field.m_sourceField.IsEmpty()) return source;
-        return (source.empty() ? u"?" : source) + u"." + Text(field.m_sourceField.View());
+        if (field.m_sourceField.IsEmpty() || source.empty()) return source;
+        return source + u"." + Text(field.m_sourceField.View());
     }
 
     // The source of a column that is written without one: the only source there is, or the only one of the
-    // catalogue that has the column; empty when that leaves it open.
+    // catalogue that has the column. "?" where that leaves it open; empty without any source.
     Text onlySourceOf(const CString& column) const {
-        if (query_.m_sourceTables.GetCount() == 1) return Text(query_.m_sourceTables.begin()->key.View());
-        Text source;
-        for (const auto* entry : sortedEntries(query_.m_sourceTables)) {
-            CZRSourceInfo* known = query_.FindSource(entry->key);
+        const std::vector<Text>& sources = names_.sources();
+        if (sources.size() <= 1) return sources.empty() ? Text() : sources.front();
+        Text only;
+        for (const Text& source : sources) {
+            CZRSourceInfo* known = query_.FindSource(CString(source));
             if (!known || !known->FindFieldBySrcName(column)) continue;
-            if (!source.empty()) return {};
-            source = Text(entry->key.View());
+            if (!only.empty()) return u"?";
+            only = source;
         }
-        return source;
+        return only.empty() ? u"?" : only;
     }
 
     void drawSources() {
-        if (query_.m_sourceTables.IsEmpty()) return;
-        out_ += u"\nSources\n";
         const bool hasCatalog = query_.m_database && !query_.m_database->Tables.IsEmpty();
         Table table;
         for (const auto* entry : sortedEntries(query_.m_sourceTables)) {
+            const bool isOwn = names_.hasSource(entry->key);
+            // A nested query's descriptor lists what the outer ones read as well.
+            if (!isOwn && isNested_) continue;
             const Text aliases = names_.aliasesOf(entry->key);
             Text resolved;
             if (hasCatalog)
                 resolved = query_.FindSource(entry->key) ? u"known as " + Text(entry->value.View())
                                                          : u"not in the catalogue";
-            table.add({Text(entry->key.View()), aliases.empty() ? aliases : u"as " + aliases, resolved});
+            table.add({Text(entry->key.View()), aliases.empty() ? aliases : u"as " + aliases,
+                       isOwn ? u"" : u"in another query", resolved});
         }
-        table.appendTo(out_);
+        Text sources;
+        table.appendTo(sources);
+        if (!sources.empty()) out_ += u"\nSources\n" + sources;
     }
 
     void drawClauses() {
@@ -273,6 +293,7 @@ class QueryPicture {
 
     Text& out_;
     const CZRQueryInfo& query_;
+    const bool isNested_;
     Numbering& numbering_;
     FromNames names_;
 };
@@ -304,7 +325,7 @@ void drawPicture(std::string& out, const CString& text, const CZRQueryInfo& root
     numbering.numberOf(root);
     while (const CZRQueryInfo* query = numbering.next()) {
         if (query != &root) picture += u"\n" + Text(u"Query ") + number(numbering.numberOf(*query)) + u'\n';
-        QueryPicture(picture, *query, numbering).draw();
+        QueryPicture(picture, *query, query != &root, numbering).draw();
     }
     drawStop(picture, place);
     out += CString(picture).toUtf8();
