@@ -236,6 +236,9 @@ class Emitter {
         for (const Guard& g : program_.guards)
             guards.push_back({classSet(g.follow), classSet(g.last), classSet(g.outside)});
         const int openers = classSet(openersOf);
+        std::vector<int> contextSets;
+        for (const CallContext& c : program_.contexts)
+            for (const auto& s : c.other) contextSets.push_back(classSet(s));
         const int recoverFollow = classSet(program_.recoverFollow);
 
         std::vector<std::pair<std::size_t, std::size_t>> choices;
@@ -268,7 +271,14 @@ class Emitter {
             o << "    {Op::" << op << ", Mark::" << marks[static_cast<int>(n.mark)] << ", "
               << (n.merge ? 1 : 0) + (n.nonEmpty ? 2 : 0) << ", " << arg << ", "
               << (n.next < 0 ? 0xFFFF : n.next) << ", " << (n.run < 0 ? 0xFFFF : n.run) << ", "
-              << (n.guard < 0 ? 0xFFFF : n.guard) << ", " << std::max(n.required, 0) << "},\n";
+              << (n.tailLoop >= 0 ? classSet(n.roundFirst)
+                  : n.guard < 0   ? 0xFFFF
+                                  : n.guard)
+              << ", " << std::max(n.required, 0) << ", "
+              << (n.op == Op::Choice ? (n.tailLoop < 0 ? 0xFFFF : n.tailLoop)
+                  : n.context < 0    ? 0xFFFF
+                                     : n.context)
+              << "},\n";
         }
         o << "};\n";
         o << "const RuleRow rules[] = {\n";
@@ -286,6 +296,8 @@ class Emitter {
         array(o, "std::uint64_t", "classSets", words, [&](std::uint64_t w) { o << w << "u"; });
         array(o, "GuardRow", "guards", guards,
               [&](const auto& g) { o << "{" << g[0] << ", " << g[1] << ", " << g[2] << "}"; });
+        array(o, "std::uint16_t", "contextSets", contextSets, [&](int s) { o << s; });
+        array(o, "bool", "contextCanEnd", program_.contexts, [&](const CallContext& c) { o << c.canEnd; });
         const auto number = [&](const char* name) {
             const auto found = vocabulary_.numberOf.find(name);
             return found == vocabulary_.numberOf.end() ? 0 : found->second;
@@ -297,7 +309,8 @@ class Emitter {
           << vocabulary_.maxNumber << ", classSets, " << firstBase << ", " << openers << ", " << recoverFollow
           << ", guards, " << guards.size() << ", " << std::max(program_.closer, 0) << ", " << parser_.start
           << ", " << parser_.statement << ", " << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule)
-          << ", " << left << ", " << right << ", " << parser_.keepTail << "};\n\n";
+          << ", " << left << ", " << right << ", " << parser_.keepTail << ", " << program_.tailLoops.size()
+          << ", contextSets, contextCanEnd, " << program_.contexts.size() << "};\n\n";
     }
 
     void contexts(std::ostream& o) const {

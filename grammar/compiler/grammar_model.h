@@ -109,7 +109,13 @@ struct ParserGrammar {
     bool keepTail = false;  ///< tail tokens and end of file stay in the tree (nil root)
     int recoverRule = -1;   ///< mandatory part that an error node may stand in for, or -1
     int islandRule = -1;    ///< rule that every nested statement goes through, or -1
-    int islandToken = -1;   ///< the token it can't do without and that nothing else takes
+    /// See the notation: declining an optional part of `rule` at `token` counts as the loop of `loopRule`
+    /// stopping.
+    struct Declined {
+        int rule, token, loopRule;
+    };
+    std::vector<Declined> declined;
+    int islandToken = -1;  ///< the token it can't do without and that nothing else takes
 };
 
 }  // namespace zr::gc

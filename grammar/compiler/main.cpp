@@ -54,7 +54,8 @@ int main(int argc, char** argv) {
         if (verbose)
             std::cerr << grammar.name << ": " << grammar.rules.size() << " rules, " << program.nodes.size()
                       << " nodes, " << program.classes << " token classes, " << program.guards.size()
-                      << " guards, " << lexerProgram.accept.size() << " lexer states, closer " << closer
+                      << " guards, " << program.tailLoops.size() << " tail loops, " << program.contexts.size()
+                      << " contexts, " << lexerProgram.accept.size() << " lexer states, closer " << closer
                       << (why.empty() ? "" : "; refused as closer:" + why) << "\n";
         if (!output.sourceFile.empty())
             emit(vocabulary, lexerGrammar, lexerProgram, grammar, facts, program, output);

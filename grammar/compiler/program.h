@@ -36,8 +36,11 @@ struct Node {
     bool merge = false;  ///< more than one way leads here: a state is entered once
     bool canEnd = false;
     std::set<int> first;
-    int guard = -1;     ///< Call: index into guards, or -1
-    int required = -1;  ///< Call: a token that must still come behind it, or -1
+    int guard = -1;            ///< Call: index into guards, or -1
+    int required = -1;         ///< Call: a token that must still come behind it, or -1
+    int context = -1;          ///< Call: index into contexts
+    int tailLoop = -1;         ///< Choice: index into tailLoops, or -1
+    std::set<int> roundFirst;  ///< Choice of a tail loop: what a round that it declines could start with
 };
 
 /// What must be in the text for a Call to be worth running: a token of `follow` right behind a token of
@@ -47,11 +50,30 @@ struct Guard {
     bool operator==(const Guard&) const = default;
 };
 
+/// A loop at the end of a recursive rule whose rounds start with a rule, such as the arguments of a call that
+/// needs neither commas nor its closing parenthesis. Where such a loop stops although a round could start,
+/// the same loop further out must not start one there: the inner one would have come first
+/// (docs/recogniser.md).
+struct TailLoop {
+    int node;             ///< its Choice: round, exit
+    std::set<int> first;  ///< what a round starts with
+};
+
+/// By tail loop: what something other than that loop can take right behind a Call.
+struct CallContext {
+    std::vector<std::set<int>> other;
+    bool canEnd;
+    bool operator==(const CallContext&) const = default;
+};
+
 struct Program {
     std::vector<Node> nodes;
     std::vector<int> entry;  ///< by rule: first node
     std::vector<std::set<int>> sets;
     std::vector<Guard> guards;
+    std::vector<int> loops;  ///< Choice nodes of all repetitions
+    std::vector<TailLoop> tailLoops;
+    std::vector<CallContext> contexts;
     int closer = -1;
     std::set<int> recoverFollow;
     std::vector<int> classOf;  ///< by token number

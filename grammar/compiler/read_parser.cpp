@@ -20,6 +20,11 @@ class ParserReader {
         while (in_.peek().kind != Item::Kind::End) readOne();
     }
 
+    struct Words {
+        std::string rule, token, loopRule, file;
+        int line;
+    };
+    std::vector<Words> declined;
     std::string start, recover, island, islandToken;
     int startLine = 0, recoverLine = 0, islandLine = 0;
 
@@ -50,6 +55,9 @@ class ParserReader {
         } else if (word == "recover") {
             recover = in_.expectName();
             recoverLine = line;
+        } else if (word == "declined") {
+            Words words{in_.expectName(), in_.expectName(), in_.expectName(), in_.file(), line};
+            declined.push_back(std::move(words));
         } else if (word == "island") {
             island = in_.expectName();
             islandToken = in_.next().text;
@@ -201,9 +209,11 @@ ParserGrammar readParser(const std::vector<std::string>& paths, const Vocabulary
         std::string name, token, file;
         int line = 0;
     } start, recover, island;
+    std::vector<ParserReader::Words> declined;
     for (const std::string& path : paths) {
         ParserReader reader(Cursor(path, scan(path, readFile(path))), vocabulary, grammar);
         reader.read();
+        declined.insert(declined.end(), reader.declined.begin(), reader.declined.end());
         if (!reader.start.empty()) start = {reader.start, "", path, reader.startLine};
         if (!reader.recover.empty()) recover = {reader.recover, "", path, reader.recoverLine};
         if (!reader.island.empty()) island = {reader.island, reader.islandToken, path, reader.islandLine};
@@ -217,6 +227,13 @@ ParserGrammar readParser(const std::vector<std::string>& paths, const Vocabulary
     if (start.name.empty()) throw GrammarError(paths.at(0), 1, "no 'start RULE;'");
     grammar.start = find(start, "start");
     if (!recover.name.empty()) grammar.recoverRule = find(recover, "recover");
+    for (const auto& d : declined) {
+        const auto number = vocabulary.numberOf.find(d.token);
+        if (number == vocabulary.numberOf.end())
+            throw GrammarError(d.file, d.line, "token " + d.token + " is not in the vocabulary");
+        grammar.declined.push_back({find({d.rule, "", d.file, d.line}, "declined"), number->second,
+                                    find({d.loopRule, "", d.file, d.line}, "declined")});
+    }
     if (!island.name.empty()) {
         grammar.islandRule = find(island, "island");
         const auto number = vocabulary.numberOf.find(island.token);

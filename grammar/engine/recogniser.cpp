@@ -59,17 +59,41 @@ std::uint32_t Recogniser::addState(std::uint16_t node, std::uint32_t low, std::u
     return static_cast<std::uint32_t>(states_.size()) - 1;
 }
 
-std::uint32_t Recogniser::entryFor(std::uint16_t rule, std::uint32_t position) {
+std::uint32_t Recogniser::entryFor(std::uint16_t rule, std::uint32_t position, std::uint16_t context) {
     for (std::uint32_t i = entriesAt_[position]; i != kNone; i = entries_[i].nextHere)
-        if (entries_[i].rule == rule) return i;
+        if (entries_[i].rule == rule && entries_[i].context == context) return i;
     Entry entry;
     entry.position = position;
     entry.rule = rule;
+    entry.context = context;
     entry.nextHere = entriesAt_[position];
     const auto made = static_cast<std::uint32_t>(entries_.size());
     entries_.push_back(entry);
     entriesAt_[position] = made;
     return made;
+}
+
+/// The context of what a call runs, from the context of the rule around it.
+std::uint16_t Recogniser::contextOf(std::uint16_t call, std::uint16_t outer) {
+    if (table_.loopCount == 0) return 0;
+    const std::size_t slot = static_cast<std::size_t>(outer) * table_.contextCount + call;
+    if (slot < contextCache_.size() && contextCache_[slot] != kNone16) return contextCache_[slot];
+    Context context;
+    for (std::uint32_t l = 0; l < table_.loopCount; ++l) {
+        const std::uint64_t* set = table_.classSets + table_.contextSets[call * table_.loopCount + l] * 4u;
+        for (std::size_t w = 0; w < 4; ++w) {
+            context.other[l][w] = set[w];
+            if (table_.contextCanEnd[call]) context.other[l][w] |= contexts_[outer].other[l][w];
+        }
+    }
+    const auto found = std::find(contexts_.begin(), contexts_.end(), context);
+    const auto id = static_cast<std::uint16_t>(found - contexts_.begin());
+    if (found == contexts_.end()) {
+        contexts_.push_back(context);
+        contextCache_.resize(contexts_.size() * table_.contextCount, kNone16);
+    }
+    contextCache_[slot] = id;
+    return id;
 }
 
 void Recogniser::pushFrame(Entry& entry, Frame frame) {
@@ -92,31 +116,36 @@ void Recogniser::popFrame(Entry& entry) {
 }
 
 bool Recogniser::enterOnce(std::uint32_t entryIndex, std::uint16_t node, std::uint32_t low,
-                           std::uint32_t high) {
+                           std::uint32_t high, std::uint8_t stopped) {
     Entry& entry = entries_[entryIndex];
-    for (std::uint32_t v = entry.visited; v != kNone; v = visits_[v].next)
-        if (visits_[v].node == node && visits_[v].low == low && visits_[v].high == high) return false;
-    if (entry.visitedCount >= kFewVisits) return enterInTable(entryIndex, node, low, high);
+    // A state is also done when an earlier one at the same node leaves at least as much open.
+    for (std::uint32_t at = entry.visited; at != kNone; at = visits_[at].next) {
+        const Visit& v = visits_[at];
+        if (v.node == node && v.low <= low && v.high >= high && (v.stopped & ~stopped) == 0) return false;
+    }
+    if (entry.visitedCount >= kFewVisits) return enterInTable(entryIndex, node, low, high, stopped);
     ++entry.visitedCount;
-    visits_.push_back({entry.visited, low, high, node});
+    visits_.push_back({entry.visited, low, high, node, stopped});
     entry.visited = static_cast<std::uint32_t>(visits_.size()) - 1;
     return true;
 }
 
-bool Recogniser::enterInTable(std::uint32_t entry, std::uint16_t node, std::uint32_t low,
-                              std::uint32_t high) {
+bool Recogniser::enterInTable(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high,
+                              std::uint8_t stopped) {
     if (visitTableUsed_ * 2 >= visitTable_.size()) growVisitTable();
     const std::size_t mask = visitTable_.size() - 1;
     for (std::size_t slot = visitHash(entry, node, low, high) & mask;; slot = (slot + 1) & mask) {
         const std::uint32_t at = visitTable_[slot];
         if (at == kNone) {
-            visits_.push_back({entry, low, high, node});
+            visits_.push_back({entry, low, high, node, stopped});
             visitTable_[slot] = static_cast<std::uint32_t>(visits_.size()) - 1;
             ++visitTableUsed_;
             return true;
         }
         const Visit& v = visits_[at];
-        if (v.next == entry && v.node == node && v.low == low && v.high == high) return false;
+        if (v.next == entry && v.node == node && v.low == low && v.high == high &&
+            (v.stopped & ~stopped) == 0)
+            return false;
     }
 }
 
@@ -133,16 +162,28 @@ void Recogniser::growVisitTable() {
     }
 }
 
-void Recogniser::addEnd(std::uint32_t entryIndex, std::uint32_t low, std::uint32_t high,
-                        std::uint32_t state) {
+/// Adds an end, unless nobody around the entry could go on from it.
+bool Recogniser::addEnd(std::uint32_t entryIndex, std::uint32_t low, std::uint32_t high, std::uint32_t state,
+                        std::uint8_t stopped) {
     Entry& entry = entries_[entryIndex];
+    if (stopped != 0 && (wholeText_ || low < floor_)) {
+        // Where a tail loop stopped early, only something else than that loop may take the next token.
+        for (std::uint32_t l = 0; l < table_.loopCount; ++l) {
+            if (!((stopped >> l) & 1)) continue;
+            const std::uint32_t cls = classes_[low];
+            if ((contexts_[entry.context].other[l][cls / 64] >> (cls % 64)) & 1) continue;
+            leftOut_ = std::max(leftOut_, low + 1);
+            return false;
+        }
+    }
     const auto made = static_cast<std::uint32_t>(ends_.size());
-    ends_.push_back({low, high, state, kNone});
+    ends_.push_back({low, high, state, stopped, kNone});
     if (entry.firstEnd == kNone)
         entry.firstEnd = made;
     else
         ends_[entry.lastEnd].next = made;
     entry.lastEnd = made;
+    return true;
 }
 
 /// A token that isn't the closer can only be taken where the run of closers is over, so an undecided position
@@ -193,27 +234,39 @@ bool Recogniser::guarded(const NodeRow& node, std::uint32_t position) {
     return candidate <= barrier || nextOpener_[position] <= barrier + 1;
 }
 
+/// What a branch does to the record of tail loops that stopped: leaving one although a round could start is
+/// noted.
+std::uint8_t Recogniser::afterBranch(const NodeRow& node, std::uint32_t branch, std::uint32_t low,
+                                     std::uint32_t high, std::uint8_t stopped) const {
+    if (node.context == kNone16 || branch == 0 || low != high) return stopped;
+    if (!inSet(node.guard, classes_[low])) return stopped;
+    return static_cast<std::uint8_t>(stopped | (1u << node.context));
+}
+
 /// Follows one path until it ends, fails, or comes to a call: the call is left as a frame for resume().
 bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32_t low, std::uint32_t high,
-                         std::uint32_t state) {
+                         std::uint32_t state, std::uint8_t stopped) {
     ++steps_;
     for (;;) {
         const NodeRow& node = table_.nodes[at];
-        if ((node.flags & kMerge) && !enterOnce(entryIndex, at, low, high)) return false;
+        if ((node.flags & kMerge) && !enterOnce(entryIndex, at, low, high, stopped)) return false;
         switch (node.op) {
             case Op::Token:
                 if (!settle(low, high) || low >= count_ || types_[low] != node.arg) return false;
                 high = ++low;
+                stopped = 0;
                 break;
             case Op::Set:
                 if (!settle(low, high) || low >= count_ || !inSet(node.arg, classes_[low])) return false;
                 high = ++low;
+                stopped = 0;
                 break;
             case Op::Hard: {
                 const std::uint32_t run = runEnd(low);
                 if (low == run) return false;
                 ++low;
                 high = std::min(high + 1, run);
+                stopped = 0;
                 break;
             }
             case Op::Soft:
@@ -223,18 +276,21 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                 high = runEnd(low);
                 break;
             case Op::Choice: {
+                const ChoiceRow& choice = table_.choices[node.arg];
                 std::uint32_t mask = viable(node, low, high);
                 // The part that recovery replaces starts with none of its tokens: look at every way to it.
                 if (recoversIn(entryIndex))
-                    mask =
-                        static_cast<std::uint32_t>((std::uint64_t{1} << table_.choices[node.arg].count) - 1);
+                    mask = static_cast<std::uint32_t>((std::uint64_t{1} << choice.count) - 1);
+                if (node.context != kNone16 && ((stopped >> node.context) & 1)) mask &= ~1u;
                 if (mask == 0) return false;
-                const std::uint16_t* targets = table_.targets + table_.choices[node.arg].firstTarget;
-                const std::uint16_t target = targets[std::countr_zero(mask)];
+                const auto branch = static_cast<std::uint32_t>(std::countr_zero(mask));
+                const std::uint16_t target = table_.targets[choice.firstTarget + branch];
                 mask &= mask - 1;
                 if (mask != 0)
-                    pushFrame(entries_[entryIndex], {kNone, low, high, state, kNone, kNone, mask, at});
+                    pushFrame(entries_[entryIndex],
+                              {kNone, low, high, state, kNone, kNone, mask, at, stopped});
                 state = addState(target, low, high, state, kNone, kNone);
+                stopped = afterBranch(node, branch, low, high, stopped);
                 at = isZeroWidth(table_.nodes[target].op) ? table_.nodes[target].run : target;
                 continue;
             }
@@ -246,17 +302,17 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                     (!rule.nullable || (node.flags & kNonEmpty)))
                     return false;
                 if (!recoverable && !guarded(node, low)) return false;
-                const std::uint32_t child = entryFor(node.arg, low);
+                const std::uint32_t child =
+                    entryFor(node.arg, low, contextOf(node.context, entries_[entryIndex].context));
                 if (recoverable) {
                     if (recoverAskedAt_ == kNone || low > recoverAskedAt_) recoverAskedAt_ = low;
                     entries_[child].mayRecover = low == recoverPlace_;
                 }
-                pushFrame(entries_[entryIndex], {kNone, low, high, state, child, kNone, 0, at});
+                pushFrame(entries_[entryIndex], {kNone, low, high, state, child, kNone, 0, at, stopped});
                 return false;
             }
             case Op::End:
-                addEnd(entryIndex, low, high, state);
-                return true;
+                return addEnd(entryIndex, low, high, state, stopped);
             case Op::Root:
             case Op::ScopeBegin:
             case Op::ScopeEnd:
@@ -275,7 +331,7 @@ Recogniser::Outcome Recogniser::resume(std::uint32_t entryIndex, std::uint32_t& 
         const std::uint32_t position = entry.position;
         const std::uint32_t state = addState(first, position, position, kNone, kNone, kNone);
         const NodeRow& node = table_.nodes[first];
-        if (forward(entryIndex, isZeroWidth(node.op) ? node.run : first, position, position, state))
+        if (forward(entryIndex, isZeroWidth(node.op) ? node.run : first, position, position, state, 0))
             return Outcome::Yielded;
     }
     for (;;) {
@@ -288,14 +344,15 @@ Recogniser::Outcome Recogniser::resume(std::uint32_t entryIndex, std::uint32_t& 
         Frame& frame = frames_[entry.frames];
         const NodeRow& node = table_.nodes[frame.node];
         if (frame.child == kNone) {
-            const std::uint16_t target =
-                table_.targets[table_.choices[node.arg].firstTarget + std::countr_zero(frame.mask)];
+            const auto branch = static_cast<std::uint32_t>(std::countr_zero(frame.mask));
+            const std::uint16_t target = table_.targets[table_.choices[node.arg].firstTarget + branch];
             frame.mask &= frame.mask - 1;
             const Frame taken = frame;
             if (taken.mask == 0) popFrame(entry);
             const std::uint32_t state = addState(target, taken.low, taken.high, taken.state, kNone, kNone);
             const NodeRow& next = table_.nodes[target];
-            if (forward(entryIndex, isZeroWidth(next.op) ? next.run : target, taken.low, taken.high, state))
+            if (forward(entryIndex, isZeroWidth(next.op) ? next.run : target, taken.low, taken.high, state,
+                        afterBranch(node, branch, taken.low, taken.high, taken.stopped)))
                 return Outcome::Yielded;
             continue;
         }
@@ -312,10 +369,12 @@ Recogniser::Outcome Recogniser::resume(std::uint32_t entryIndex, std::uint32_t& 
         frame.lastEnd = end;
         const End found = ends_[end];
         const std::uint32_t before = frame.state, from = frame.child;
-        if ((node.flags & kNonEmpty) && found.high == asked.position) continue;
+        const bool empty = found.high == asked.position;
+        if (empty && (node.flags & kNonEmpty)) continue;
+        const std::uint8_t stopped = empty ? frame.stopped : found.stopped;
         if (asked.done && found.next == kNone) popFrame(entry);
         const std::uint32_t state = addState(node.next, found.low, found.high, before, from, end);
-        if (forward(entryIndex, node.run, found.low, found.high, state)) return Outcome::Yielded;
+        if (forward(entryIndex, node.run, found.low, found.high, state, stopped)) return Outcome::Yielded;
     }
 }
 
@@ -331,8 +390,7 @@ bool Recogniser::recover(std::uint32_t entryIndex) {
         if (types_[at] == table_.rightParen && depth > 0) --depth;
     }
     entry.recovered = true;
-    addEnd(entryIndex, at, at, kNone);
-    return true;
+    return addEnd(entryIndex, at, at, kNone, 0);
 }
 
 void Recogniser::reset() {
@@ -351,15 +409,32 @@ void Recogniser::reset() {
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
     recovering_ = true;
     recoverStart_ = position;
-    run(rule, position);
+    search(rule, position);
     reset();
     recoverPlace_ = recoverAskedAt_;
-    return run(rule, position);
+    return search(rule, position);
 }
 
+/// First only what could read the whole text is looked at, which leaves much out; what was left out matters
+/// again when the whole text can't be read.
 Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
+    wholeText_ = true;
+    Result result = search(rule, position);
+    if (leftOut_ == 0 || result.overLimit || (result.found && leftOut_ <= result.high)) return result;
+    if (result.found && result.high == count_) return result;
+    const std::uint64_t spent = steps_;
+    reset();
+    steps_ = spent;
+    wholeText_ = false;
+    floor_ = result.found ? result.high : 0;
+    return search(rule, position);
+}
+
+Recogniser::Result Recogniser::search(std::uint16_t rule, std::uint32_t position) {
     Result result;
-    result.entry = entryFor(rule, position);
+    contexts_.assign(1, Context{});
+    contextCache_.assign(table_.contextCount, kNone16);
+    result.entry = entryFor(rule, position, 0);
     chain_.assign(1, result.entry);
     const std::uint64_t budget = options_.baseSteps + options_.stepsPerToken * count_;
     while (!chain_.empty()) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <cstdint>
 #include <vector>
 
@@ -21,8 +22,9 @@ class Recogniser {
     /// `low` to `high` can be the end, and who of the optional closers took which is settled afterwards.
     struct End {
         std::uint32_t low, high;
-        std::uint32_t state;  ///< last state of the path that leads here
-        std::uint32_t next;   ///< next end of the same entry
+        std::uint32_t state;   ///< last state of the path that leads here
+        std::uint8_t stopped;  ///< tail loops that stopped here although a round could start
+        std::uint32_t next;    ///< next end of the same entry
     };
 
     /// A point of a path that the walk back needs: a branch taken, or a call that came back.
@@ -77,6 +79,7 @@ class Recogniser {
         std::uint32_t visited = kNone;  ///< merge states entered, newest first
         std::uint32_t visitedCount = 0;
         std::uint16_t rule;
+        std::uint16_t context;
         bool started = false, done = false, mayRecover = false, recovered = false;
     };
 
@@ -88,27 +91,42 @@ class Recogniser {
         std::uint32_t lastEnd;  ///< call: the end taken last, kNone before the first
         std::uint32_t mask;     ///< choice: targets still to try
         std::uint16_t node;
+        std::uint8_t stopped;
     };
 
     struct Visit {
         std::uint32_t next;  ///< older visit of the entry, or the entry itself once it is in the shared table
         std::uint32_t low, high;
         std::uint16_t node;
+        std::uint8_t stopped;
+    };
+
+    /// What a caller's surroundings can take, by tail loop: entries of one rule at one place differ by it.
+    struct Context {
+        std::array<std::array<std::uint64_t, 4>, 8> other{};
+        bool operator==(const Context&) const = default;
     };
 
     enum class Outcome { Yielded, Exhausted, NeedsChild };
 
     void index();
-    std::uint32_t entryFor(std::uint16_t rule, std::uint32_t position);
+    std::uint32_t entryFor(std::uint16_t rule, std::uint32_t position, std::uint16_t context);
+    std::uint16_t contextOf(std::uint16_t call, std::uint16_t outer);
+    Result search(std::uint16_t rule, std::uint32_t position);
     void pushFrame(Entry& entry, Frame frame);
     void popFrame(Entry& entry);
-    bool enterInTable(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high);
+    bool enterInTable(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high,
+                      std::uint8_t stopped);
     void growVisitTable();
     Outcome resume(std::uint32_t entry, std::uint32_t& child);
     bool forward(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high,
-                 std::uint32_t state);
-    bool enterOnce(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high);
-    void addEnd(std::uint32_t entry, std::uint32_t low, std::uint32_t high, std::uint32_t state);
+                 std::uint32_t state, std::uint8_t stopped);
+    std::uint8_t afterBranch(const NodeRow& node, std::uint32_t branch, std::uint32_t low, std::uint32_t high,
+                             std::uint8_t stopped) const;
+    bool enterOnce(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high,
+                   std::uint8_t stopped);
+    bool addEnd(std::uint32_t entry, std::uint32_t low, std::uint32_t high, std::uint32_t state,
+                std::uint8_t stopped);
     bool recover(std::uint32_t entry);
     bool recoversIn(std::uint32_t entry) const {
         return recovering_ && entries_[entry].position == recoverStart_;
@@ -147,6 +165,12 @@ class Recogniser {
     std::uint32_t visitTableUsed_ = 0;
     std::vector<std::uint32_t> chain_;
     std::uint64_t steps_ = 0;
+    bool wholeText_ = false;  ///< only readings of the whole text count
+    std::uint32_t leftOut_ =
+        0;  ///< one past the furthest end left out since only a shorter reading could use it
+    std::uint32_t floor_ = 0;  ///< a reading up to here is known: shorter ones don't count
+    std::vector<Context> contexts_;
+    std::vector<std::uint16_t> contextCache_;  ///< by context and call context
     bool recovering_ = false;
     std::uint32_t recoverStart_ = 0;        ///< where the statement starts
     std::uint32_t recoverPlace_ = kNone;    ///< the one place where the recover rule may stand for anything

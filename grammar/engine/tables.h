@@ -7,7 +7,7 @@
 /// engine never runs tables of another layout.
 namespace zr::engine {
 
-constexpr std::uint32_t kTableVersion = 1;
+constexpr std::uint32_t kTableVersion = 2;
 
 constexpr std::uint16_t kNone16 = 0xFFFF;
 
@@ -74,12 +74,14 @@ enum class Mark : std::uint8_t { None, Drop, Root };
 struct NodeRow {
     Op op;
     Mark mark;
-    std::uint8_t flags;      ///< NodeFlags
-    std::uint16_t arg;       ///< token number, set, rule, choice
-    std::uint16_t next;      ///< next node of the path
-    std::uint16_t run;       ///< next node that the recogniser stops at
-    std::uint16_t guard;     ///< Call: guard or kNone16
+    std::uint8_t flags;  ///< NodeFlags
+    std::uint16_t arg;   ///< token number, set, rule, choice
+    std::uint16_t next;  ///< next node of the path
+    std::uint16_t run;   ///< next node that the recogniser stops at
+    std::uint16_t
+        guard;  ///< Call: guard or kNone16; Choice of a tail loop: class set that a round starts with
     std::uint16_t required;  ///< Call: a token number that must still come, 0 for none
+    std::uint16_t context;   ///< Call: context; Choice: tail loop; or kNone16
 };
 
 enum NodeFlags : std::uint8_t {
@@ -127,6 +129,12 @@ struct ParserTable {
     std::uint16_t recoverRule;            ///< rule or kNone16
     std::uint16_t leftParen, rightParen;  ///< token numbers for "the same parenthesis depth", 0 for none
     std::uint8_t keepTail;
+    std::uint32_t loopCount;  ///< tail loops, at most 8
+    // By call context: for each tail loop the class set of what something else than the loop can take there;
+    // and whether the rule around the call can end behind it.
+    const std::uint16_t* contextSets;
+    const bool* contextCanEnd;
+    std::uint32_t contextCount;
 };
 
 struct GrammarTable {
