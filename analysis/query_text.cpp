@@ -107,7 +107,8 @@ void ResolveKnownSources(CZRQueryInfo* query) {
     while (!open.empty()) {
         CZRQueryInfo* const at = open.back();
         open.pop_back();
-        for (CZRQueryInfo* nested : at->m_subQueries) open.push_back(nested);
+        for (CZRQueryInfo* nested : at->m_subQueries)
+            if (nested) open.push_back(nested);
         for (auto& entry : at->m_sourceTables) {
             const CZRSourceInfo* const source = at->m_database ? at->FindSource(entry.key) : nullptr;
             entry.value = source ? source->GetID() : CString();
