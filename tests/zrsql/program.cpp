@@ -79,16 +79,17 @@ ProgramResult run(const std::vector<std::string>& words, const std::string& inpu
 }  // namespace
 
 ProgramResult runZrsql(const std::vector<std::string>& arguments, const std::string& input) {
-    std::vector<std::string> words = {ZR_ZRSQL};
+    std::vector<std::string> words = {ZR_BIN_DIR "/zrsql"};
     words.insert(words.end(), arguments.begin(), arguments.end());
     return run(words, input);
 }
 
 ProgramResult runShell(const std::string& line) {
-    static const std::string name = "build/release/bin/zrsql";
+    static const std::string folder = "build/release/bin/";
+    static const std::string underTest = ZR_BIN_DIR "/";
     std::string command = line;
-    for (std::size_t at = 0; (at = command.find(name, at)) != std::string::npos; at += sizeof ZR_ZRSQL - 1)
-        command.replace(at, name.size(), ZR_ZRSQL);
+    for (std::size_t at = 0; (at = command.find(folder, at)) != std::string::npos; at += underTest.size())
+        command.replace(at, folder.size(), underTest);
     return run({"/bin/sh", "-c", command}, {});
 }
 

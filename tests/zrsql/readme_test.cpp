@@ -39,6 +39,21 @@ TEST_P(Document, ShowsWhatItsCommandsWrite) {
 
 INSTANTIATE_TEST_SUITE_P(Files, Document, testing::Values("README.md", "docs/zrsql.md"));
 
+TEST(Readme, ShowsTheExampleThatIsBuilt) {
+    const std::string readme = readFile(ZR_SOURCE_DIR "/README.md");
+    const std::string example = readFile(ZR_SOURCE_DIR "/examples/embed/columns.cpp");
+    EXPECT_NE(readme.find("```cpp\n" + example + "```\n"), std::string::npos);
+}
+
+TEST(Readme, ShowsTheLinesOfTheProjectThatTakesTheLibraryIn) {
+    const std::string readme = readFile(ZR_SOURCE_DIR "/README.md");
+    const std::string project = readFile(ZR_SOURCE_DIR "/tests/zrsql/embed_as_folder/CMakeLists.txt");
+    EXPECT_NE(readme.find("target_link_libraries(host PRIVATE ZRParserSQL::zrparsersql)\n"),
+              std::string::npos);
+    EXPECT_NE(project.find("target_link_libraries(host PRIVATE ZRParserSQL::zrparsersql)\n"),
+              std::string::npos);
+}
+
 TEST(Examples, AreAllAnalysed) {
     const auto result = runShell(
         "for file in examples/*/*.sql; do"

@@ -53,8 +53,10 @@ Form operatorForm(const SelectItem& item, std::size_t operands) {
     if (isNamed(item, {u"JOIN"})) return {{}, spaced, u" ", {}};
     if (isNamed(item, {u"BETWEEN"})) return {{}, spaced, u" AND ", {}};
     if (operands == 1) return {name + u" ", {}, {}, {}};
-    if (operands == 2) return {{}, spaced, {}, {}};
-    return {{}, spaced + u"(", u", ", u")"};
+    // A list of values, unless a nested query stands there, which comes with parentheses of its own.
+    if (operands > 2 || (isNamed(item, {u"IN"}) && !classOf(*item.m_items.GetTail()).query))
+        return {{}, spaced + u"(", u", ", u")"};
+    return {{}, spaced, {}, {}};
 }
 
 Form formOf(const SelectItem& item, std::size_t operands) {
