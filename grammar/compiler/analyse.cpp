@@ -309,6 +309,42 @@ std::vector<int> nodesOf(const Program& p, int rule) {
     return nodes;
 }
 
+/// By node: whether the next token can be a closer that isn't one of the optional ones.
+std::vector<bool> mandatoryCloserNext(const Program& p, const Facts& facts) {
+    std::vector<bool> next(p.nodes.size(), false);
+    for (bool changed = true; changed;) {
+        changed = false;
+        for (std::size_t i = p.nodes.size(); i-- > 0;) {
+            const Node& n = p.nodes[i];
+            bool now = false;
+            switch (n.op) {
+                case Op::Token:
+                    now = n.arg == p.closer;
+                    break;
+                case Op::Set:
+                    now = p.sets[index(n.arg)].count(p.closer) != 0;
+                    break;
+                case Op::Call:
+                    now = facts.first[index(n.arg)].count(p.closer) != 0 ||
+                          (facts.nullable[index(n.arg)] && next[index(n.next)]);
+                    break;
+                case Op::Choice:
+                    for (int t : n.targets) now = now || next[index(t)];
+                    break;
+                case Op::End:
+                    break;
+                default:
+                    now = next[index(n.next)];
+            }
+            if (now && !next[i]) {
+                next[i] = true;
+                changed = true;
+            }
+        }
+    }
+    return next;
+}
+
 constexpr std::size_t kMaxTailLoops = 4;
 
 void findTailLoops(Program& p, const ParserGrammar& grammar, const Facts& facts) {
@@ -343,11 +379,12 @@ void findTailLoops(Program& p, const ParserGrammar& grammar, const Facts& facts)
             throw GrammarError(rule.file, rule.line,
                                "nothing of rule " + rule.name + " can be declined as said");
     }
+    const std::vector<bool> closing = mandatoryCloserNext(p, facts);
     std::vector<std::vector<std::set<int>>> without;
     for (const TailLoop& loop : p.tailLoops) without.push_back(firstWithout(p, facts, loop.node));
     for (Node& n : p.nodes) {
         if (n.op != Op::Call) continue;
-        CallContext context{{}, p.nodes[index(n.run)].canEnd};
+        CallContext context{{}, p.nodes[index(n.run)].canEnd, closing[index(n.run)]};
         for (std::size_t l = 0; l < p.tailLoops.size(); ++l) {
             std::set<int> other;
             for (int token : without[l][index(n.run)])

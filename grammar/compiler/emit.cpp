@@ -297,7 +297,8 @@ class Emitter {
         array(o, "GuardRow", "guards", guards,
               [&](const auto& g) { o << "{" << g[0] << ", " << g[1] << ", " << g[2] << "}"; });
         array(o, "std::uint16_t", "contextSets", contextSets, [&](int s) { o << s; });
-        array(o, "bool", "contextCanEnd", program_.contexts, [&](const CallContext& c) { o << c.canEnd; });
+        array(o, "std::uint8_t", "contextFlags", program_.contexts,
+              [&](const CallContext& c) { o << c.canEnd + 2 * c.closing; });
         const auto number = [&](const char* name) {
             const auto found = vocabulary_.numberOf.find(name);
             return found == vocabulary_.numberOf.end() ? 0 : found->second;
@@ -310,7 +311,7 @@ class Emitter {
           << ", guards, " << guards.size() << ", " << std::max(program_.closer, 0) << ", " << parser_.start
           << ", " << parser_.statement << ", " << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule)
           << ", " << left << ", " << right << ", " << parser_.keepTail << ", " << program_.tailLoops.size()
-          << ", contextSets, contextCanEnd, " << program_.contexts.size() << "};\n\n";
+          << ", contextSets, contextFlags, " << program_.contexts.size() << "};\n\n";
     }
 
     void contexts(std::ostream& o) const {

@@ -76,7 +76,12 @@ struct Alternative;
 
 struct Element {
     enum class Kind { Tokens, Rule, Group };
-    explicit Element(Kind k) : kind(k) {}
+    explicit Element(Kind k);
+    Element(const Element&);
+    Element(Element&&) noexcept;
+    Element& operator=(const Element&);
+    Element& operator=(Element&&) noexcept;
+    ~Element();
     Kind kind;
     Mark mark = Mark::None;
     Repeat repeat = Repeat::Once;
@@ -93,6 +98,14 @@ struct Alternative {
     int root = -1;  ///< token number of the imaginary root of a tree clause, or -1
     int line = 0;
 };
+
+// Element holds alternatives and these hold elements: what needs both complete stands behind both.
+inline Element::Element(Kind k) : kind(k) {}
+inline Element::Element(const Element&) = default;
+inline Element::Element(Element&&) noexcept = default;
+inline Element& Element::operator=(const Element&) = default;
+inline Element& Element::operator=(Element&&) noexcept = default;
+inline Element::~Element() = default;
 
 struct Rule {
     std::string name, file;

@@ -62,7 +62,8 @@ struct TailLoop {
 /// By tail loop: what something other than that loop can take right behind a Call.
 struct CallContext {
     std::vector<std::set<int>> other;
-    bool canEnd;
+    bool canEnd;   ///< the rule around the call can end behind it
+    bool closing;  ///< a closer that must stand can come behind it
     bool operator==(const CallContext&) const = default;
 };
 

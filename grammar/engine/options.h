@@ -12,8 +12,8 @@ struct Options {
     std::uint32_t maxDepth = 200000;
     /// Search steps for a text that can't be read to its end: a fixed part and a part for each token. Text
     /// that is read to its end never comes near it.
-    std::uint64_t baseSteps = 400000;
-    std::uint64_t stepsPerToken = 1500;
+    std::uint64_t baseSteps = 200000;
+    std::uint64_t stepsPerToken = 600;
     /// Tokens of one text.
     std::uint32_t maxTokens = 20000000;
 };

@@ -25,28 +25,29 @@ bool isZeroWidth(Op op) {
 
 Recogniser::Recogniser(const ParserTable& table, const std::vector<std::uint16_t>& types,
                        const Options& options)
-    : table_(table), options_(options), types_(types), count_(static_cast<std::uint32_t>(types.size())) {
+    : table_(&table), options_(&options), types_(&types), count_(static_cast<std::uint32_t>(types.size())) {
     index();
 }
 
 /// One pass over the tokens for everything that later questions need in constant time.
 void Recogniser::index() {
     classes_.resize(count_ + 1);
-    lastOf_.assign(table_.maxToken + 1, 0);
+    lastOf_.assign(table_->maxToken + 1, 0);
     bool closers = false;
     for (std::uint32_t i = 0; i < count_; ++i) {
-        classes_[i] = table_.classOf[types_[i]];
-        lastOf_[types_[i]] = i + 1;
-        closers = closers || (table_.closer != 0 && types_[i] == table_.closer);
+        classes_[i] = table_->classOf[(*types_)[i]];
+        lastOf_[(*types_)[i]] = i + 1;
+        closers = closers || (table_->closer != 0 && (*types_)[i] == table_->closer);
     }
-    classes_[count_] = table_.classOf[0];
+    classes_[count_] = table_->classOf[0];
     if (closers) {
         runEnd_.resize(count_ + 1);
         runEnd_[count_] = count_;
-        for (std::uint32_t i = count_; i-- > 0;) runEnd_[i] = types_[i] == table_.closer ? runEnd_[i + 1] : i;
+        for (std::uint32_t i = count_; i-- > 0;)
+            runEnd_[i] = (*types_)[i] == table_->closer ? runEnd_[i + 1] : i;
     }
-    candidates_.resize(table_.guardCount);
-    barriers_.resize(table_.guardCount);
+    candidates_.resize(table_->guardCount);
+    barriers_.resize(table_->guardCount);
     entriesAt_.assign(count_ + 1, kNone);
     entries_.reserve(count_ * 4 + 16);
     states_.reserve(count_ * 16 + 64);
@@ -75,22 +76,24 @@ std::uint32_t Recogniser::entryFor(std::uint16_t rule, std::uint32_t position, s
 
 /// The context of what a call runs, from the context of the rule around it.
 std::uint16_t Recogniser::contextOf(std::uint16_t call, std::uint16_t outer) {
-    if (table_.loopCount == 0) return 0;
-    const std::size_t slot = static_cast<std::size_t>(outer) * table_.contextCount + call;
+    if (table_->loopCount == 0) return 0;
+    const std::size_t slot = static_cast<std::size_t>(outer) * table_->contextCount + call;
     if (slot < contextCache_.size() && contextCache_[slot] != kNone16) return contextCache_[slot];
     Context context;
-    for (std::uint32_t l = 0; l < table_.loopCount; ++l) {
-        const std::uint64_t* set = table_.classSets + table_.contextSets[call * table_.loopCount + l] * 4u;
+    for (std::uint32_t l = 0; l < table_->loopCount; ++l) {
+        const std::uint64_t* set = table_->classSets + table_->contextSets[call * table_->loopCount + l] * 4u;
         for (std::size_t w = 0; w < 4; ++w) {
             context.other[l][w] = set[w];
-            if (table_.contextCanEnd[call]) context.other[l][w] |= contexts_[outer].other[l][w];
+            if (table_->contextFlags[call] & 1) context.other[l][w] |= contexts_[outer].other[l][w];
         }
     }
+    context.closing =
+        (table_->contextFlags[call] & 2) || ((table_->contextFlags[call] & 1) && contexts_[outer].closing);
     const auto found = std::find(contexts_.begin(), contexts_.end(), context);
     const auto id = static_cast<std::uint16_t>(found - contexts_.begin());
     if (found == contexts_.end()) {
         contexts_.push_back(context);
-        contextCache_.resize(contexts_.size() * table_.contextCount, kNone16);
+        contextCache_.resize(contexts_.size() * table_->contextCount, kNone16);
     }
     contextCache_[slot] = id;
     return id;
@@ -166,13 +169,13 @@ void Recogniser::growVisitTable() {
 bool Recogniser::addEnd(std::uint32_t entryIndex, std::uint32_t low, std::uint32_t high, std::uint32_t state,
                         std::uint8_t stopped) {
     Entry& entry = entries_[entryIndex];
-    if (stopped != 0 && (wholeText_ || low < floor_)) {
+    if (stopped != 0 && (wholeText_ || high < floor_) && (low == high || !contexts_[entry.context].closing)) {
         // Where a tail loop stopped early, only something else than that loop may take the next token.
-        for (std::uint32_t l = 0; l < table_.loopCount; ++l) {
+        for (std::uint32_t l = 0; l < table_->loopCount; ++l) {
             if (!((stopped >> l) & 1)) continue;
-            const std::uint32_t cls = classes_[low];
+            const std::uint32_t cls = classes_[high];
             if ((contexts_[entry.context].other[l][cls / 64] >> (cls % 64)) & 1) continue;
-            leftOut_ = std::max(leftOut_, low + 1);
+            leftOut_ = std::max(leftOut_, high + 1);
             return false;
         }
     }
@@ -183,6 +186,7 @@ bool Recogniser::addEnd(std::uint32_t entryIndex, std::uint32_t low, std::uint32
     else
         ends_[entry.lastEnd].next = made;
     entry.lastEnd = made;
+    if (entry.endCount < 0xFF) ++entry.endCount;
     return true;
 }
 
@@ -196,9 +200,9 @@ bool Recogniser::settle(std::uint32_t& low, std::uint32_t& high) const {
 }
 
 std::uint32_t Recogniser::viable(const NodeRow& node, std::uint32_t low, std::uint32_t high) const {
-    const std::uint32_t* masks = table_.choiceMask + static_cast<std::size_t>(node.arg) * table_.classes;
+    const std::uint32_t* masks = table_->choiceMask + static_cast<std::size_t>(node.arg) * table_->classes;
     if (low == high) return masks[classes_[low]];
-    std::uint32_t mask = masks[table_.classOf[table_.closer]];
+    std::uint32_t mask = masks[table_->classOf[table_->closer]];
     if (high == runEnd(low)) mask |= masks[classes_[high]];
     return mask;
 }
@@ -208,7 +212,7 @@ std::uint32_t Recogniser::viable(const NodeRow& node, std::uint32_t low, std::ui
 bool Recogniser::guarded(const NodeRow& node, std::uint32_t position) {
     if (node.required != 0 && lastOf_[node.required] <= position) return false;
     if (node.guard == kNone16 || position >= count_) return true;
-    const GuardRow& guard = table_.guards[node.guard];
+    const GuardRow& guard = table_->guards[node.guard];
     std::vector<std::uint32_t>& candidates = candidates_[node.guard];
     std::vector<std::uint32_t>& barriers = barriers_[node.guard];
     if (candidates.empty()) {
@@ -228,7 +232,7 @@ bool Recogniser::guarded(const NodeRow& node, std::uint32_t position) {
         nextOpener_.resize(count_ + 1);
         nextOpener_[count_] = count_ + 2;
         for (std::uint32_t i = count_; i-- > 0;)
-            nextOpener_[i] = inSet(table_.openerSet, classes_[i]) ? i : nextOpener_[i + 1];
+            nextOpener_[i] = inSet(table_->openerSet, classes_[i]) ? i : nextOpener_[i + 1];
     }
     const std::uint32_t barrier = barriers[position];
     return candidate <= barrier || nextOpener_[position] <= barrier + 1;
@@ -238,8 +242,8 @@ bool Recogniser::guarded(const NodeRow& node, std::uint32_t position) {
 /// noted.
 std::uint8_t Recogniser::afterBranch(const NodeRow& node, std::uint32_t branch, std::uint32_t low,
                                      std::uint32_t high, std::uint8_t stopped) const {
-    if (node.context == kNone16 || branch == 0 || low != high) return stopped;
-    if (!inSet(node.guard, classes_[low])) return stopped;
+    if (node.context == kNone16 || branch == 0 || high != runEnd(low)) return stopped;
+    if (!inSet(node.guard, classes_[high])) return stopped;
     return static_cast<std::uint8_t>(stopped | (1u << node.context));
 }
 
@@ -248,11 +252,11 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                          std::uint32_t state, std::uint8_t stopped) {
     ++steps_;
     for (;;) {
-        const NodeRow& node = table_.nodes[at];
+        const NodeRow& node = table_->nodes[at];
         if ((node.flags & kMerge) && !enterOnce(entryIndex, at, low, high, stopped)) return false;
         switch (node.op) {
             case Op::Token:
-                if (!settle(low, high) || low >= count_ || types_[low] != node.arg) return false;
+                if (!settle(low, high) || low >= count_ || (*types_)[low] != node.arg) return false;
                 high = ++low;
                 stopped = 0;
                 break;
@@ -276,7 +280,7 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                 high = runEnd(low);
                 break;
             case Op::Choice: {
-                const ChoiceRow& choice = table_.choices[node.arg];
+                const ChoiceRow& choice = table_->choices[node.arg];
                 std::uint32_t mask = viable(node, low, high);
                 // The part that recovery replaces starts with none of its tokens: look at every way to it.
                 if (recoversIn(entryIndex))
@@ -284,21 +288,21 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                 if (node.context != kNone16 && ((stopped >> node.context) & 1)) mask &= ~1u;
                 if (mask == 0) return false;
                 const auto branch = static_cast<std::uint32_t>(std::countr_zero(mask));
-                const std::uint16_t target = table_.targets[choice.firstTarget + branch];
+                const std::uint16_t target = table_->targets[choice.firstTarget + branch];
                 mask &= mask - 1;
                 if (mask != 0)
                     pushFrame(entries_[entryIndex],
                               {kNone, low, high, state, kNone, kNone, mask, at, stopped});
                 state = addState(target, low, high, state, kNone, kNone);
                 stopped = afterBranch(node, branch, low, high, stopped);
-                at = isZeroWidth(table_.nodes[target].op) ? table_.nodes[target].run : target;
+                at = isZeroWidth(table_->nodes[target].op) ? table_->nodes[target].run : target;
                 continue;
             }
             case Op::Call: {
                 if (!settle(low, high)) return false;
-                const RuleRow& rule = table_.rules[node.arg];
-                const bool recoverable = node.arg == table_.recoverRule && recoversIn(entryIndex);
-                if (!recoverable && !inSet(table_.firstSetBase + node.arg, classes_[low]) &&
+                const RuleRow& rule = table_->rules[node.arg];
+                const bool recoverable = node.arg == table_->recoverRule && recoversIn(entryIndex);
+                if (!recoverable && !inSet(table_->firstSetBase + node.arg, classes_[low]) &&
                     (!rule.nullable || (node.flags & kNonEmpty)))
                     return false;
                 if (!recoverable && !guarded(node, low)) return false;
@@ -327,30 +331,31 @@ Recogniser::Outcome Recogniser::resume(std::uint32_t entryIndex, std::uint32_t& 
     if (!entries_[entryIndex].started) {
         Entry& entry = entries_[entryIndex];
         entry.started = true;
-        const std::uint16_t first = table_.rules[entry.rule].entry;
+        const std::uint16_t first = table_->rules[entry.rule].entry;
         const std::uint32_t position = entry.position;
         const std::uint32_t state = addState(first, position, position, kNone, kNone, kNone);
-        const NodeRow& node = table_.nodes[first];
+        const NodeRow& node = table_->nodes[first];
         if (forward(entryIndex, isZeroWidth(node.op) ? node.run : first, position, position, state, 0))
             return Outcome::Yielded;
     }
     for (;;) {
         Entry& entry = entries_[entryIndex];
+        while (endsEach_ != 0 && entry.endCount >= endsEach_ && entry.frames != kNone) popFrame(entry);
         if (entry.frames == kNone) {
             if (entry.done) return Outcome::Exhausted;
             entry.done = true;
             return recover(entryIndex) ? Outcome::Yielded : Outcome::Exhausted;
         }
         Frame& frame = frames_[entry.frames];
-        const NodeRow& node = table_.nodes[frame.node];
+        const NodeRow& node = table_->nodes[frame.node];
         if (frame.child == kNone) {
             const auto branch = static_cast<std::uint32_t>(std::countr_zero(frame.mask));
-            const std::uint16_t target = table_.targets[table_.choices[node.arg].firstTarget + branch];
+            const std::uint16_t target = table_->targets[table_->choices[node.arg].firstTarget + branch];
             frame.mask &= frame.mask - 1;
             const Frame taken = frame;
             if (taken.mask == 0) popFrame(entry);
             const std::uint32_t state = addState(target, taken.low, taken.high, taken.state, kNone, kNone);
-            const NodeRow& next = table_.nodes[target];
+            const NodeRow& next = table_->nodes[target];
             if (forward(entryIndex, isZeroWidth(next.op) ? next.run : target, taken.low, taken.high, state,
                         afterBranch(node, branch, taken.low, taken.high, taken.stopped)))
                 return Outcome::Yielded;
@@ -385,9 +390,9 @@ bool Recogniser::recover(std::uint32_t entryIndex) {
     if (!entry.mayRecover || entry.firstEnd != kNone) return false;
     std::uint32_t at = entry.position, depth = 0;
     for (; at < count_; ++at) {
-        if (depth == 0 && inSet(table_.recoverFollowSet, classes_[at])) break;
-        if (types_[at] == table_.leftParen) ++depth;
-        if (types_[at] == table_.rightParen && depth > 0) --depth;
+        if (depth == 0 && inSet(table_->recoverFollowSet, classes_[at])) break;
+        if ((*types_)[at] == table_->leftParen) ++depth;
+        if ((*types_)[at] == table_->rightParen && depth > 0) --depth;
     }
     entry.recovered = true;
     return addEnd(entryIndex, at, at, kNone, 0);
@@ -415,9 +420,24 @@ Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t positio
     return search(rule, position);
 }
 
+/// Past the budget a search with few ends for each entry, which is linear, may still come further.
+Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
+    constexpr std::uint8_t kFewEnds = 4;
+    const Result result = exact(rule, position);
+    if (!result.overBudget || (result.found && result.high == count_)) return result;
+    Recogniser narrow(*table_, *types_, *options_);
+    narrow.endsEach_ = kFewEnds;
+    narrow.wholeText_ = true;
+    Result other = narrow.search(rule, position);
+    if (!other.found || (result.found && other.high <= result.high)) return result;
+    other.overBudget = true;
+    *this = std::move(narrow);
+    return other;
+}
+
 /// First only what could read the whole text is looked at, which leaves much out; what was left out matters
 /// again when the whole text can't be read.
-Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
+Recogniser::Result Recogniser::exact(std::uint16_t rule, std::uint32_t position) {
     wholeText_ = true;
     Result result = search(rule, position);
     if (leftOut_ == 0 || result.overLimit || (result.found && leftOut_ <= result.high)) return result;
@@ -433,15 +453,15 @@ Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
 Recogniser::Result Recogniser::search(std::uint16_t rule, std::uint32_t position) {
     Result result;
     contexts_.assign(1, Context{});
-    contextCache_.assign(table_.contextCount, kNone16);
+    contextCache_.assign(table_->contextCount, kNone16);
     result.entry = entryFor(rule, position, 0);
     chain_.assign(1, result.entry);
-    const std::uint64_t budget = options_.baseSteps + options_.stepsPerToken * count_;
+    const std::uint64_t budget = options_->baseSteps + options_->stepsPerToken * count_;
     while (!chain_.empty()) {
         std::uint32_t child = kNone;
         const Outcome outcome = resume(chain_.back(), child);
         if (outcome == Outcome::NeedsChild) {
-            if (chain_.size() >= options_.maxDepth) {
+            if (chain_.size() >= options_->maxDepth) {
                 result.overLimit = true;
                 result.found = false;
                 return result;

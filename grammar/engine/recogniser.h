@@ -80,6 +80,7 @@ class Recogniser {
         std::uint32_t visitedCount = 0;
         std::uint16_t rule;
         std::uint16_t context;
+        std::uint8_t endCount = 0;
         bool started = false, done = false, mayRecover = false, recovered = false;
     };
 
@@ -104,6 +105,7 @@ class Recogniser {
     /// What a caller's surroundings can take, by tail loop: entries of one rule at one place differ by it.
     struct Context {
         std::array<std::array<std::uint64_t, 4>, 8> other{};
+        bool closing = false;  ///< a closer that must stand may come next
         bool operator==(const Context&) const = default;
     };
 
@@ -112,6 +114,7 @@ class Recogniser {
     void index();
     std::uint32_t entryFor(std::uint16_t rule, std::uint32_t position, std::uint16_t context);
     std::uint16_t contextOf(std::uint16_t call, std::uint16_t outer);
+    Result exact(std::uint16_t rule, std::uint32_t position);
     Result search(std::uint16_t rule, std::uint32_t position);
     void pushFrame(Entry& entry, Frame frame);
     void popFrame(Entry& entry);
@@ -141,12 +144,12 @@ class Recogniser {
         return runEnd_.empty() ? position : runEnd_[position];
     }
     bool inSet(std::uint32_t set, std::uint32_t cls) const {
-        return (table_.classSets[set * 4 + cls / 64] >> (cls % 64)) & 1;
+        return (table_->classSets[set * 4 + cls / 64] >> (cls % 64)) & 1;
     }
 
-    const ParserTable& table_;
-    const Options& options_;
-    const std::vector<std::uint16_t>& types_;
+    const ParserTable* table_;
+    const Options* options_;
+    const std::vector<std::uint16_t>* types_;
     std::uint32_t count_;
     std::vector<std::uint8_t> classes_;  ///< by position, the last one for the end of the text
     std::vector<std::uint32_t> runEnd_;  ///< by position: where the run of closers from here ends
@@ -168,7 +171,8 @@ class Recogniser {
     bool wholeText_ = false;  ///< only readings of the whole text count
     std::uint32_t leftOut_ =
         0;  ///< one past the furthest end left out since only a shorter reading could use it
-    std::uint32_t floor_ = 0;  ///< a reading up to here is known: shorter ones don't count
+    std::uint8_t endsEach_ = 0;  ///< ends that an entry may have, 0 for any number
+    std::uint32_t floor_ = 0;    ///< a reading up to here is known: shorter ones don't count
     std::vector<Context> contexts_;
     std::vector<std::uint16_t> contextCache_;  ///< by context and call context
     bool recovering_ = false;

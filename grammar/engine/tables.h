@@ -131,9 +131,9 @@ struct ParserTable {
     std::uint8_t keepTail;
     std::uint32_t loopCount;  ///< tail loops, at most 8
     // By call context: for each tail loop the class set of what something else than the loop can take there;
-    // and whether the rule around the call can end behind it.
+    // and whether the rule around the call can end behind it (1) and a closer that must stand can come (2).
     const std::uint16_t* contextSets;
-    const bool* contextCanEnd;
+    const std::uint8_t* contextFlags;
     std::uint32_t contextCount;
 };
 
