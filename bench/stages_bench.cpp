@@ -1,0 +1,132 @@
+/// Microseconds a query and nanoseconds a token by stage: lex, lex + recognise + tree, and BuildQueryInfo
+/// whole; and how the time of each shape of text grows when the text doubles.
+
+#include <benchmark/benchmark.h>
+#include <time.h>
+#include <zrparsersql/analysis.h>
+#include <zrparsersql/database_info.h>
+#include <zrparsersql/input_stream.h>
+#include <zrparsersql/query_info.h>
+#include <zrparsersql/recognizers/MSSQL.h>
+
+#include <algorithm>
+#include <cstdio>
+#include <string>
+
+#include "bench/queries.h"
+
+namespace {
+
+std::u16string wide(const std::string& text) {
+    return {text.begin(), text.end()};
+}
+
+struct Pipeline {
+    pANTLR3_INPUT_STREAM input;
+    pMSSQLLexer lexer;
+    pANTLR3_COMMON_TOKEN_STREAM tokens;
+
+    explicit Pipeline(const std::u16string& text)
+        : input(zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size()))),
+          lexer(MSSQLLexerNew(input)),
+          tokens(antlr3CommonTokenStreamSourceNew(1025, lexer->pLexer->rec->state->tokSource)) {}
+    Pipeline(const Pipeline&) = delete;
+    Pipeline& operator=(const Pipeline&) = delete;
+    ~Pipeline() {
+        tokens->free(tokens);
+        lexer->free(lexer);
+        input->close(input);
+    }
+    std::size_t lex() {
+        tokens->tstream->_LT(tokens->tstream, 1);
+        return tokens->tokens->count;
+    }
+};
+
+std::size_t lexOnly(const std::u16string& text) {
+    return Pipeline(text).lex();
+}
+
+std::size_t parse(const std::u16string& text) {
+    Pipeline pipeline(text);
+    const pMSSQLParser parser = MSSQLParserNew(pipeline.tokens);
+    benchmark::DoNotOptimize(parser->start_rule(parser).tree);
+    const std::size_t count = pipeline.tokens->tokens->count;
+    parser->free(parser);
+    return count;
+}
+
+std::size_t analyse(const std::u16string& text) {
+    CZRQueryInfo query;
+    query.SetSQL(CString(text.data(), static_cast<int>(text.size())));
+    BuildQueryInfo(&query, static_cast<DBTypes>(8));
+    benchmark::DoNotOptimize(query.m_selectItems.GetCount());
+    return 0;
+}
+
+template <typename Run>
+void run(benchmark::State& state, const std::string& query, Run stage) {
+    const std::u16string text = wide(query);
+    const std::size_t tokens = parse(text);
+    for (auto _ : state) benchmark::DoNotOptimize(stage(text));
+    state.counters["tokens"] = static_cast<double>(tokens);
+    state.counters["ns/token"] =
+        benchmark::Counter(static_cast<double>(tokens) * 1e-9,
+                           benchmark::Counter::kIsIterationInvariantRate | benchmark::Counter::kInvert);
+}
+
+double seconds(std::size_t (*stage)(const std::u16string&), const std::u16string& text) {
+    double best = 1e9;
+    for (int i = 0; i < 5; ++i) {
+        timespec a{}, b{};
+        clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &a);
+        stage(text);
+        clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &b);
+        best = std::min(best, static_cast<double>(b.tv_sec - a.tv_sec) +
+                                  1e-9 * static_cast<double>(b.tv_nsec - a.tv_nsec));
+    }
+    return best;
+}
+
+/// The table of growth: time at n, and time(2n)/time(n) for parse and for the whole analysis.
+void printGrowth() {
+    std::printf("%-28s %6s %8s %10s %7s %10s %7s\n", "shape", "n", "tokens", "parse ns", "ratio", "all ns",
+                "ratio");
+    std::printf("%-28s %6s %8s %10s %7s %10s %7s\n", "", "", "at 2n", "/token", "2n/n", "/token", "2n/n");
+    for (const auto& family : zr::bench::families()) {
+        const std::u16string one = wide(family.text(family.n)), two = wide(family.text(2 * family.n));
+        const std::size_t tokens = parse(two);
+        const double p1 = seconds(&parse, one), p2 = seconds(&parse, two);
+        const double a1 = seconds(&analyse, one), a2 = seconds(&analyse, two);
+        std::printf("%-28s %6d %8zu %10.0f %7.2f %10.0f %7.2f\n", family.name, family.n, tokens,
+                    p2 * 1e9 / static_cast<double>(tokens), p2 / p1, a2 * 1e9 / static_cast<double>(tokens),
+                    a2 / a1);
+    }
+}
+
+void registerAll() {
+    for (const int blocks : {1, 4, 16, 48}) {
+        const std::string query = zr::bench::plainQuery(blocks);
+        const std::string suffix = "/plain_" + std::to_string(blocks);
+        benchmark::RegisterBenchmark(("lex" + suffix).c_str(),
+                                     [query](benchmark::State& s) { run(s, query, lexOnly); });
+        benchmark::RegisterBenchmark(("parse" + suffix).c_str(),
+                                     [query](benchmark::State& s) { run(s, query, parse); });
+        benchmark::RegisterBenchmark(("analyse" + suffix).c_str(),
+                                     [query](benchmark::State& s) { run(s, query, analyse); });
+    }
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    const bool growth = argc > 1 && std::string(argv[1]) == "--growth";
+    if (growth) {
+        printGrowth();
+        return 0;
+    }
+    registerAll();
+    benchmark::Initialize(&argc, argv);
+    benchmark::RunSpecifiedBenchmarks();
+    return 0;
+}
