@@ -35,7 +35,7 @@ void addColumns(CatalogTable& table, const CString& tableName, const Json& colum
         setNames(*field, name, inBraces(tableName + u"." + name));
         field->SetOwner(&table);
         table.Fields.AddTail(field.get());
-        field.release();  // the table owns its columns
+        (void)field.release();  // the table owns its columns
     }
 }
 
@@ -75,7 +75,7 @@ std::unique_ptr<CatalogDatabase> readCatalog(std::string_view json) {
         auto table = readTable(list[at], "table " + std::to_string(at + 1) + " of the catalogue");
         table->SetDatabase(database.get());
         database->Tables.AddTail(table.get());
-        table.release();  // the database owns its tables
+        (void)table.release();  // the database owns its tables
     }
     return database;
 }
