@@ -3,6 +3,7 @@
 #include "model/named_search.h"
 #include "model/nested_queries.h"
 #include "model/retired_model.h"
+#include "model/source_index.h"
 
 CZRDatabaseInfo::CZRDatabaseInfo() = default;
 

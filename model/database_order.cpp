@@ -2,17 +2,11 @@
 #include <unordered_map>
 #include <vector>
 
+#include "model/named_search.h"
 #include "model/nested_queries.h"
-#include "platform/case_mapping.h"
 #include "zrparsersql/database_info.h"
 
 namespace {
-
-CString folded(const CString& text) {
-    std::u16string units(text.View());
-    zr::foldCase(units.data(), units.size());
-    return CString(units);
-}
 
 // Puts queries behind those they depend on. The places are filled from the front: as long as the occupant of
 // a place depends on a query that stands later, it swaps places with the first such one.
@@ -21,7 +15,7 @@ class QuerySorter {
     QuerySorter(CList<CZRQueryInfo*>& queries, bool throughUnions) : queries_(queries) {
         std::unordered_map<CString, std::vector<std::size_t>> byId;
         for (CZRQueryInfo* query : queries) {
-            if (query) byId[folded(query->GetID())].push_back(order_.size());
+            if (query) byId[zr::foldedKey(query->GetID())].push_back(order_.size());
             order_.push_back(order_.size());
         }
         place_ = order_;
@@ -32,7 +26,7 @@ class QuerySorter {
             if (!query) continue;
             const auto addSources = [&](const CZRQueryInfo& reader) {
                 for (const auto& entry : reader.m_sourceTables)
-                    if (const auto found = byId.find(folded(entry.value)); found != byId.end())
+                    if (const auto found = byId.find(zr::foldedKey(entry.value)); found != byId.end())
                         dependsOn.insert(dependsOn.end(), found->second.begin(), found->second.end());
             };
             addSources(*query);

@@ -13,4 +13,7 @@ T* findFirst(const CList<T*>& list, const CString& wanted, CString (CZRObjectInf
     return nullptr;
 }
 
+// Texts that differ in case alone have equal keys.
+CString foldedKey(const CString& text);
+
 }  // namespace zr

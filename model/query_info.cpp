@@ -100,6 +100,7 @@ void CZRQueryInfo::AddUserFunction(CString name, int parameterCount) {
 }
 
 void CZRQueryInfo::ResolveSources() {
+    zr::SourceCache sources;
     std::vector<CZRQueryInfo*> waiting{this};
     while (!waiting.empty()) {
         CZRQueryInfo* query = waiting.back();
@@ -107,7 +108,8 @@ void CZRQueryInfo::ResolveSources() {
         for (CZRQueryInfo* nested : query->m_subQueries)
             if (nested) waiting.push_back(nested);
         for (auto& entry : query->m_sourceTables)
-            if (const CZRSourceInfo* source = query->FindSource(entry.key)) entry.value = source->GetID();
+            if (const zr::Source found = sources.byName(*query, entry.key))
+                entry.value = found.source->GetID();
     }
 }
 
@@ -140,27 +142,33 @@ CZRSourceFildInfo* CZRQueryInfo::FindFieldByName(CString /*name*/) {
 }
 
 CZRSourceFildInfo* CZRQueryInfo::FindFieldBySrcName(CString name) {
-    return zr::SourceSearch().findFieldBySrcName(*this, name);
+    zr::SourceCache sources;
+    return zr::SourceSearch(sources).findFieldBySrcName(*this, name);
 }
 
 CZRSourceFildInfo* CZRQueryInfo::FindField(CString tableName, CString fieldName) {
-    return zr::SourceSearch().findField(*this, tableName, fieldName);
+    zr::SourceCache sources;
+    return zr::SourceSearch(sources).findField(*this, tableName, fieldName);
 }
 
 CZRSourceFildInfo* CZRQueryInfo::FindFieldInSources(CString fieldName) {
-    return zr::SourceSearch().findFieldInSources(*this, fieldName);
+    zr::SourceCache sources;
+    return zr::SourceSearch(sources).findFieldInSources(*this, fieldName);
 }
 
 int CZRQueryInfo::FindInSubQueries(CString tableName, CString fieldName, CZRQueryInfo*& found) {
-    return zr::SourceSearch().findInSubQueries(*this, tableName, fieldName, found);
+    zr::SourceCache sources;
+    return zr::SourceSearch(sources).findInSubQueries(*this, tableName, fieldName, found);
 }
 
 int CZRQueryInfo::CheckFieldRefs() {
-    return zr::SourceSearch().checkFieldRefs(*this);
+    zr::SourceCache sources;
+    return zr::SourceSearch(sources).checkFieldRefs(*this);
 }
 
 int CZRQueryInfo::GetCorrect() {
-    return zr::SourceSearch().validate(*this);
+    zr::SourceCache sources;
+    return zr::SourceSearch(sources).validate(*this);
 }
 
 int CZRQueryInfo::Validate(int /*requireAllSelected*/) {

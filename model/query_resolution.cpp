@@ -89,10 +89,12 @@ class ItemResolver {
     void resolveQualified(SelectItemField& item) {
         const zr::Source source = sources_.byName(query_, item.m_sourceTable);
         if (source) source.source->Resolved = 0;
-        CZRSourceFildInfo* hit = zr::SourceSearch().findField(query_, item.m_sourceTable, item.m_sourceField);
+        CZRSourceFildInfo* hit =
+            zr::SourceSearch(sources_).findField(query_, item.m_sourceTable, item.m_sourceField);
         if (!hit) {
             CZRQueryInfo* found = nullptr;
-            if (!zr::SourceSearch().findInSubQueries(query_, item.m_sourceTable, item.m_sourceField, found))
+            if (!zr::SourceSearch(sources_).findInSubQueries(query_, item.m_sourceTable, item.m_sourceField,
+                                                             found))
                 query_.SetCorrect(1);
             return;
         }
@@ -122,7 +124,8 @@ class ItemResolver {
     }
 
     void resolveColumn(SelectItemField& item) {
-        const CZRSourceFildInfo* hit = zr::SourceSearch().findField(query_, CString(), item.m_sourceField);
+        const CZRSourceFildInfo* hit =
+            zr::SourceSearch(sources_).findField(query_, CString(), item.m_sourceField);
         if (hit && hit->Computed) item.m_computed = 1;
         if (const SelectItemField* found = inQueriesOfFrom(item)) {
             item.m_tableName = found->m_tableName.IsEmpty() ? found->m_sourceTable : found->m_tableName;

@@ -25,24 +25,22 @@ bool isYesOrNo(const CFieldObject& field) {
 
 }  // namespace
 
+const SourceIndex* SourceCache::indexFor(const CZRQueryInfo& asking) {
+    if (!asking.m_database) return nullptr;
+    for (const auto& [database, index] : indexes_)
+        if (database == asking.m_database) return index.get();
+    indexes_.emplace_back(asking.m_database, SourceIndex::of(*asking.m_database));
+    return indexes_.back().second.get();
+}
+
 Source SourceCache::byName(const CZRQueryInfo& asking, const CString& srcName) {
-    const CZRDatabaseInfo* database = asking.m_database;
-    if (!database) return {};
-    const auto [place, isNew] = byName_.try_emplace(Key{database, srcName});
-    Source& found = place->second;
-    if (isNew && !(found.source = database->FindTableBySrcName(srcName)))
-        found.source = found.query = database->FindQueryBySrcName(srcName);
-    return found;
+    const SourceIndex* index = indexFor(asking);
+    return index ? index->byName(srcName) : Source();
 }
 
 Source SourceCache::byId(const CZRQueryInfo& asking, const CString& id) {
-    const CZRDatabaseInfo* database = asking.m_database;
-    if (!database) return {};
-    const auto [place, isNew] = byId_.try_emplace(Key{database, id});
-    Source& found = place->second;
-    if (isNew && !(found.source = database->FindTableByID(id)))
-        found.source = found.query = database->FindQueryByID(id);
-    return found;
+    const SourceIndex* index = indexFor(asking);
+    return index ? index->byId(id) : Source();
 }
 
 CZRSourceFildInfo* SourceSearch::findField(CZRQueryInfo& query, const CString& tableName,

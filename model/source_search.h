@@ -3,39 +3,23 @@
 #include <unordered_map>
 #include <vector>
 
+#include "model/source_index.h"
 #include "zrparsersql/query_info.h"
 
 namespace zr {
 
-// A source as a database knows it: null, a table, or a query, which then stands in both members.
-struct Source {
-    CZRSourceInfo* source = nullptr;
-    CZRQueryInfo* query = nullptr;
-
-    explicit operator bool() const { return source != nullptr; }
-};
-
-// Looks up sources and remembers the answers. Lives for one operation, in which the database does not change.
+// Looks up sources through the indexes of their databases. Lives for one operation, in which no database
+// changes.
 class SourceCache {
  public:
     Source byName(const CZRQueryInfo& asking, const CString& srcName);
     Source byId(const CZRQueryInfo& asking, const CString& id);
 
  private:
-    struct Key {
-        const CZRDatabaseInfo* database;
-        CString text;
-        bool operator==(const Key&) const = default;
-    };
-    struct Hash {
-        std::size_t operator()(const Key& key) const {
-            return key.text.Hash() ^ reinterpret_cast<std::uintptr_t>(key.database);
-        }
-    };
-    using Answers = std::unordered_map<Key, Source, Hash>;
+    const SourceIndex* indexFor(const CZRQueryInfo& asking);
 
-    Answers byName_;
-    Answers byId_;
+    // Nearly always one.
+    std::vector<std::pair<const CZRDatabaseInfo*, std::shared_ptr<const SourceIndex>>> indexes_;
 };
 
 // The look-ups and the validation of queries, which go from query to query through the database.
@@ -46,6 +30,8 @@ class SourceCache {
 // nothing. An object lives for one operation.
 class SourceSearch {
  public:
+    explicit SourceSearch(SourceCache& sources) : sources_(sources) {}
+
     CZRSourceFildInfo* findField(CZRQueryInfo& query, const CString& tableName, const CString& fieldName);
     CZRSourceFildInfo* findFieldInSources(CZRQueryInfo& query, const CString& fieldName);
     CZRSourceFildInfo* findFieldBySrcName(CZRQueryInfo& query, const CString& name);
@@ -117,7 +103,7 @@ class SourceSearch {
     // The next query to validate, or null when the frame's result stands.
     CZRQueryInfo* go(ValidationFrame& frame, int heard);
 
-    SourceCache sources_;
+    SourceCache& sources_;
     Answers answers_;
     std::unordered_map<const CZRQueryInfo*, int> validated_;
 };

@@ -18,6 +18,7 @@ struct DialectRecord {
 };
 
 class RetiredModel;
+class SourceIndex;
 
 }  // namespace zr
 
@@ -162,5 +163,9 @@ class ZR_API CZRDatabaseInfo : public CZRObjectInfo {
     CList<CString>& GetNameList() { return NameList; }
 
  private:
+    friend class zr::SourceIndex;
+
+    std::shared_ptr<const zr::SourceIndex>
+        sourceIndex_;                            // for the look-ups of queries; made when first needed
     std::unique_ptr<zr::RetiredModel> retired_;  // what Load took out of the lists
 };

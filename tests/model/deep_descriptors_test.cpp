@@ -181,14 +181,10 @@ void chainOfViews(Database& database, int count, bool withColumns) {
     }
 }
 
-// Looking sources up in the lists costs their length, so these chains are shorter; still far deeper than the
-// stack.
-constexpr int kViews = 3000;
-
 TEST(DeepDescriptors, ColumnsAreFoundThroughChainsOfQueries) {
     onSmallStack([] {
         Database database;
-        chainOfViews(database, kViews, true);
+        chainOfViews(database, kDepth, true);
         CZRQueryInfo* last = database.Queries.GetTail();
         const CZRSourceFildInfo* field = database.Tables.GetHead()->FindFieldBySrcName(u"a");
         EXPECT_EQ(last->FindField(u"", u"a"), field);
@@ -201,7 +197,7 @@ TEST(DeepDescriptors, ColumnsAreFoundThroughChainsOfQueries) {
 TEST(DeepDescriptors, ChainsOfQueriesAreValidated) {
     onSmallStack([] {
         Database database;
-        chainOfViews(database, kViews, true);
+        chainOfViews(database, kDepth, true);
         EXPECT_EQ(database.Queries.GetTail()->GetCorrect(), 0);
         EXPECT_EQ(database.Queries.GetHead()->Resolved, 1);
     });

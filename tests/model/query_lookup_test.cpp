@@ -186,6 +186,28 @@ TEST_F(QueryLookup, DiamondsOfQueriesAreSearchedOnce) {
     EXPECT_EQ(top->GetCorrect(), 0);
 }
 
+TEST_F(QueryLookup, FollowsEveryChangeOfTheModel) {
+    auto& query = database.addQuery(u"q").readsFrom(u"orders");
+    resolve();
+    EXPECT_EQ(query.FindField(u"orders", u"id"), orders.field(u"id"));
+    orders.SrcName = u"renamed";
+    EXPECT_EQ(query.FindField(u"orders", u"id"), nullptr);
+    EXPECT_EQ(query.FindField(u"renamed", u"id"), orders.field(u"id"));
+    EXPECT_EQ(query.FindField(u"", u"id"), orders.field(u"id"));
+    orders.ID = u"another";
+    EXPECT_EQ(query.FindField(u"", u"id"), nullptr);
+    auto& second = database.addTable(u"second", {u"id"});
+    EXPECT_EQ(query.FindField(u"second", u"id"), second.field(u"id"));
+    orders.SrcName = u"SECOND";
+    EXPECT_EQ(query.FindField(u"second", u"id"), orders.field(u"id")) << "the first in list order";
+    orders.SrcName.Empty();
+    EXPECT_EQ(query.FindField(u"second", u"id"), second.field(u"id"));
+    database.Tables.RemoveAt(database.Tables.GetHeadPosition());
+    database.Tables.AddTail(&orders);
+    orders.SrcName = u"second";
+    EXPECT_EQ(query.FindField(u"second", u"id"), second.field(u"id"));
+}
+
 TEST(QueryLookupWithoutDatabase, FindsNothing) {
     Query query;
     query.readsFrom(u"t").refersTo(u"t", u"a");
