@@ -43,8 +43,8 @@ void SelectState::walkNested(CZRSQLTree* from, CZRQueryInfo& target) {
     std::unique_ptr<SelectState> nested = makeNested(from);
     SelectState& state = *nested;
     state.m_query = &target;
-    // The copied aliases are those of this state.
-    state.aliasNames_ = &aliasNames();
+    // Aliases of a new descriptor are copies of this state's.
+    if (!target.m_aliases.IsEmpty()) state.aliasNames_ = &aliasNames();
     work().openNested(std::move(nested));
     work().once(state, &SelectState::resolveStep, nullptr, nullptr, nullptr);
     work().forEachChild(state, &SelectState::clauseStep, from, nullptr, nullptr);

@@ -62,15 +62,15 @@ void SelectState::collectAlias(CZRSQLTree* node) {
     enterAlias(key.MakeLower(), shown);
 }
 
-void SelectState::enterAlias(const CString& key, const CString& shown) {
-    if (m_query->m_aliases.Contains(key)) return;
+CZRAliasInfo* SelectState::enterAlias(const CString& key, const CString& shown) {
+    if (m_query->m_aliases.Contains(key)) return nullptr;
     auto alias = std::make_unique<CZRAliasInfo>();
     alias->Expression = new SelectItem;
     alias->SetName(shown);
     alias->SetSrcName(shown);
     aliasNames().add(key);
     m_query->m_aliases.SetAt(key, alias.get());
-    static_cast<void>(alias.release());
+    return alias.release();
 }
 
 void SelectState::CollectTables() {

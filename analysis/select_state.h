@@ -33,12 +33,11 @@ struct Dialect {
 // Dialects derive from it, with a table of token numbers and overrides of the steps that differ.
 class SelectState {
  public:
-    // The view outlives the state. The descriptor to fill is set before the first pass.
     SelectState(const SelectState&) = delete;
     SelectState& operator=(const SelectState&) = delete;
     virtual ~SelectState();
 
-    CZRQueryInfo* m_query = nullptr;  // not owned
+    CZRQueryInfo* m_query = nullptr;  // to fill; set ahead of the first pass; not owned
     CZRSQLTree* m_selectNode;         // not owned
     CList<SelectState*> m_states;     // of nested selects; owned
     int m_afterDbName = 0;            // a DB_NAME was met and its TABLE_NAME was not
@@ -89,7 +88,7 @@ class SelectState {
     Role roleOf(CZRSQLTree* node) const { return dialect_.tokens.role(node->GetType()); }
 
  protected:
-    // A state with an outer one shares its work and finds the aliases that it knows.
+    // The node outlives the state. A state with an outer one shares its work.
     SelectState(CZRSQLTree* selectNode, const Dialect& dialect, SelectState* outer);
 
     // A state of the same dialect for a nested select.
@@ -100,8 +99,8 @@ class SelectState {
     // One node below the select node, in the order of the tree.
     virtual void collectTable(CZRSQLTree* node);
     void enterTable(const CString& name) { m_query->m_sourceTables[name] = name; }
-    // The first alias of a key wins.
-    void enterAlias(const CString& key, const CString& shown);
+    // The first alias of a key wins: null when the key stands already.
+    CZRAliasInfo* enterAlias(const CString& key, const CString& shown);
     // Under the two texts joined; replaces what stands there.
     void enterField(std::unique_ptr<CFieldObject> field);
 
@@ -121,11 +120,18 @@ class SelectState {
     }
     SelectItem& appendText(ItemList* list, const CString& text, int kind);
     // The item that stands for a part of a join, named " ".
-    SelectItem& appendJoinPart(ItemList* list);
+    virtual SelectItem& appendJoinPart(ItemList* list);
 
+    // A new descriptor that knows what this one knows; the owner's pointer holds it at once.
+    CZRQueryInfo& newNestedQuery(CZRQueryInfo*& owner);
+    // Fills a new nested descriptor from the first select on the chain of first children.
+    void walkNested(CZRSQLTree* from, CZRQueryInfo& target);
+
+    // What has to be done behind a piece of work is put on ahead of it.
     WorkStack& work() { return walk_->work; }
 
  private:
+    // What the states of one analysis share.
     struct Walk {
         WorkStack work;
         std::size_t itemsLeft;
@@ -143,17 +149,14 @@ class SelectState {
 
     void processItems(CZRSQLTree* clause, ItemList& list);
     void appendFunction(CZRSQLTree* node, ItemList* list);
-    // A new descriptor that knows what this one knows; the owner's pointer holds it at once.
-    CZRQueryInfo& newNestedQuery(CZRQueryInfo*& owner);
-    // Fills a new nested descriptor from the first select on the chain of first children.
-    void walkNested(CZRSQLTree* from, CZRQueryInfo& target);
     AliasNames& aliasNames();
 
     const Dialect& dialect_;
     std::unique_ptr<Walk> ownWalk_;  // of the outermost state
     Walk* walk_;
     std::unique_ptr<AliasNames> ownAliasNames_;
-    AliasNames* aliasNames_ = nullptr;  // made when first needed, or those of the outer state
+    AliasNames* aliasNames_ =
+        nullptr;  // made when first needed; those of the outer state where they are the same
 };
 
 }  // namespace zr

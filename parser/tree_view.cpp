@@ -1,6 +1,7 @@
 #include "parser/tree_view.h"
 
 #include <algorithm>
+#include <utility>
 
 #include "parser/token_text.h"
 
@@ -17,7 +18,8 @@ void* ViewStore::allocate(std::size_t bytes) {
         const std::size_t usual =
             std::min(kFirstBlock << std::min<std::size_t>(blocks_.size(), 6), kLargestBlock);
         const std::size_t size = std::max(usual, bytes);
-        blocks_.emplace_back(new std::byte[size]);
+        std::unique_ptr<std::byte[]> block(new std::byte[size]);
+        blocks_.push_back(std::move(block));
         free_ = blocks_.back().get();
         left_ = size;
     }
