@@ -1,6 +1,7 @@
 #include <algorithm>
 #include <array>
 #include <fstream>
+#include <map>
 #include <sstream>
 
 #include "grammar/compiler/error.h"
@@ -236,6 +237,25 @@ class Emitter {
         for (const Guard& g : program_.guards)
             guards.push_back({classSet(g.follow), classSet(g.last), classSet(g.outside)});
         const int openers = classSet(openersOf);
+        // What can stand second is only told by class: a union over the tokens of a class, so a "no" stays
+        // right.
+        std::vector<int> seconds;
+        std::map<std::array<std::uint64_t, 4>, int> knownSeconds;
+        for (const auto& ofRule : program_.second) {
+            std::vector<std::set<int>> byClass(index(program_.classes));
+            for (const auto& [token, second] : ofRule)
+                byClass[index(program_.classOf[index(token)])].insert(second.begin(), second.end());
+            for (const auto& second : byClass) {
+                if (second.empty() || second.count(kEof) != 0) {
+                    seconds.push_back(0xFFFF);
+                    continue;
+                }
+                const int made = classSet(second);
+                const auto [found, fresh] = knownSeconds.emplace(classSets_.back(), made);
+                if (!fresh) classSets_.pop_back();
+                seconds.push_back(found->second);
+            }
+        }
         std::vector<int> contextSets;
         for (const CallContext& c : program_.contexts)
             for (const auto& s : c.other) contextSets.push_back(classSet(s));
@@ -296,6 +316,7 @@ class Emitter {
         array(o, "std::uint64_t", "classSets", words, [&](std::uint64_t w) { o << w << "u"; });
         array(o, "GuardRow", "guards", guards,
               [&](const auto& g) { o << "{" << g[0] << ", " << g[1] << ", " << g[2] << "}"; });
+        array(o, "std::uint16_t", "seconds", seconds, [&](int s) { o << s; });
         array(o, "std::uint16_t", "contextSets", contextSets, [&](int s) { o << s; });
         array(o, "std::uint8_t", "contextFlags", program_.contexts,
               [&](const CallContext& c) { o << c.canEnd + 2 * c.closing; });
@@ -310,8 +331,9 @@ class Emitter {
           << vocabulary_.maxNumber << ", classSets, " << firstBase << ", " << openers << ", " << recoverFollow
           << ", guards, " << guards.size() << ", " << std::max(program_.closer, 0) << ", " << parser_.start
           << ", " << parser_.statement << ", " << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule)
-          << ", " << left << ", " << right << ", " << parser_.keepTail << ", " << program_.tailLoops.size()
-          << ", contextSets, contextFlags, " << program_.contexts.size() << "};\n\n";
+          << ", " << left << ", " << right << ", " << parser_.keepTail << ", seconds, "
+          << program_.tailLoops.size() << ", contextSets, contextFlags, " << program_.contexts.size()
+          << "};\n\n";
     }
 
     void contexts(std::ostream& o) const {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <map>
 #include <set>
 #include <string>
 #include <vector>
@@ -75,6 +76,9 @@ struct Program {
     std::vector<int> loops;  ///< Choice nodes of all repetitions
     std::vector<TailLoop> tailLoops;
     std::vector<CallContext> contexts;
+    /// By rule, by token that it starts with: what can come second, kEof standing for "anything, the rule may
+    /// be over". Told apart no finer than token classes are.
+    std::vector<std::map<int, std::set<int>>> second;
     int closer = -1;
     std::set<int> recoverFollow;
     std::vector<int> classOf;  ///< by token number

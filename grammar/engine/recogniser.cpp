@@ -305,6 +305,9 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                 if (!recoverable && !inSet(table_->firstSetBase + node.arg, classes_[low]) &&
                     (!rule.nullable || (node.flags & kNonEmpty)))
                     return false;
+                if (!recovering_ && !(rule.nullable && !(node.flags & kNonEmpty)) &&
+                    !secondFits(node.arg, low))
+                    return false;
                 if (!recoverable && !guarded(node, low)) return false;
                 const std::uint32_t child =
                     entryFor(node.arg, low, contextOf(node.context, entries_[entryIndex].context));

@@ -137,6 +137,11 @@ class Recogniser {
     void reset();
     bool settle(std::uint32_t& low, std::uint32_t& high) const;
     std::uint32_t viable(const NodeRow& node, std::uint32_t low, std::uint32_t high) const;
+    bool secondFits(std::uint16_t rule, std::uint32_t position) const {
+        if (position >= count_) return true;
+        const std::uint16_t set = table_->seconds[rule * table_->classes + classes_[position]];
+        return set == kNone16 || inSet(set, classes_[position + 1]);
+    }
     bool guarded(const NodeRow& node, std::uint32_t position);
     std::uint32_t addState(std::uint16_t node, std::uint32_t low, std::uint32_t high, std::uint32_t before,
                            std::uint32_t child, std::uint32_t childEnd);

@@ -7,7 +7,7 @@
 /// engine never runs tables of another layout.
 namespace zr::engine {
 
-constexpr std::uint32_t kTableVersion = 2;
+constexpr std::uint32_t kTableVersion = 3;
 
 constexpr std::uint16_t kNone16 = 0xFFFF;
 
@@ -129,6 +129,8 @@ struct ParserTable {
     std::uint16_t recoverRule;            ///< rule or kNone16
     std::uint16_t leftParen, rightParen;  ///< token numbers for "the same parenthesis depth", 0 for none
     std::uint8_t keepTail;
+    /// [rule * classes + class of the first token]: class set of what can come second, kNone16 for anything.
+    const std::uint16_t* seconds;
     std::uint32_t loopCount;  ///< tail loops, at most 8
     // By call context: for each tail loop the class set of what something else than the loop can take there;
     // and whether the rule around the call can end behind it (1) and a closer that must stand can come (2).
