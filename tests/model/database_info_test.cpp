@@ -193,11 +193,29 @@ TEST(DatabaseInfo, NestedQueriesOfACloneLookIntoTheClone) {
     nested->SetDatabase(database.get());
     nested->m_sourceTables[u"t"] = u"t";
     query.m_subQueries.AddTail(nested);
+    const auto nestedQuery = [&database] {
+        auto* made = new CZRQueryInfo;
+        made->SetDatabase(database.get());
+        return made;
+    };
+    auto* record = new CZRQueryUnionInfo;
+    record->Query = nestedQuery();
+    query.m_unions.AddTail(record);
+    auto* inAlias = new SelectItemSubQuery;
+    inAlias->m_query = nestedQuery();
+    query.addAlias(u"a").Expression = zr::test::functionItem(u"f", {inAlias});
+    auto* inWhere = new SelectItemSubQuery;
+    inWhere->m_query = nestedQuery();
+    query.m_whereItem = zr::test::functionItem(u"", {inWhere});
     const std::unique_ptr<Database> clone(database->Clone());
     database.reset();
     CZRQueryInfo* copy = clone->Queries.GetHead();
     copy->ResolveSources();
     EXPECT_EQ(copy->m_subQueries.GetHead()->m_sourceTables[u"t"], clone->Tables.GetHead()->ID);
+    EXPECT_EQ(copy->m_unions.GetHead()->Query->m_database, clone.get());
+    for (const SelectItem* root : {copy->m_aliases[u"a"]->Expression, copy->m_whereItem})
+        EXPECT_EQ(static_cast<SelectItemSubQuery*>(root->m_items.GetHead())->m_query->m_database,
+                  clone.get());
     for (int level = 0; level < 3; ++level) {
         copy = static_cast<SelectItemUnion*>(copy->m_unionItems.GetHead())->m_query;
         EXPECT_EQ(copy->m_database, clone.get());

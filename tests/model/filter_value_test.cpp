@@ -177,6 +177,11 @@ TEST(FilterText, MeasuresLongTextFirst) {
     EXPECT_LT(bytes.capacity(), units.size() + 64);
 }
 
+TEST(FilterText, SystemEncodingHoldsAscii) {
+    EXPECT_EQ(zr::encodeFilterText(u"abc", FE_ANSI), "abc");
+    EXPECT_EQ(zr::decodeFilterText("abc", FE_ANSI), u"abc");
+}
+
 TEST(FilterText, UnknownEncodingsAreLatin1) {
     for (int encoding : {0, 27, 999, -1}) {
         EXPECT_EQ(zr::decodeFilterText("\xE4", encoding), u"ä");

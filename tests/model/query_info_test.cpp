@@ -244,6 +244,41 @@ TEST(QueryInfo, CloneAsksHostClassesOfQueriesForTheirOwnCopies) {
     EXPECT_EQ(copy->type, DB_ORACLE);
 }
 
+class HostAlias : public CZRAliasInfo {
+ public:
+    HostAlias* Clone(int = 0) const override { return new HostAlias(*this); }
+};
+
+TEST(QueryInfo, CloneAsksHostClassesOfAliasesForTheirOwnCopies) {
+    CZRQueryInfo query;
+    query.m_aliases[u"a"] = new HostAlias;
+    query.m_aliases[u"null"] = nullptr;
+    const std::unique_ptr<CZRQueryInfo> clone(query.Clone());
+    EXPECT_NE(dynamic_cast<HostAlias*>(clone->m_aliases[u"a"]), nullptr);
+    EXPECT_TRUE(clone->m_aliases.Contains(u"null"));
+}
+
+TEST(QueryInfo, RecordOfAUnionIsCopiedWithItsQuery) {
+    CZRQueryUnionInfo record;
+    record.Query = new Query(u"branch");
+    record.UnionKind = 1;
+    record.Text = u"never copied";
+    const CZRQueryUnionInfo copy(record);
+    ASSERT_NE(copy.Query, nullptr);
+    EXPECT_NE(copy.Query, record.Query);
+    EXPECT_EQ(copy.Query->Name, u"branch");
+    EXPECT_EQ(copy.UnionKind, 1);
+    EXPECT_TRUE(copy.Text.IsEmpty());
+    EXPECT_EQ(CZRQueryUnionInfo(CZRQueryUnionInfo()).Query, nullptr);
+}
+
+TEST(QueryInfo, HasNoMappedTypeToBuild) {
+    CZRQueryInfo query;
+    query.TypeMappedString = u"kept";
+    query.BuildTypeMappedString();
+    EXPECT_EQ(query.TypeMappedString, u"kept");
+}
+
 TEST(QueryInfo, BothCopyPropertiesDoTheSame) {
     Query source(u"source");
     source.Length = 5;

@@ -189,6 +189,7 @@ TEST_F(QueryLookup, DiamondsOfQueriesAreSearchedOnce) {
 TEST_F(QueryLookup, FollowsEveryChangeOfTheModel) {
     auto& query = database.addQuery(u"q").readsFrom(u"orders");
     resolve();
+    database.Tables.AddTail(nullptr);
     EXPECT_EQ(query.FindField(u"orders", u"id"), orders.field(u"id"));
     orders.SrcName = u"renamed";
     EXPECT_EQ(query.FindField(u"orders", u"id"), nullptr);

@@ -163,6 +163,19 @@ TEST_F(QueryResolution, ChildrenAreResolvedWithTheQueryUnmarked) {
     EXPECT_EQ(query.Resolved, 0);
 }
 
+TEST_F(QueryResolution, OneItemIsResolvedWithWhatIsBelowIt) {
+    query.readsFrom(u"t");
+    SelectItemField* item = fieldItem(u"t", u"a");
+    const std::unique_ptr<SelectItem> root(functionItem(u"f", {item}));
+    query.Resolved = 1;
+    query.ResolveItem(root.get());
+    EXPECT_EQ(item->m_fieldName, u"NewA");
+    EXPECT_EQ(query.Resolved, 0);
+    query.Resolved = 1;
+    query.ResolveItem(nullptr);
+    EXPECT_EQ(query.Resolved, 1);
+}
+
 TEST_F(QueryResolution, EveryClauseIsResolved) {
     query.readsFrom(u"t");
     std::vector<SelectItemField*> items;

@@ -250,6 +250,7 @@ TEST(TableInfo, CopyFromMergesChildrenBySourceName) {
     table.CopyFrom(other, DB_MSSQL);
     EXPECT_EQ(table.field(u"a")->Length, 7);
     EXPECT_EQ(table.field(u"b")->Selected, 0) << "AutoStructureUpdate is off";
+    table.Indexes.AddTail(nullptr);
     EXPECT_EQ(table.FindIndexBySrcName(u"ix")->Length, 8);
     EXPECT_EQ(table.FindIndexBySrcName(u"only")->Selected, 0);
     EXPECT_EQ(table.ForeignKeys.GetHead()->Length, 9);
