@@ -62,6 +62,18 @@ TEST(EngineEqualsReference, OnTheCorpus) {
     EXPECT_EQ(counts.tooMuch, 0);
 }
 
+TEST(EngineEqualsReference, WhereTheSelectListIsMissingBehindTwoClosingParentheses) {
+    Counts counts;
+    compare(u"SELECT TOP (1)) a (", counts);
+    EXPECT_EQ(counts.recovered, 1);
+}
+
+TEST(EngineEqualsReference, WhereAnOuterCallTakesTheParenthesisThatAnInnerOneLeaves) {
+    Counts counts;
+    compare(u"SELECT MAX f.g(( & 0", counts);
+    EXPECT_EQ(counts.whole, 1);
+}
+
 class EngineEqualsReferenceOnSentences : public testing::TestWithParam<std::uint32_t> {};
 
 TEST_P(EngineEqualsReferenceOnSentences, DerivedAndSpoilt) {
