@@ -1,5 +1,5 @@
-# libzrparsersql: the objects of the static pieces in one shared library. What it exports is what the headers mark as
-# exported; everything else keeps hidden visibility.
+# libzrparsersql: the objects of the static pieces in one shared library. What it exports stands in exports.map; the
+# descriptor classes reach hosts as a static library, one declaration for both sides.
 
 set(zr_pieces)
 foreach(piece zr_platform zr_model zr_stream zr_engine zr_grammars zr_parser zr_analysis)
@@ -22,7 +22,11 @@ if(zr_pieces)
     target_include_directories(
       zrparsersql PUBLIC "$<BUILD_INTERFACE:$<TARGET_PROPERTY:zr_grammars,INTERFACE_INCLUDE_DIRECTORIES>>")
   endif()
-  # The character stream is not exported: a host that calls recognisers brings it along.
+  set(zr_exports "${PROJECT_SOURCE_DIR}/cmake/exports.map")
+  target_link_options(zrparsersql PRIVATE "LINKER:--version-script,${zr_exports}")
+  set_target_properties(zrparsersql PROPERTIES LINK_DEPENDS "${zr_exports}")
+  # Descriptors and character stream are not exported: a host brings them along.
+  target_link_libraries(zrparsersql INTERFACE zr_model zr_platform)
   target_link_libraries(zrparsersql PUBLIC zr_stream zr::antlr3c PRIVATE ICU::i18n ICU::uc zr::uuid Threads::Threads)
   if(NOT ZR_SANITIZE)
     target_link_options(zrparsersql PRIVATE LINKER:--no-undefined)

@@ -417,6 +417,7 @@ void findTailLoops(Program& p, const ParserGrammar& grammar, const Facts& facts)
         if (p.tailLoops.size() == kMaxTailLoops) break;
         p.nodes[index(loop)].tailLoop = static_cast<int>(p.tailLoops.size());
         p.tailLoops.push_back({loop, p.nodes[index(n.targets[0])].first});
+        p.nodes[index(loop)].isTailLoop = true;
         p.nodes[index(loop)].roundFirst = p.nodes[index(n.targets[0])].first;
         findLoopHeads(p, facts, loop);
     }

@@ -40,6 +40,7 @@ struct Node {
     int guard = -1;            ///< Call: index into guards, or -1
     int required = -1;         ///< Call: a token that must still come behind it, or -1
     int context = -1;          ///< Call: index into contexts
+    bool isTailLoop = false;   ///< Choice: the tail loop itself, not something declined like a round of it
     int tailLoop = -1;         ///< Choice: index into tailLoops, or -1
     std::set<int> roundFirst;  ///< Choice of a tail loop: what a round that it declines could start with
 };

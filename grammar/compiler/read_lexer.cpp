@@ -99,19 +99,13 @@ class LexerReader {
             rule.hidden = true;
         } else if (action == "cut") {
             in_.expect("(");
-            rule.cutFront = readNumber();
+            rule.cutFront = in_.expectNumber("cut(");
             in_.expect(",");
-            rule.cutBack = readNumber();
+            rule.cutBack = in_.expectNumber(",");
             in_.expect(")");
         } else {
             in_.fail("unknown action '" + action + "'");
         }
-    }
-
-    int readNumber() {
-        if (in_.peek().kind != Item::Kind::Number)
-            in_.fail("expected a number before '" + in_.peek().text + "'");
-        return std::stoi(in_.next().text);
     }
 
     std::vector<std::vector<LexElement>> readAlternatives() {

@@ -50,7 +50,7 @@ Vocabulary readVocabulary(const std::string& path) {
         in.expect("=");
         if (in.peek().kind != Item::Kind::Number)
             in.fail("expected a token number after '" + name.text + "='");
-        const int number = std::stoi(in.next().text);
+        const int number = in.expectNumber(name.text + "=");
         if (number < kFirstToken) in.failAt(name.line, "token numbers start at 4");
         if (!names.emplace(number, name.text).second)
             in.failAt(name.line, "token number " + std::to_string(number) + " is taken by " + names[number]);

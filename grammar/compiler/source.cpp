@@ -93,6 +93,14 @@ std::string Cursor::expectName() {
     return next().text;
 }
 
+int Cursor::expectNumber(const std::string& after) {
+    constexpr std::size_t kDigits = 9;
+    if (peek().kind != Item::Kind::Number)
+        fail("expected a number behind '" + after + "', not '" + peek().text + "'");
+    if (peek().text.size() > kDigits) fail("number " + peek().text + " is too large");
+    return std::stoi(next().text);
+}
+
 void Cursor::fail(const std::string& what) const {
     failAt(peek().line, what);
 }

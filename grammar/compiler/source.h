@@ -26,6 +26,7 @@ class Cursor {
     bool accept(const std::string& punct);
     void expect(const std::string& punct);
     std::string expectName();
+    int expectNumber(const std::string& after);
     [[noreturn]] void fail(const std::string& what) const;
     [[noreturn]] void failAt(int line, const std::string& what) const;
     const std::string& file() const { return file_; }

@@ -21,7 +21,8 @@ void displayRecognitionError(pANTLR3_BASE_RECOGNIZER recogniser, pANTLR3_UINT8*)
     std::u16string text;
     appendNumber(text, static_cast<std::uint32_t>(e->line));
     text += u":";
-    appendNumber(text, static_cast<std::uint32_t>(e->charPositionInLine));
+    // The runtime counts the columns of the first line from -1.
+    appendNumber(text, static_cast<std::uint32_t>(e->charPositionInLine + (e->line == 1 ? 1 : 0)));
     text += u": no way to read on";
     if (recogniser->type == ANTLR3_TYPE_PARSER && e->token != nullptr) {
         const auto* token = static_cast<pANTLR3_COMMON_TOKEN>(e->token);

@@ -51,7 +51,8 @@ void reportDropped(pANTLR3_LEXER lexer) {
     std::u16string text;
     appendNumber(text, in->line);
     text += u":";
-    appendNumber(text, static_cast<std::uint32_t>(in->charPositionInLine));
+    // The runtime counts the columns of the first line from -1.
+    appendNumber(text, static_cast<std::uint32_t>(in->charPositionInLine + (in->line == 1 ? 1 : 0)));
     text += u": no token starts with '";
     text += *position(in);
     text += u"'";

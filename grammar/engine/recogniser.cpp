@@ -285,7 +285,7 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                 // The part that recovery replaces starts with none of its tokens: look at every way to it.
                 if (recoversIn(entryIndex))
                     mask = static_cast<std::uint32_t>((std::uint64_t{1} << choice.count) - 1);
-                if (node.context != kNone16 && ((stopped >> node.context) & 1)) mask &= ~1u;
+                if ((node.flags & kLoop) && ((stopped >> node.context) & 1)) mask &= ~1u;
                 if (mask == 0) return false;
                 const auto branch = static_cast<std::uint32_t>(std::countr_zero(mask));
                 const std::uint16_t target = table_->targets[choice.firstTarget + branch];
@@ -299,9 +299,13 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                 continue;
             }
             case Op::Call: {
-                if (!settle(low, high)) return false;
                 const RuleRow& rule = table_->rules[node.arg];
                 const bool recoverable = node.arg == table_->recoverRule && recoversIn(entryIndex);
+                if (!settle(low, high)) {
+                    if (!recoverable) return false;
+                    // The parentheses that are left over are among what recovery skips.
+                    low = high;
+                }
                 if (!recoverable && !inSet(table_->firstSetBase + node.arg, classes_[low]) &&
                     (!rule.nullable || (node.flags & kNonEmpty)))
                     return false;
