@@ -75,7 +75,7 @@ std::u16string unitsOf(const CZRFilterValue& value) {
 }
 
 bool hasSpanBeforeExponent(std::u16string_view text) {
-    return text.substr(0, text.find_first_of(u"Ee")).size() > 0;
+    return !text.substr(0, text.find_first_of(u"Ee")).empty();
 }
 
 bool equalsAsText(const CZRFilterValue& value, const CZRFilterValue& other) {

@@ -11,6 +11,11 @@ bool isSameBuffer(const CString& left, const CString& right) {
     return left.GetString() == right.GetString();
 }
 
+std::size_t sourceCount(const CZRDatabaseInfo& database) {
+    return static_cast<std::size_t>(database.Tables.GetCount()) +
+           static_cast<std::size_t>(database.Queries.GetCount());
+}
+
 }  // namespace
 
 std::shared_ptr<const SourceIndex> SourceIndex::of(CZRDatabaseInfo& database) {
@@ -20,7 +25,7 @@ std::shared_ptr<const SourceIndex> SourceIndex::of(CZRDatabaseInfo& database) {
 }
 
 SourceIndex::SourceIndex(const CZRDatabaseInfo& database) {
-    seen_.reserve(static_cast<std::size_t>(database.Tables.GetCount() + database.Queries.GetCount()));
+    seen_.reserve(sourceCount(database));
     for (CZRTableInfo* table : database.Tables) add(table, nullptr);
     for (CZRQueryInfo* query : database.Queries) add(query, query);
 }
@@ -41,8 +46,7 @@ Source SourceIndex::find(const Sources& sources, const CString& text) {
 }
 
 bool SourceIndex::isCurrent(const CZRDatabaseInfo& database) const {
-    if (seen_.size() != static_cast<std::size_t>(database.Tables.GetCount() + database.Queries.GetCount()))
-        return false;
+    if (seen_.size() != sourceCount(database)) return false;
     auto seen = seen_.begin();
     const auto isUnchanged = [&seen](const CZRSourceInfo* source) {
         const Seen& before = *seen++;

@@ -81,10 +81,10 @@ int compareNoCase(std::u16string_view left, std::u16string_view right) noexcept 
     if (at == common) return left.size() == right.size() ? 0 : left.size() < right.size() ? -1 : 1;
 
     // The first differing unit may be the second half of a pair whose first halves are equal.
-    if (at > 0 && U16_IS_TRAIL(left[at]) && U16_IS_LEAD(left[at - 1]))
-        --at;
-    else if (at > 0 && U16_IS_TRAIL(right[at]) && U16_IS_LEAD(right[at - 1]))
-        --at;
+    const auto isSecondHalf = [at](std::u16string_view text) {
+        return at > 0 && U16_IS_TRAIL(text[at]) && U16_IS_LEAD(text[at - 1]);
+    };
+    if (isSecondHalf(left) || isSecondHalf(right)) --at;
     std::size_t a = at;
     std::size_t b = at;
     while (a < left.size() && b < right.size()) {

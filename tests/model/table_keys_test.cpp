@@ -56,6 +56,8 @@ TEST(TableKeys, BestKeyIsTheFirstOfTheShortestUniqueIndexes) {
     EXPECT_EQ(table.GetBestKey(), two);
     Index* one = uniqueIndex(table, u"one", {u"a"});
     EXPECT_EQ(table.GetBestKey(), one);
+    uniqueIndex(table, u"none", {});
+    EXPECT_EQ(table.GetBestKey(), one) << "one column ends the search";
 }
 
 class KeyForSelection : public testing::Test {

@@ -35,6 +35,8 @@ TEST(Utf8, ReplacesEachIllFormedPiece) {
     EXPECT_EQ(fromBytes("a\xC3"), u"a\uFFFD");
     EXPECT_EQ(fromBytes("\xE2\x82z"), u"\uFFFDz");
     EXPECT_EQ(fromBytes("\xC0\xAF"), u"\uFFFD\uFFFD");
+    EXPECT_EQ(fromBytes("\xE0\x80\xAF"), u"\uFFFD\uFFFD\uFFFD");
+    EXPECT_EQ(fromBytes("\xF0\x80\x80\xAF"), u"\uFFFD\uFFFD\uFFFD\uFFFD");
     EXPECT_EQ(fromBytes("\xF4\x90\x80\x80"), u"\uFFFD\uFFFD\uFFFD\uFFFD");
     EXPECT_EQ(fromBytes("\xF0\x90\x90"), u"\uFFFD");
     EXPECT_EQ(fromBytes("\xFF\xFE"), u"\uFFFD\uFFFD");
