@@ -9,6 +9,9 @@ namespace {
 /// Up to this many merge states an entry is searched through plainly; beyond, it moves to the shared table.
 constexpr std::uint32_t kFewVisits = 6;
 
+/// What a thread keeps at most between two searches.
+constexpr std::size_t kSpareBytes = std::size_t{8} << 20;
+
 std::uint64_t visitHash(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high) {
     std::uint64_t h = (static_cast<std::uint64_t>(entry) << 16) ^ node;
     h = h * 0x9E3779B97F4A7C15u ^ low;
@@ -26,7 +29,50 @@ bool isZeroWidth(Op op) {
 Recogniser::Recogniser(const ParserTable& table, const std::vector<std::uint16_t>& types,
                        const Options& options)
     : table_(&table), options_(&options), types_(&types), count_(static_cast<std::uint32_t>(types.size())) {
+    exchange(spare());
     index();
+}
+
+struct Recogniser::Spare {
+    std::vector<Entry> entries;
+    std::vector<End> ends;
+    std::vector<State> states;
+    std::vector<Frame> frames;
+    std::vector<Visit> visits;
+    std::vector<std::uint32_t> entriesAt;
+
+    std::size_t bytes() const {
+        return entries.capacity() * sizeof(Entry) + ends.capacity() * sizeof(End) +
+               states.capacity() * sizeof(State) + frames.capacity() * sizeof(Frame) +
+               visits.capacity() * sizeof(Visit) + entriesAt.capacity() * sizeof(std::uint32_t);
+    }
+};
+
+Recogniser::Spare& Recogniser::spare() {
+    static thread_local Spare mine;
+    return mine;
+}
+
+void Recogniser::exchange(Spare& with) {
+    entries_.swap(with.entries);
+    ends_.swap(with.ends);
+    states_.swap(with.states);
+    frames_.swap(with.frames);
+    visits_.swap(with.visits);
+    entriesAt_.swap(with.entriesAt);
+}
+
+Recogniser::~Recogniser() {
+    Spare& kept = spare();
+    Spare mine;
+    exchange(mine);
+    if (mine.bytes() <= kept.bytes() || mine.bytes() > kSpareBytes) return;
+    mine.entries.clear();
+    mine.ends.clear();
+    mine.states.clear();
+    mine.frames.clear();
+    mine.visits.clear();
+    std::swap(kept, mine);
 }
 
 /// One pass over the tokens for everything that later questions need in constant time.
@@ -49,9 +95,6 @@ void Recogniser::index() {
     candidates_.resize(table_->guardCount);
     barriers_.resize(table_->guardCount);
     entriesAt_.assign(count_ + 1, kNone);
-    entries_.reserve(count_ * 4 + 16);
-    states_.reserve(count_ * 16 + 64);
-    ends_.reserve(count_ * 6 + 16);
 }
 
 std::uint32_t Recogniser::addState(std::uint16_t node, std::uint32_t low, std::uint32_t high,

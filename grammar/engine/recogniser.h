@@ -50,6 +50,11 @@ class Recogniser {
     /// `types` holds the token numbers of the on-channel tokens without end of file; it must outlive this
     /// object.
     Recogniser(const ParserTable& table, const std::vector<std::uint16_t>& types, const Options& options);
+    ~Recogniser();
+    Recogniser(Recogniser&&) = default;
+    Recogniser& operator=(Recogniser&&) = default;
+    Recogniser(const Recogniser&) = delete;
+    Recogniser& operator=(const Recogniser&) = delete;
 
     /// Runs `rule` from `position`.
     Result run(std::uint16_t rule, std::uint32_t position);
@@ -111,6 +116,11 @@ class Recogniser {
 
     enum class Outcome { Yielded, Exhausted, NeedsChild };
 
+    /// The larger vectors of a thread's last search, kept for its next one: taking and giving back fresh
+    /// memory for each text costs more than the search of a short one.
+    struct Spare;
+    static Spare& spare();
+    void exchange(Spare& with);
     void index();
     std::uint32_t entryFor(std::uint16_t rule, std::uint32_t position, std::uint16_t context);
     std::uint16_t contextOf(std::uint16_t call, std::uint16_t outer);
