@@ -10,7 +10,7 @@ namespace {
 constexpr std::uint32_t kFewVisits = 6;
 
 /// What a thread keeps at most between two searches.
-constexpr std::size_t kSpareBytes = std::size_t{8} << 20;
+constexpr std::size_t kSpareBytes = std::size_t{32} << 20;
 
 std::uint64_t visitHash(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high) {
     std::uint64_t h = (static_cast<std::uint64_t>(entry) << 16) ^ node;
