@@ -3,6 +3,12 @@
 #include <algorithm>
 
 namespace zr::engine {
+namespace {
+
+/// What a thread keeps at most between two trees.
+constexpr std::size_t kSpareBytes = std::size_t{32} << 20;
+
+}  // namespace
 
 TreeBuilder::TreeBuilder(const GrammarTable& grammar, const Recogniser& recogniser,
                          const std::vector<pANTLR3_COMMON_TOKEN>& tokens, pANTLR3_BASE_TREE_ADAPTOR adaptor)
@@ -10,7 +16,21 @@ TreeBuilder::TreeBuilder(const GrammarTable& grammar, const Recogniser& recognis
       table_(*grammar.parser),
       recogniser_(recogniser),
       tokens_(tokens),
-      adaptor_(adaptor) {}
+      adaptor_(adaptor) {
+    steps_.swap(spareSteps());
+}
+
+TreeBuilder::~TreeBuilder() {
+    std::vector<Step>& spare = spareSteps();
+    if (steps_.capacity() <= spare.capacity() || steps_.capacity() * sizeof(Step) > kSpareBytes) return;
+    steps_.clear();
+    steps_.swap(spare);
+}
+
+std::vector<TreeBuilder::Step>& TreeBuilder::spareSteps() {
+    static thread_local std::vector<Step> mine;
+    return mine;
+}
 
 std::uint32_t TreeBuilder::runEndOf(std::uint32_t position) const {
     while (position < tokens_.size() && tokens_[position]->type == table_.closer) ++position;
@@ -161,7 +181,7 @@ void TreeBuilder::closeScope(std::uint32_t at) {
 
 const std::vector<pANTLR3_BASE_TREE>& TreeBuilder::build(const Recogniser::Result& result,
                                                          ErrorNodes& errors) {
-    steps_.reserve(256);
+    steps_.clear();
     openScope(Mark::None, recogniser_.startOf(result.entry));
     expand(result.entry, result.endState, result.low, result.high, result.high);
     std::uint32_t ended = result.high;

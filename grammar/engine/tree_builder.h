@@ -14,6 +14,9 @@ class TreeBuilder {
     /// `tokens` are the on-channel tokens that the recogniser saw, without end of file.
     TreeBuilder(const GrammarTable& grammar, const Recogniser& recogniser,
                 const std::vector<pANTLR3_COMMON_TOKEN>& tokens, pANTLR3_BASE_TREE_ADAPTOR adaptor);
+    ~TreeBuilder();
+    TreeBuilder(const TreeBuilder&) = delete;
+    TreeBuilder& operator=(const TreeBuilder&) = delete;
 
     /// What stands in the place of a part that was skipped; asked once for each such part.
     struct ErrorNodes {
@@ -47,6 +50,8 @@ class TreeBuilder {
         std::uint32_t stepsBase;
     };
 
+    /// The steps of a thread's last tree, kept for its next one like the vectors of a search.
+    static std::vector<Step>& spareSteps();
     void expand(std::uint32_t entry, std::uint32_t endState, std::uint32_t low, std::uint32_t high,
                 std::uint32_t exact);
     void locate(std::uint32_t from, std::uint32_t exact);
