@@ -81,7 +81,7 @@ std::vector<Piece> piecesOf(const SelectItem& item, const NameQuery& nameQuery) 
     std::vector<const SelectItem*> operands(item.m_items.begin(), item.m_items.end());
     Text directions;
     while (!operands.empty() && isDirection(*operands.back())) {
-        directions = u" " + Text(operands.back()->m_text.View()) + directions;
+        directions.insert(0, u" " + Text(operands.back()->m_text.View()));
         operands.pop_back();
     }
     const ItemClass itemClass = classOf(item);
