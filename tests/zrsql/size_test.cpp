@@ -18,9 +18,24 @@ std::string manyTerms() {
     return text;
 }
 
+std::string nestedQueries(int depth) {
+    std::string text, end;
+    for (int level = 0; level < depth; ++level) {
+        text += "SELECT a FROM t WHERE x IN (";
+        end += ')';
+    }
+    return text + "1" + end;
+}
+
+int countOf(const std::string& wanted, const std::string& text) {
+    int count = 0;
+    for (std::size_t at = 0; (at = text.find(wanted, at)) != std::string::npos; ++at) ++count;
+    return count;
+}
+
 // Runs with a machine stack of 256 KB.
-ProgramResult runOnSmallStack(const std::string& arguments) {
-    const TemporaryFile file(manyTerms());
+ProgramResult runOnSmallStack(const std::string& arguments, const std::string& text = manyTerms()) {
+    const TemporaryFile file(text);
     return runShell("ulimit -s 256; build/release/bin/zrsql " + arguments + " -f " + file.path());
 }
 
@@ -28,10 +43,9 @@ TEST(LongChain, HasAllItsNodesInEveryFormOfTheTree) {
     for (const char* format : {"sexpr", "json", "dot", "pretty"}) {
         const auto result = runOnSmallStack(std::string("tree -d mssql --format ") + format);
         EXPECT_EQ(result.exitStatus, 0) << format << result.errors;
-        int count = 0;
-        for (std::size_t at = 0; (at = result.output.find("SEARCH_CONDITION", at)) != std::string::npos; ++at)
-            ++count;
-        EXPECT_EQ(count, format == std::string("json") ? 2 * kTerms : kTerms) << format;
+        EXPECT_EQ(countOf("SEARCH_CONDITION", result.output),
+                  format == std::string("json") ? 2 * kTerms : kTerms)
+            << format;
     }
 }
 
@@ -43,10 +57,20 @@ TEST(LongChain, IsAnalysedWhole) {
     for (const char* format : {"json", "pretty"}) {
         const auto result = runOnSmallStack(std::string("analyze -d mssql --format ") + format);
         EXPECT_EQ(result.exitStatus, 0) << format << result.errors;
-        int count = 0;
-        for (std::size_t at = 0; (at = result.output.find("AND", at)) != std::string::npos; ++at) ++count;
-        EXPECT_GE(count, kTerms - 1) << format;
+        EXPECT_GE(countOf("AND", result.output), kTerms - 1) << format;
     }
+}
+
+TEST(DeepNesting, IsAnalysedWhole) {
+    const std::string text = nestedQueries(10000);
+    EXPECT_EQ(countOf("\"m_query\"", runOnSmallStack("analyze -d mssql", text).output), 9999);
+    EXPECT_EQ(countOf("\nQuery ", runOnSmallStack("analyze -d mssql --format pretty", text).output), 9999);
+}
+
+TEST(DeepNesting, BeyondTheLimitIsARecognitionError) {
+    const auto result = runOnSmallStack("tree -d mssql", nestedQueries(100000));
+    EXPECT_EQ(result.exitStatus, 0);
+    EXPECT_EQ(result.output, "(0 \"Tree Error Node\")\n");
 }
 
 }  // namespace
