@@ -34,7 +34,7 @@ class ZR_API CZRAliasInfo : public CZRSourceFildInfo {
     CString GetAliasField() const { return AliasField; }
     void SetAliasField(CString value) { AliasField = std::move(value); }
 
-   private:
+ private:
     friend class zr::DescriptorCopier;
     // Leaves the expression out.
     CZRAliasInfo(const CZRAliasInfo& other, const zr::ShallowCopy&);
