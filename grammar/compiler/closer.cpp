@@ -148,7 +148,6 @@ std::string checkRuns(const Program& p, const Facts& facts, int closer) {
                     return "a rule can start with it";
                 if (facts.nullable[static_cast<std::size_t>(n.arg)] && !n.nonEmpty)
                     return "a rule that can be empty follows it";
-                if (n.nonEmpty) break;
                 break;
             case Op::Choice:
                 for (std::size_t a = 0; a < n.targets.size(); ++a) {

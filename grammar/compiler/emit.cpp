@@ -36,8 +36,6 @@ std::string lexerEntry(const LexRule& rule) {
 
 /// Rule names that are words of C or C++ get an underscore as context members.
 std::string parserEntry(const std::string& rule) {
-    static const std::set<std::string> words{"union", "for",    "by",   "and", "or",
-                                             "not",   "option", "free", "test"};
     static const std::set<std::string> reserved{"union", "for", "and", "or", "not", "free"};
     return reserved.count(rule) ? rule + "_" : rule;
 }

@@ -39,10 +39,7 @@ std::uint32_t TreeBuilder::runEndOf(std::uint32_t position) const {
 
 /// Writes the path of one entry's end out as steps: the states tell the branches, what lies between two of
 /// them is told by the nodes themselves.
-void TreeBuilder::expand(std::uint32_t entry, std::uint32_t endState, std::uint32_t low, std::uint32_t high,
-                         std::uint32_t exact) {
-    (void)low;
-    (void)high;
+void TreeBuilder::expand(std::uint32_t entry, std::uint32_t endState, std::uint32_t exact) {
     path_.clear();
     for (std::uint32_t s = endState; s != Recogniser::kNone; s = recogniser_.state(s).before)
         path_.push_back(s);
@@ -183,9 +180,8 @@ const std::vector<pANTLR3_BASE_TREE>& TreeBuilder::build(const Recogniser::Resul
                                                          ErrorNodes& errors) {
     steps_.clear();
     openScope(Mark::None, recogniser_.startOf(result.entry));
-    expand(result.entry, result.endState, result.low, result.high, result.high);
-    std::uint32_t ended = result.high;
-    std::vector<std::uint32_t> endsAt{ended};
+    expand(result.entry, result.endState, result.high);
+    std::vector<std::uint32_t> endsAt{result.high};
     while (!frames_.empty()) {
         Frame& frame = frames_.back();
         if (frame.nextStep == frame.stepsEnd) {
@@ -226,7 +222,7 @@ const std::vector<pANTLR3_BASE_TREE>& TreeBuilder::build(const Recogniser::Resul
                     break;
                 }
                 endsAt.push_back(step.high);
-                expand(step.child, end.state, end.low, end.high, step.high);
+                expand(step.child, end.state, step.high);
                 break;
             }
             default:

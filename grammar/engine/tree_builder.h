@@ -52,8 +52,7 @@ class TreeBuilder {
 
     /// The steps of a thread's last tree, kept for its next one like the vectors of a search.
     static std::vector<Step>& spareSteps();
-    void expand(std::uint32_t entry, std::uint32_t endState, std::uint32_t low, std::uint32_t high,
-                std::uint32_t exact);
+    void expand(std::uint32_t entry, std::uint32_t endState, std::uint32_t exact);
     void locate(std::uint32_t from, std::uint32_t exact);
     void token(const Step& step);
     void openScope(Mark mark, std::uint32_t at);
