@@ -447,7 +447,8 @@ void findTailLoops(Program& p, const ParserGrammar& grammar, const Facts& facts)
     for (const TailLoop& loop : p.tailLoops) without.push_back(firstWithout(p, facts, loop.node));
     for (Node& n : p.nodes) {
         if (n.op != Op::Call) continue;
-        CallContext context{{}, p.nodes[index(n.run)].canEnd, closing[index(n.run)]};
+        const Node& behind = p.nodes[index(n.run)];
+        CallContext context{{}, behind.first, behind.canEnd, closing[index(n.run)]};
         for (std::size_t l = 0; l < p.tailLoops.size(); ++l) {
             std::set<int> other;
             for (int token : without[l][index(n.run)])
@@ -473,8 +474,10 @@ void tokenClasses(Program& p, const Facts& facts, int maxToken) {
     sets.push_back(&facts.openers);
     for (const Node& n : p.nodes)
         if (n.tailLoop >= 0) sets.push_back(&n.roundFirst);
-    for (const auto& c : p.contexts)
+    for (const auto& c : p.contexts) {
         for (const auto& s : c.other) sets.push_back(&s);
+        sets.push_back(&c.any);
+    }
     for (const Node& n : p.nodes)
         if (n.op == Op::Choice)
             for (int t : n.targets) sets.push_back(&p.nodes[index(t)].first);

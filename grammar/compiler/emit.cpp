@@ -255,8 +255,10 @@ class Emitter {
             }
         }
         std::vector<int> contextSets;
-        for (const CallContext& c : program_.contexts)
+        for (const CallContext& c : program_.contexts) {
             for (const auto& s : c.other) contextSets.push_back(classSet(s));
+            contextSets.push_back(classSet(c.any));
+        }
         const int recoverFollow = classSet(program_.recoverFollow);
 
         std::vector<std::pair<std::size_t, std::size_t>> choices;

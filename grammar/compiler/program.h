@@ -61,11 +61,12 @@ struct TailLoop {
     std::set<int> first;  ///< what a round starts with
 };
 
-/// By tail loop: what something other than that loop can take right behind a Call.
+/// What the rule around a Call can take right behind it.
 struct CallContext {
-    std::vector<std::set<int>> other;
-    bool canEnd;   ///< the rule around the call can end behind it
-    bool closing;  ///< a closer that must stand can come behind it
+    std::vector<std::set<int>> other;  ///< by tail loop: something other than that loop
+    std::set<int> any;                 ///< anything in it
+    bool canEnd;                       ///< the rule around the call can end behind it
+    bool closing;                      ///< a closer that must stand can come behind it
     bool operator==(const CallContext&) const = default;
 };
 

@@ -86,14 +86,17 @@ void Recogniser::index() {
         closers = closers || (table_->closer != 0 && (*types_)[i] == table_->closer);
     }
     classes_[count_] = table_->classOf[0];
+    runEnd_.clear();
     if (closers) {
         runEnd_.resize(count_ + 1);
         runEnd_[count_] = count_;
         for (std::uint32_t i = count_; i-- > 0;)
             runEnd_[i] = (*types_)[i] == table_->closer ? runEnd_[i + 1] : i;
     }
-    candidates_.resize(table_->guardCount);
-    barriers_.resize(table_->guardCount);
+    candidates_.assign(table_->guardCount, {});
+    barriers_.assign(table_->guardCount, {});
+    nextOpener_.clear();
+    openedBefore_.clear();
     entriesAt_.assign(count_ + 1, kNone);
 }
 
@@ -119,19 +122,22 @@ std::uint32_t Recogniser::entryFor(std::uint16_t rule, std::uint32_t position, s
 
 /// The context of what a call runs, from the context of the rule around it.
 std::uint16_t Recogniser::contextOf(std::uint16_t call, std::uint16_t outer) {
-    if (table_->loopCount == 0) return 0;
     const std::size_t slot = static_cast<std::size_t>(outer) * table_->contextCount + call;
     if (slot < contextCache_.size() && contextCache_[slot] != kNone16) return contextCache_[slot];
     Context context;
-    for (std::uint32_t l = 0; l < table_->loopCount; ++l) {
-        const std::uint64_t* set = table_->classSets + table_->contextSets[call * table_->loopCount + l] * 4u;
-        for (std::size_t w = 0; w < 4; ++w) {
-            context.other[l][w] = set[w];
-            if (table_->contextFlags[call] & 1) context.other[l][w] |= contexts_[outer].other[l][w];
-        }
-    }
-    context.closing =
-        (table_->contextFlags[call] & 2) || ((table_->contextFlags[call] & 1) && contexts_[outer].closing);
+    const Context& around = contexts_[outer];
+    const bool inherits = table_->contextFlags[call] & 1;
+    const std::uint16_t* sets = table_->contextSets + call * (table_->loopCount + 1);
+    const auto join = [&](std::uint16_t set, const ClassSet& inherited) {
+        ClassSet joined;
+        for (std::size_t w = 0; w < joined.size(); ++w)
+            joined[w] = table_->classSets[set * 4u + w] | (inherits ? inherited[w] : 0);
+        return joined;
+    };
+    for (std::uint32_t l = 0; l < table_->loopCount; ++l) context.other[l] = join(sets[l], around.other[l]);
+    context.any = join(sets[table_->loopCount], around.any);
+    context.closing = (table_->contextFlags[call] & 2) || (inherits && around.closing);
+    context.mayEnd = inherits && around.mayEnd;
     const auto found = std::find(contexts_.begin(), contexts_.end(), context);
     const auto id = static_cast<std::uint16_t>(found - contexts_.begin());
     if (found == contexts_.end()) {
@@ -208,20 +214,61 @@ void Recogniser::growVisitTable() {
     }
 }
 
-/// Adds an end, unless nobody around the entry could go on from it.
+/// Whether somebody around the entry could go on from an end of it, or the target is reached. The place of an
+/// end where nobody needs a token more is noted: a reading gets that far.
+bool Recogniser::isOpenEnd(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped) {
+    // Whether an empty end counts is for those around to say; a search with few ends keeps what it has.
+    if (high == entry.position || endsEach_ != 0) return true;
+    // The recover rule may take what nothing else could.
+    if (recovering_ && (recoverPlace_ == kNone || high <= recoverPlace_)) return true;
+    const Context& context = contexts_[entry.context];
+    const auto contains = [](const ClassSet& set, std::uint32_t cls) {
+        return ((set[cls / 64] >> (cls % 64)) & 1) != 0;
+    };
+    if (context.mayEnd) {
+        furthest_ = std::max(furthest_, high);
+        if (high == count_) return true;
+    }
+    const std::uint32_t cls = classes_[high];
+    const bool takesCloser = low != high && contains(context.any, table_->classOf[table_->closer]);
+    if (!takesCloser && !contains(context.any, cls)) return false;
+    if (stopped == 0 || (low != high && context.closing)) return true;
+    // Where a tail loop stopped early, only something else than that loop may take the next token.
+    for (std::uint32_t l = 0; l < table_->loopCount; ++l)
+        if (((stopped >> l) & 1) && !contains(context.other[l], cls)) return false;
+    return true;
+}
+
+/// Whether an earlier end of the entry serves for all that this one could. How many closers were taken already
+/// only matters to those around who must take one, each for a parenthesis that it opened before the entry: while
+/// as many are left in the run, only how far the optional ones can reach counts.
+bool Recogniser::isCovered(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped) {
+    constexpr int kLooked = 8;  // nearly always the first
+    if (entry.firstEnd == kNone || runEnd_.empty()) return false;
+    std::uint32_t at = entry.firstEnd;
+    for (int i = 0; i < kLooked && at != kNone; ++i, at = ends_[at].next) {
+        const End& end = ends_[at];
+        if (end.high == high && (end.stopped & ~stopped) == 0 && runEnd_[low] == runEnd_[end.low] &&
+            runEnd_[low] - end.low >= openedBefore(entry.position))
+            return true;
+    }
+    return false;
+}
+
+std::uint32_t Recogniser::openedBefore(std::uint32_t position) {
+    if (openedBefore_.empty()) {
+        openedBefore_.resize(count_ + 1);
+        for (std::uint32_t i = 0; i < count_; ++i)
+            openedBefore_[i + 1] = openedBefore_[i] + ((*types_)[i] == table_->leftParen ? 1 : 0);
+    }
+    return openedBefore_[position];
+}
+
+/// Adds an end, unless nobody could go on from it.
 bool Recogniser::addEnd(std::uint32_t entryIndex, std::uint32_t low, std::uint32_t high, std::uint32_t state,
                         std::uint8_t stopped) {
     Entry& entry = entries_[entryIndex];
-    if (stopped != 0 && (wholeText_ || high < floor_) && (low == high || !contexts_[entry.context].closing)) {
-        // Where a tail loop stopped early, only something else than that loop may take the next token.
-        for (std::uint32_t l = 0; l < table_->loopCount; ++l) {
-            if (!((stopped >> l) & 1)) continue;
-            const std::uint32_t cls = classes_[high];
-            if ((contexts_[entry.context].other[l][cls / 64] >> (cls % 64)) & 1) continue;
-            leftOut_ = std::max(leftOut_, high + 1);
-            return false;
-        }
-    }
+    if (!isOpenEnd(entry, low, high, stopped) || isCovered(entry, low, high, stopped)) return false;
     const auto made = static_cast<std::uint32_t>(ends_.size());
     ends_.push_back({low, high, state, stopped, kNone});
     if (entry.firstEnd == kNone)
@@ -439,11 +486,12 @@ bool Recogniser::recover(std::uint32_t entryIndex) {
     Entry& entry = entries_[entryIndex];
     if (!entry.mayRecover || entry.firstEnd != kNone) return false;
     std::uint32_t at = entry.position, depth = 0;
-    for (; at < count_; ++at) {
-        if (depth == 0 && inSet(table_->recoverFollowSet, classes_[at])) break;
+    for (; at < types_->size(); ++at) {
+        if (depth == 0 && inSet(table_->recoverFollowSet, table_->classOf[(*types_)[at]])) break;
         if ((*types_)[at] == table_->leftParen) ++depth;
         if ((*types_)[at] == table_->rightParen && depth > 0) --depth;
     }
+    if (at > count_) return false;
     entry.recovered = true;
     return addEnd(entryIndex, at, at, kNone, 0);
 }
@@ -459,6 +507,7 @@ void Recogniser::reset() {
     visitTable_.clear();
     visitTableUsed_ = 0;
     steps_ = 0;
+    furthest_ = 0;
 }
 
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
@@ -467,42 +516,50 @@ Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t positio
     search(rule, position);
     reset();
     recoverPlace_ = recoverAskedAt_;
-    return search(rule, position);
+    return run(rule, position);
+}
+
+/// A first search looks for a reading of the whole text, which leaves much out, and notes how far readings get.
+/// Where there is none, the text is taken to end at the furthest of these places.
+Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
+    Result result = search(rule, position);
+    if (result.overLimit || (result.found && result.high == count_)) return result;
+    const bool cut = result.overBudget;
+    if (cut) {
+        result = narrowSearch(rule, position);
+        if (result.found && result.high == count_) return result;
+    }
+    if (furthest_ <= position) return result;
+    const std::uint64_t spent = steps_;
+    count_ = furthest_;
+    index();
+    reset();
+    result = search(rule, position);
+    if (result.overBudget) result = narrowSearch(rule, position);
+    result.overBudget = result.overBudget || cut;
+    steps_ += spent;
+    return result;
 }
 
 /// Past the budget a search with few ends for each entry, which is linear, may still come further.
-Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
+Recogniser::Result Recogniser::narrowSearch(std::uint16_t rule, std::uint32_t position) {
     constexpr std::uint8_t kFewEnds = 4;
-    const Result result = exact(rule, position);
-    if (!result.overBudget || (result.found && result.high == count_)) return result;
-    Recogniser narrow(*table_, *types_, *options_);
-    narrow.endsEach_ = kFewEnds;
-    narrow.wholeText_ = true;
-    Result other = narrow.search(rule, position);
-    if (!other.found || (result.found && other.high <= result.high)) return result;
-    other.overBudget = true;
-    *this = std::move(narrow);
-    return other;
-}
-
-/// First only what could read the whole text is looked at, which leaves much out; what was left out matters
-/// again when the whole text can't be read.
-Recogniser::Result Recogniser::exact(std::uint16_t rule, std::uint32_t position) {
-    wholeText_ = true;
-    Result result = search(rule, position);
-    if (leftOut_ == 0 || result.overLimit || (result.found && leftOut_ <= result.high)) return result;
-    if (result.found && result.high == count_) return result;
+    const std::uint32_t furthest = furthest_;
     const std::uint64_t spent = steps_;
     reset();
-    steps_ = spent;
-    wholeText_ = false;
-    floor_ = result.found ? result.high : 0;
-    return search(rule, position);
+    endsEach_ = kFewEnds;
+    Result result = search(rule, position);
+    endsEach_ = 0;
+    result.overBudget = true;
+    steps_ += spent;
+    furthest_ = std::max(furthest, result.found ? result.high : 0);
+    return result;
 }
 
 Recogniser::Result Recogniser::search(std::uint16_t rule, std::uint32_t position) {
     Result result;
     contexts_.assign(1, Context{});
+    contexts_[0].mayEnd = true;
     contextCache_.assign(table_->contextCount, kNone16);
     result.entry = entryFor(rule, position, 0);
     chain_.assign(1, result.entry);

@@ -107,10 +107,14 @@ class Recogniser {
         std::uint8_t stopped;
     };
 
-    /// What a caller's surroundings can take, by tail loop: entries of one rule at one place differ by it.
+    using ClassSet = std::array<std::uint64_t, 4>;
+
+    /// What a caller's surroundings can do behind it: entries of one rule at one place differ by it.
     struct Context {
-        std::array<std::array<std::uint64_t, 4>, 8> other{};
-        bool closing = false;  ///< a closer that must stand may come next
+        std::array<ClassSet, 8> other{};  ///< by tail loop: what something else than the loop can take
+        ClassSet any{};                   ///< what anything of it can take
+        bool closing = false;             ///< a closer that must stand may come next
+        bool mayEnd = false;              ///< all of it can end without a token more
         bool operator==(const Context&) const = default;
     };
 
@@ -124,7 +128,10 @@ class Recogniser {
     void index();
     std::uint32_t entryFor(std::uint16_t rule, std::uint32_t position, std::uint16_t context);
     std::uint16_t contextOf(std::uint16_t call, std::uint16_t outer);
-    Result exact(std::uint16_t rule, std::uint32_t position);
+    bool isOpenEnd(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped);
+    bool isCovered(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped);
+    std::uint32_t openedBefore(std::uint32_t position);
+    Result narrowSearch(std::uint16_t rule, std::uint32_t position);
     Result search(std::uint16_t rule, std::uint32_t position);
     void pushFrame(Entry& entry, Frame frame);
     void popFrame(Entry& entry);
@@ -172,6 +179,7 @@ class Recogniser {
     std::vector<std::vector<std::uint32_t>> candidates_;  ///< by guard: next position that could satisfy it
     std::vector<std::vector<std::uint32_t>> barriers_;    ///< by guard: next position outside
     std::vector<std::uint32_t> nextOpener_;
+    std::vector<std::uint32_t> openedBefore_;  ///< by position: opening parentheses ahead of it; made when needed
     std::vector<std::uint32_t> entriesAt_;
     std::vector<Entry> entries_;
     std::vector<End> ends_;
@@ -183,11 +191,8 @@ class Recogniser {
     std::uint32_t visitTableUsed_ = 0;
     std::vector<std::uint32_t> chain_;
     std::uint64_t steps_ = 0;
-    bool wholeText_ = false;  ///< only readings of the whole text count
-    std::uint32_t leftOut_ =
-        0;  ///< one past the furthest end left out since only a shorter reading could use it
-    std::uint8_t endsEach_ = 0;  ///< ends that an entry may have, 0 for any number
-    std::uint32_t floor_ = 0;    ///< a reading up to here is known: shorter ones don't count
+    std::uint32_t furthest_ = 0;  ///< the furthest place where the search met a reading that could end
+    std::uint8_t endsEach_ = 0;   ///< ends that an entry may have, 0 for any number
     std::vector<Context> contexts_;
     std::vector<std::uint16_t> contextCache_;  ///< by context and call context
     bool recovering_ = false;

@@ -7,7 +7,7 @@
 /// engine never runs tables of another layout.
 namespace zr::engine {
 
-constexpr std::uint32_t kTableVersion = 3;
+constexpr std::uint32_t kTableVersion = 4;
 
 constexpr std::uint16_t kNone16 = 0xFFFF;
 
@@ -133,8 +133,9 @@ struct ParserTable {
     /// [rule * classes + class of the first token]: class set of what can come second, kNone16 for anything.
     const std::uint16_t* seconds;
     std::uint32_t loopCount;  ///< tail loops, at most 8
-    // By call context: for each tail loop the class set of what something else than the loop can take there;
-    // and whether the rule around the call can end behind it (1) and a closer that must stand can come (2).
+    // By call context: for each tail loop the class set of what something else than the loop can take there,
+    // then that of what anything of the rule around the call can take; and whether that rule can end behind
+    // the call (1) and a closer that must stand can come (2).
     const std::uint16_t* contextSets;
     const std::uint8_t* contextFlags;
     std::uint32_t contextCount;
