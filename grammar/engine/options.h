@@ -10,10 +10,14 @@ namespace zr::engine {
 struct Options {
     /// Rules at work inside each other. A parenthesis costs about four, a sub-query about ten.
     std::uint32_t maxDepth = 200000;
-    /// Search steps for a text that can't be read to its end: a fixed part and a part for each token. Text
-    /// that is read to its end never comes near it.
-    std::uint64_t baseSteps = 200000;
-    std::uint64_t stepsPerToken = 600;
+    /// Steps of the search that tries one reading behind the other: a fixed part and a part for each token.
+    /// Nearly all text that is read to its end needs less than a tenth of it.
+    std::uint64_t baseSteps = 4000;
+    std::uint64_t stepsPerToken = 64;
+    /// Steps of the search that takes over then. Past them the furthest reading of a last, narrow search
+    /// stands, and a notice goes to the diagnostics.
+    std::uint64_t fullBaseSteps = 20000000;
+    std::uint64_t fullStepsPerToken = 4000;
     /// Tokens of one text.
     std::uint32_t maxTokens = 20000000;
 };

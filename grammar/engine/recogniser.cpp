@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <bit>
 
+#include "grammar/engine/full_search.h"
+
 namespace zr::engine {
 namespace {
 
@@ -28,9 +30,9 @@ bool isZeroWidth(Op op) {
 
 Recogniser::Recogniser(const ParserTable& table, const std::vector<std::uint16_t>& types,
                        const Options& options)
-    : table_(&table), options_(&options), types_(&types), count_(static_cast<std::uint32_t>(types.size())) {
+    : table_(&table), options_(&options), text_(table, types) {
     exchange(spare());
-    index();
+    entriesAt_.assign(text_.count() + 1, kNone);
 }
 
 struct Recogniser::Spare {
@@ -73,31 +75,6 @@ Recogniser::~Recogniser() {
     mine.frames.clear();
     mine.visits.clear();
     std::swap(kept, mine);
-}
-
-/// One pass over the tokens for everything that later questions need in constant time.
-void Recogniser::index() {
-    classes_.resize(count_ + 1);
-    lastOf_.assign(table_->maxToken + 1, 0);
-    bool closers = false;
-    for (std::uint32_t i = 0; i < count_; ++i) {
-        classes_[i] = table_->classOf[(*types_)[i]];
-        lastOf_[(*types_)[i]] = i + 1;
-        closers = closers || (table_->closer != 0 && (*types_)[i] == table_->closer);
-    }
-    classes_[count_] = table_->classOf[0];
-    runEnd_.clear();
-    if (closers) {
-        runEnd_.resize(count_ + 1);
-        runEnd_[count_] = count_;
-        for (std::uint32_t i = count_; i-- > 0;)
-            runEnd_[i] = (*types_)[i] == table_->closer ? runEnd_[i + 1] : i;
-    }
-    candidates_.assign(table_->guardCount, {});
-    barriers_.assign(table_->guardCount, {});
-    nextOpener_.clear();
-    openedBefore_.clear();
-    entriesAt_.assign(count_ + 1, kNone);
 }
 
 std::uint32_t Recogniser::addState(std::uint16_t node, std::uint32_t low, std::uint32_t high,
@@ -227,9 +204,9 @@ bool Recogniser::isOpenEnd(const Entry& entry, std::uint32_t low, std::uint32_t 
     };
     if (context.mayEnd) {
         furthest_ = std::max(furthest_, high);
-        if (high == count_) return true;
+        if (high == text_.count()) return true;
     }
-    const std::uint32_t cls = classes_[high];
+    const std::uint32_t cls = text_.classAt(high);
     const bool takesCloser = low != high && contains(context.any, table_->classOf[table_->closer]);
     if (!takesCloser && !contains(context.any, cls)) return false;
     if (stopped == 0 || (low != high && context.closing)) return true;
@@ -239,29 +216,20 @@ bool Recogniser::isOpenEnd(const Entry& entry, std::uint32_t low, std::uint32_t 
     return true;
 }
 
-/// Whether an earlier end of the entry serves for all that this one could. How many closers were taken already
-/// only matters to those around who must take one, each for a parenthesis that it opened before the entry: while
-/// as many are left in the run, only how far the optional ones can reach counts.
+/// Whether an earlier end of the entry serves for all that this one could. How many closers were taken
+/// already only matters to those around who must take one, each for a parenthesis that it opened before the
+/// entry: while as many are left in the run, only how far the optional ones can reach counts.
 bool Recogniser::isCovered(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped) {
     constexpr int kLooked = 8;  // nearly always the first
-    if (entry.firstEnd == kNone || runEnd_.empty()) return false;
+    if (entry.firstEnd == kNone) return false;
     std::uint32_t at = entry.firstEnd;
     for (int i = 0; i < kLooked && at != kNone; ++i, at = ends_[at].next) {
         const End& end = ends_[at];
-        if (end.high == high && (end.stopped & ~stopped) == 0 && runEnd_[low] == runEnd_[end.low] &&
-            runEnd_[low] - end.low >= openedBefore(entry.position))
+        if (end.high == high && (end.stopped & ~stopped) == 0 && text_.runEnd(low) == text_.runEnd(end.low) &&
+            text_.runEnd(low) - end.low >= text_.openedBefore(entry.position))
             return true;
     }
     return false;
-}
-
-std::uint32_t Recogniser::openedBefore(std::uint32_t position) {
-    if (openedBefore_.empty()) {
-        openedBefore_.resize(count_ + 1);
-        for (std::uint32_t i = 0; i < count_; ++i)
-            openedBefore_[i + 1] = openedBefore_[i] + ((*types_)[i] == table_->leftParen ? 1 : 0);
-    }
-    return openedBefore_[position];
 }
 
 /// Adds an end, unless nobody could go on from it.
@@ -280,63 +248,6 @@ bool Recogniser::addEnd(std::uint32_t entryIndex, std::uint32_t low, std::uint32
     return true;
 }
 
-/// A token that isn't the closer can only be taken where the run of closers is over, so an undecided position
-/// becomes that one, if it is among the possible ones.
-bool Recogniser::settle(std::uint32_t& low, std::uint32_t& high) const {
-    if (low == high) return true;
-    if (high != runEnd(low)) return false;
-    low = high;
-    return true;
-}
-
-std::uint32_t Recogniser::viable(const NodeRow& node, std::uint32_t low, std::uint32_t high) const {
-    const std::uint32_t* masks = table_->choiceMask + static_cast<std::size_t>(node.arg) * table_->classes;
-    if (low == high) return masks[classes_[low]];
-    std::uint32_t mask = masks[table_->classOf[table_->closer]];
-    if (high == runEnd(low)) mask |= masks[classes_[high]];
-    return mask;
-}
-
-/// Whether the text still holds what the call and the part behind it can't do without. A cheap "no" here
-/// saves the search of an alternative that was never going to work, such as an alias behind every column.
-bool Recogniser::guarded(const NodeRow& node, std::uint32_t position) {
-    if (node.required != 0 && lastOf_[node.required] <= position) return false;
-    if (node.guard == kNone16 || position >= count_) return true;
-    const GuardRow& guard = table_->guards[node.guard];
-    std::vector<std::uint32_t>& candidates = candidates_[node.guard];
-    std::vector<std::uint32_t>& barriers = barriers_[node.guard];
-    if (candidates.empty()) {
-        candidates.resize(count_ + 1);
-        barriers.resize(count_ + 1);
-        candidates[count_] = kNone;
-        barriers[count_] = count_;
-        for (std::uint32_t i = count_; i-- > 0;) {
-            const bool here = i > 0 && inSet(guard.follow, classes_[i]) && inSet(guard.last, classes_[i - 1]);
-            candidates[i] = here ? i : candidates[i + 1];
-            barriers[i] = inSet(guard.outside, classes_[i]) ? barriers[i + 1] : i;
-        }
-    }
-    const std::uint32_t candidate = candidates[position + 1];
-    if (candidate == kNone) return false;
-    if (nextOpener_.empty()) {
-        nextOpener_.resize(count_ + 1);
-        nextOpener_[count_] = count_ + 2;
-        for (std::uint32_t i = count_; i-- > 0;)
-            nextOpener_[i] = inSet(table_->openerSet, classes_[i]) ? i : nextOpener_[i + 1];
-    }
-    const std::uint32_t barrier = barriers[position];
-    return candidate <= barrier || nextOpener_[position] <= barrier + 1;
-}
-
-/// What a branch does to the record of tail loops that stopped: leaving one although a round could start is
-/// noted.
-std::uint8_t Recogniser::afterBranch(const NodeRow& node, std::uint32_t branch, std::uint32_t low,
-                                     std::uint32_t high, std::uint8_t stopped) const {
-    if (node.context == kNone16 || branch == 0 || high != runEnd(low)) return stopped;
-    if (!inSet(node.guard, classes_[high])) return stopped;
-    return static_cast<std::uint8_t>(stopped | (1u << node.context));
-}
-
 /// Follows one path until it ends, fails, or comes to a call: the call is left as a frame for resume().
 bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32_t low, std::uint32_t high,
                          std::uint32_t state, std::uint8_t stopped) {
@@ -346,17 +257,20 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
         if ((node.flags & kMerge) && !enterOnce(entryIndex, at, low, high, stopped)) return false;
         switch (node.op) {
             case Op::Token:
-                if (!settle(low, high) || low >= count_ || (*types_)[low] != node.arg) return false;
+                if (!text_.settle(low, high) || low >= text_.count() || text_.type(low) != node.arg)
+                    return false;
                 high = ++low;
                 stopped = 0;
                 break;
             case Op::Set:
-                if (!settle(low, high) || low >= count_ || !inSet(node.arg, classes_[low])) return false;
+                if (!text_.settle(low, high) || low >= text_.count() ||
+                    !text_.inSet(node.arg, text_.classAt(low)))
+                    return false;
                 high = ++low;
                 stopped = 0;
                 break;
             case Op::Hard: {
-                const std::uint32_t run = runEnd(low);
+                const std::uint32_t run = text_.runEnd(low);
                 if (low == run) return false;
                 ++low;
                 high = std::min(high + 1, run);
@@ -364,14 +278,14 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                 break;
             }
             case Op::Soft:
-                high = std::min(high + 1, runEnd(low));
+                high = std::min(high + 1, text_.runEnd(low));
                 break;
             case Op::SoftStar:
-                high = runEnd(low);
+                high = text_.runEnd(low);
                 break;
             case Op::Choice: {
                 const ChoiceRow& choice = table_->choices[node.arg];
-                std::uint32_t mask = viable(node, low, high);
+                std::uint32_t mask = text_.viable(node, low, high);
                 // The part that recovery replaces starts with none of its tokens: look at every way to it.
                 if (recoversIn(entryIndex))
                     mask = static_cast<std::uint32_t>((std::uint64_t{1} << choice.count) - 1);
@@ -384,25 +298,25 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                     pushFrame(entries_[entryIndex],
                               {kNone, low, high, state, kNone, kNone, mask, at, stopped});
                 state = addState(target, low, high, state, kNone, kNone);
-                stopped = afterBranch(node, branch, low, high, stopped);
+                stopped = text_.stoppedAfter(node, branch, low, high, stopped);
                 at = isZeroWidth(table_->nodes[target].op) ? table_->nodes[target].run : target;
                 continue;
             }
             case Op::Call: {
                 const RuleRow& rule = table_->rules[node.arg];
                 const bool recoverable = node.arg == table_->recoverRule && recoversIn(entryIndex);
-                if (!settle(low, high)) {
+                if (!text_.settle(low, high)) {
                     if (!recoverable) return false;
                     // The parentheses that are left over are among what recovery skips.
                     low = high;
                 }
-                if (!recoverable && !inSet(table_->firstSetBase + node.arg, classes_[low]) &&
+                if (!recoverable && !text_.inSet(table_->firstSetBase + node.arg, text_.classAt(low)) &&
                     (!rule.nullable || (node.flags & kNonEmpty)))
                     return false;
                 if (!recovering_ && !(rule.nullable && !(node.flags & kNonEmpty)) &&
-                    !secondFits(node.arg, low))
+                    !text_.secondFits(node.arg, low))
                     return false;
-                if (!recoverable && !guarded(node, low)) return false;
+                if (!recoverable && !text_.guarded(node, low)) return false;
                 const std::uint32_t child =
                     entryFor(node.arg, low, contextOf(node.context, entries_[entryIndex].context));
                 if (recoverable) {
@@ -454,7 +368,7 @@ Recogniser::Outcome Recogniser::resume(std::uint32_t entryIndex, std::uint32_t& 
             const std::uint32_t state = addState(target, taken.low, taken.high, taken.state, kNone, kNone);
             const NodeRow& next = table_->nodes[target];
             if (forward(entryIndex, isZeroWidth(next.op) ? next.run : target, taken.low, taken.high, state,
-                        afterBranch(node, branch, taken.low, taken.high, taken.stopped)))
+                        text_.stoppedAfter(node, branch, taken.low, taken.high, taken.stopped)))
                 return Outcome::Yielded;
             continue;
         }
@@ -485,19 +399,14 @@ Recogniser::Outcome Recogniser::resume(std::uint32_t entryIndex, std::uint32_t& 
 bool Recogniser::recover(std::uint32_t entryIndex) {
     Entry& entry = entries_[entryIndex];
     if (!entry.mayRecover || entry.firstEnd != kNone) return false;
-    std::uint32_t at = entry.position, depth = 0;
-    for (; at < types_->size(); ++at) {
-        if (depth == 0 && inSet(table_->recoverFollowSet, table_->classOf[(*types_)[at]])) break;
-        if ((*types_)[at] == table_->leftParen) ++depth;
-        if ((*types_)[at] == table_->rightParen && depth > 0) --depth;
-    }
-    if (at > count_) return false;
+    const std::uint32_t at = skippedTo(*table_, text_, entry.position);
+    if (at > text_.count()) return false;
     entry.recovered = true;
     return addEnd(entryIndex, at, at, kNone, 0);
 }
 
 void Recogniser::reset() {
-    entriesAt_.assign(count_ + 1, kNone);
+    entriesAt_.assign(text_.count() + 1, kNone);
     entries_.clear();
     ends_.clear();
     states_.clear();
@@ -513,38 +422,64 @@ void Recogniser::reset() {
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
     recovering_ = true;
     recoverStart_ = position;
-    search(rule, position);
+    if (search(rule, position).overBudget) {
+        FullSearch full(*table_, text_, *options_, {true, position, kNone});
+        full.run(rule, position);
+        recoverAskedAt_ = full.askedAt();
+    }
     reset();
     recoverPlace_ = recoverAskedAt_;
     return run(rule, position);
 }
 
-/// A first search looks for a reading of the whole text, which leaves much out, and notes how far readings get.
-/// Where there is none, the text is taken to end at the furthest of these places.
+/// A first search looks for a reading of the whole text, which leaves much out, and notes how far readings
+/// get. Where there is none, the text is taken to end at the furthest of these places. Where that asks for
+/// too many steps, the search that never turns back takes over.
 Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
     Result result = search(rule, position);
-    if (result.overLimit || (result.found && result.high == count_)) return result;
-    const bool cut = result.overBudget;
-    if (cut) {
-        result = narrowSearch(rule, position);
-        if (result.found && result.high == count_) return result;
+    if (result.overLimit || (result.found && result.high == text_.count())) return result;
+    if (!result.overBudget) {
+        if (furthest_ <= position) return result;
+        const std::uint64_t spent = steps_;
+        text_.cutAt(furthest_);
+        reset();
+        result = search(rule, position);
+        steps_ += spent;
     }
-    if (furthest_ <= position) return result;
+    return result.overBudget ? fullSearch(rule, position) : result;
+}
+
+Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t position) {
+    FullSearch full(*table_, text_, *options_, {recovering_, recoverStart_, recoverPlace_});
+    const FullSearch::Outcome outcome = full.run(rule, position);
+    steps_ += full.steps();
+    if (outcome == FullSearch::Outcome::OverBudget) return narrowSearch(rule, position);
+    Result result;
+    result.overLimit = outcome == FullSearch::Outcome::TooDeep;
+    if (outcome != FullSearch::Outcome::Found) return result;
     const std::uint64_t spent = steps_;
-    count_ = furthest_;
-    index();
     reset();
-    result = search(rule, position);
-    if (result.overBudget) result = narrowSearch(rule, position);
-    result.overBudget = result.overBudget || cut;
-    steps_ += spent;
+    steps_ = spent;
+    Derivation& derivation = full.derivation();
+    states_ = std::move(derivation.states);
+    ends_ = std::move(derivation.ends);
+    for (const Derivation::Part& part : derivation.parts) {
+        Entry entry;
+        entry.position = part.position;
+        entry.rule = part.rule;
+        entry.recovered = part.recovered;
+        entries_.push_back(entry);
+    }
+    result.found = true;
+    result.entry = 0;
+    result.endState = derivation.endState;
+    result.low = result.high = full.reached();
     return result;
 }
 
-/// Past the budget a search with few ends for each entry, which is linear, may still come further.
+/// Past all budgets a search with few ends for each entry, which is linear, may still come somewhere.
 Recogniser::Result Recogniser::narrowSearch(std::uint16_t rule, std::uint32_t position) {
     constexpr std::uint8_t kFewEnds = 4;
-    const std::uint32_t furthest = furthest_;
     const std::uint64_t spent = steps_;
     reset();
     endsEach_ = kFewEnds;
@@ -552,7 +487,6 @@ Recogniser::Result Recogniser::narrowSearch(std::uint16_t rule, std::uint32_t po
     endsEach_ = 0;
     result.overBudget = true;
     steps_ += spent;
-    furthest_ = std::max(furthest, result.found ? result.high : 0);
     return result;
 }
 
@@ -563,7 +497,9 @@ Recogniser::Result Recogniser::search(std::uint16_t rule, std::uint32_t position
     contextCache_.assign(table_->contextCount, kNone16);
     result.entry = entryFor(rule, position, 0);
     chain_.assign(1, result.entry);
-    const std::uint64_t budget = options_->baseSteps + options_->stepsPerToken * count_;
+    const std::uint64_t budget = endsEach_ != 0
+                                     ? options_->fullBaseSteps + options_->fullStepsPerToken * text_.count()
+                                     : options_->baseSteps + options_->stepsPerToken * text_.count();
     while (!chain_.empty()) {
         std::uint32_t child = kNone;
         const Outcome outcome = resume(chain_.back(), child);
@@ -588,7 +524,7 @@ Recogniser::Result Recogniser::search(std::uint16_t rule, std::uint32_t position
                 result.low = end.low;
                 result.high = end.high;
             }
-            if (result.high == count_) break;
+            if (result.high == text_.count()) break;
         }
         if (steps_ > budget) {
             result.overBudget = true;

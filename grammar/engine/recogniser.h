@@ -4,8 +4,10 @@
 #include <cstdint>
 #include <vector>
 
+#include "grammar/engine/derivation.h"
 #include "grammar/engine/options.h"
 #include "grammar/engine/tables.h"
+#include "grammar/engine/text_index.h"
 
 /// The recogniser: finds, for a rule and a list of tokens, the derivation that the grammar's meaning fixes:
 /// of all that reach furthest the first in written order (docs/recogniser.md tells the idea and its proof).
@@ -18,23 +20,8 @@ namespace zr::engine {
 
 class Recogniser {
  public:
-    /// One end of an entry. Inside a run of closing tokens several ends stand for one: every position from
-    /// `low` to `high` can be the end, and who of the optional closers took which is settled afterwards.
-    struct End {
-        std::uint32_t low, high;
-        std::uint32_t state;   ///< last state of the path that leads here
-        std::uint8_t stopped;  ///< tail loops that stopped here although a round could start
-        std::uint32_t next;    ///< next end of the same entry
-    };
-
-    /// A point of a path that the walk back needs: a branch taken, or a call that came back.
-    struct State {
-        std::uint32_t low, high;
-        std::uint32_t before;  ///< state before it on the path
-        std::uint32_t child;   ///< entry whose end leads here, or kNone for a branch
-        std::uint32_t childEnd;
-        std::uint16_t node;  ///< where the path goes on
-    };
+    using End = PathEnd;
+    using State = PathState;
 
     struct Result {
         bool found = false;
@@ -125,12 +112,11 @@ class Recogniser {
     struct Spare;
     static Spare& spare();
     void exchange(Spare& with);
-    void index();
     std::uint32_t entryFor(std::uint16_t rule, std::uint32_t position, std::uint16_t context);
     std::uint16_t contextOf(std::uint16_t call, std::uint16_t outer);
     bool isOpenEnd(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped);
     bool isCovered(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped);
-    std::uint32_t openedBefore(std::uint32_t position);
+    Result fullSearch(std::uint16_t rule, std::uint32_t position);
     Result narrowSearch(std::uint16_t rule, std::uint32_t position);
     Result search(std::uint16_t rule, std::uint32_t position);
     void pushFrame(Entry& entry, Frame frame);
@@ -141,8 +127,6 @@ class Recogniser {
     Outcome resume(std::uint32_t entry, std::uint32_t& child);
     bool forward(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high,
                  std::uint32_t state, std::uint8_t stopped);
-    std::uint8_t afterBranch(const NodeRow& node, std::uint32_t branch, std::uint32_t low, std::uint32_t high,
-                             std::uint8_t stopped) const;
     bool enterOnce(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high,
                    std::uint8_t stopped);
     bool addEnd(std::uint32_t entry, std::uint32_t low, std::uint32_t high, std::uint32_t state,
@@ -152,34 +136,12 @@ class Recogniser {
         return recovering_ && entries_[entry].position == recoverStart_;
     }
     void reset();
-    bool settle(std::uint32_t& low, std::uint32_t& high) const;
-    std::uint32_t viable(const NodeRow& node, std::uint32_t low, std::uint32_t high) const;
-    bool secondFits(std::uint16_t rule, std::uint32_t position) const {
-        if (position >= count_) return true;
-        const std::uint16_t set = table_->seconds[rule * table_->classes + classes_[position]];
-        return set == kNone16 || inSet(set, classes_[position + 1]);
-    }
-    bool guarded(const NodeRow& node, std::uint32_t position);
     std::uint32_t addState(std::uint16_t node, std::uint32_t low, std::uint32_t high, std::uint32_t before,
                            std::uint32_t child, std::uint32_t childEnd);
-    std::uint32_t runEnd(std::uint32_t position) const {
-        return runEnd_.empty() ? position : runEnd_[position];
-    }
-    bool inSet(std::uint32_t set, std::uint32_t cls) const {
-        return (table_->classSets[set * 4 + cls / 64] >> (cls % 64)) & 1;
-    }
 
     const ParserTable* table_;
     const Options* options_;
-    const std::vector<std::uint16_t>* types_;
-    std::uint32_t count_;
-    std::vector<std::uint8_t> classes_;  ///< by position, the last one for the end of the text
-    std::vector<std::uint32_t> runEnd_;  ///< by position: where the run of closers from here ends
-    std::vector<std::uint32_t> lastOf_;  ///< by token number: one past the last position where it stands
-    std::vector<std::vector<std::uint32_t>> candidates_;  ///< by guard: next position that could satisfy it
-    std::vector<std::vector<std::uint32_t>> barriers_;    ///< by guard: next position outside
-    std::vector<std::uint32_t> nextOpener_;
-    std::vector<std::uint32_t> openedBefore_;  ///< by position: opening parentheses ahead of it; made when needed
+    TextIndex text_;
     std::vector<std::uint32_t> entriesAt_;
     std::vector<Entry> entries_;
     std::vector<End> ends_;

@@ -1,0 +1,111 @@
+#include "grammar/engine/text_index.h"
+
+#include <cstddef>
+
+namespace zr::engine {
+
+TextIndex::TextIndex(const ParserTable& table, const std::vector<std::uint16_t>& types)
+    : table_(&table), types_(&types), count_(static_cast<std::uint32_t>(types.size())) {
+    index();
+}
+
+void TextIndex::cutAt(std::uint32_t count) {
+    count_ = count;
+    index();
+}
+
+void TextIndex::index() {
+    classes_.resize(count_ + 1);
+    lastOf_.assign(table_->maxToken + 1, 0);
+    bool closers = false;
+    for (std::uint32_t i = 0; i < count_; ++i) {
+        classes_[i] = table_->classOf[type(i)];
+        lastOf_[type(i)] = i + 1;
+        closers = closers || isCloser(i);
+    }
+    classes_[count_] = table_->classOf[0];
+    runEnd_.clear();
+    if (closers) {
+        runEnd_.resize(count_ + 1);
+        runEnd_[count_] = count_;
+        for (std::uint32_t i = count_; i-- > 0;) runEnd_[i] = isCloser(i) ? runEnd_[i + 1] : i;
+    }
+    candidates_.assign(table_->guardCount, {});
+    barriers_.assign(table_->guardCount, {});
+    nextOpener_.clear();
+    openedBefore_.clear();
+}
+
+void TextIndex::indexGuard(std::uint16_t number) {
+    const GuardRow& guard = table_->guards[number];
+    std::vector<std::uint32_t>& candidates = candidates_[number];
+    std::vector<std::uint32_t>& barriers = barriers_[number];
+    candidates.resize(count_ + 1);
+    barriers.resize(count_ + 1);
+    candidates[count_] = kNone;
+    barriers[count_] = count_;
+    for (std::uint32_t i = count_; i-- > 0;) {
+        const bool here = i > 0 && inSet(guard.follow, classes_[i]) && inSet(guard.last, classes_[i - 1]);
+        candidates[i] = here ? i : candidates[i + 1];
+        barriers[i] = inSet(guard.outside, classes_[i]) ? barriers[i + 1] : i;
+    }
+    if (!nextOpener_.empty()) return;
+    nextOpener_.resize(count_ + 1);
+    nextOpener_[count_] = count_ + 2;
+    for (std::uint32_t i = count_; i-- > 0;)
+        nextOpener_[i] = inSet(table_->openerSet, classes_[i]) ? i : nextOpener_[i + 1];
+}
+
+bool TextIndex::guarded(const NodeRow& call, std::uint32_t position) {
+    if (call.required != 0 && lastOf_[call.required] <= position) return false;
+    if (call.guard == kNone16 || position >= count_) return true;
+    if (candidates_[call.guard].empty()) indexGuard(call.guard);
+    const std::uint32_t candidate = candidates_[call.guard][position + 1];
+    if (candidate == kNone) return false;
+    const std::uint32_t barrier = barriers_[call.guard][position];
+    return candidate <= barrier || nextOpener_[position] <= barrier + 1;
+}
+
+bool TextIndex::settle(std::uint32_t& low, std::uint32_t& high) const {
+    if (low == high) return true;
+    if (high != runEnd(low)) return false;
+    low = high;
+    return true;
+}
+
+std::uint32_t TextIndex::viable(const NodeRow& choice, std::uint32_t low, std::uint32_t high) const {
+    const std::uint32_t* masks = table_->choiceMask + static_cast<std::size_t>(choice.arg) * table_->classes;
+    if (low == high) return masks[classes_[low]];
+    std::uint32_t mask = masks[table_->classOf[table_->closer]];
+    if (high == runEnd(low)) mask |= masks[classes_[high]];
+    return mask;
+}
+
+std::uint8_t TextIndex::stoppedAfter(const NodeRow& choice, std::uint32_t branch, std::uint32_t low,
+                                     std::uint32_t high, std::uint8_t stopped) const {
+    if (choice.context == kNone16 || branch == 0 || high != runEnd(low)) return stopped;
+    if (!inSet(choice.guard, classes_[high])) return stopped;
+    return static_cast<std::uint8_t>(stopped | (1u << choice.context));
+}
+
+std::uint32_t TextIndex::openedBefore(std::uint32_t position) {
+    if (openedBefore_.empty()) {
+        openedBefore_.resize(count_ + 1);
+        for (std::uint32_t i = 0; i < count_; ++i)
+            openedBefore_[i + 1] = openedBefore_[i] + (type(i) == table_->leftParen ? 1 : 0);
+    }
+    return openedBefore_[position];
+}
+
+std::uint32_t skippedTo(const ParserTable& table, const TextIndex& text, std::uint32_t position) {
+    std::uint32_t depth = 0;
+    for (; position < text.fullCount(); ++position) {
+        const std::uint16_t type = text.type(position);
+        if (depth == 0 && text.inSet(table.recoverFollowSet, table.classOf[type])) break;
+        if (type == table.leftParen) ++depth;
+        if (type == table.rightParen && depth > 0) --depth;
+    }
+    return position;
+}
+
+}  // namespace zr::engine

@@ -1,0 +1,84 @@
+#pragma once
+
+#include <cstdint>
+#include <vector>
+
+#include "grammar/engine/tables.h"
+
+/// What the searches ask about a text, answered in constant time: one pass over the tokens for each kind of
+/// question, made when it is first asked.
+namespace zr::engine {
+
+class TextIndex {
+ public:
+    static constexpr std::uint32_t kNone = 0xFFFFFFFF;
+
+    /// `types` holds the token numbers of the on-channel tokens without end of file; it must outlive this
+    /// object.
+    TextIndex(const ParserTable& table, const std::vector<std::uint16_t>& types);
+
+    /// Takes the text to end at `count`, for all questions from here on.
+    void cutAt(std::uint32_t count);
+
+    std::uint32_t count() const { return count_; }
+    std::uint32_t fullCount() const { return static_cast<std::uint32_t>(types_->size()); }
+    std::uint16_t type(std::uint32_t position) const { return (*types_)[position]; }
+    /// The class of a token, at count() that of the end of the text.
+    std::uint8_t classAt(std::uint32_t position) const { return classes_[position]; }
+    bool isCloser(std::uint32_t position) const {
+        return position < count_ && table_->closer != 0 && type(position) == table_->closer;
+    }
+    /// Where the run of closers that starts at a position ends.
+    std::uint32_t runEnd(std::uint32_t position) const {
+        return runEnd_.empty() ? position : runEnd_[position];
+    }
+    bool inSet(std::uint32_t set, std::uint32_t cls) const {
+        return (table_->classSets[set * 4 + cls / 64] >> (cls % 64)) & 1;
+    }
+
+    /// Whether the second token fits a rule that starts at a position.
+    bool secondFits(std::uint16_t rule, std::uint32_t position) const {
+        if (position >= count_) return true;
+        const std::uint16_t set = table_->seconds[rule * table_->classes + classes_[position]];
+        return set == kNone16 || inSet(set, classes_[position + 1]);
+    }
+    /// Whether the text still holds what a Call and the part behind it can't do without. A cheap "no" here
+    /// saves the search of an alternative that was never going to work, such as an alias behind every column.
+    bool guarded(const NodeRow& call, std::uint32_t position);
+    // A place in the text is an interval: inside a run of closers every position from `low` to `high` can be
+    // it.
+
+    /// A token that isn't the closer can only be taken where the run of closers is over, so an undecided
+    /// place becomes that position, if it is among the possible ones.
+    bool settle(std::uint32_t& low, std::uint32_t& high) const;
+    /// The branches of a Choice that can go on at a place, as bits.
+    std::uint32_t viable(const NodeRow& choice, std::uint32_t low, std::uint32_t high) const;
+    /// What a branch does to the record of tail loops that stopped: leaving one although a round could start
+    /// is noted.
+    std::uint8_t stoppedAfter(const NodeRow& choice, std::uint32_t branch, std::uint32_t low,
+                              std::uint32_t high, std::uint8_t stopped) const;
+
+    /// Opening parentheses ahead of a position.
+    std::uint32_t openedBefore(std::uint32_t position);
+
+ private:
+    void index();
+    void indexGuard(std::uint16_t guard);
+
+    const ParserTable* table_;
+    const std::vector<std::uint16_t>* types_;
+    std::uint32_t count_;
+    std::vector<std::uint8_t> classes_;  ///< by position, the last one for the end of the text
+    std::vector<std::uint32_t> runEnd_;  ///< by position; empty when there is no closer
+    std::vector<std::uint32_t> lastOf_;  ///< by token number: one past the last position where it stands
+    std::vector<std::vector<std::uint32_t>> candidates_;  ///< by guard: next position that could satisfy it
+    std::vector<std::vector<std::uint32_t>> barriers_;    ///< by guard: next position outside
+    std::vector<std::uint32_t> nextOpener_;
+    std::vector<std::uint32_t> openedBefore_;
+};
+
+/// Where skipping ends that starts at a position in place of the recover rule: the first token that can
+/// follow it at the same parenthesis depth, or the end of the full text.
+std::uint32_t skippedTo(const ParserTable& table, const TextIndex& text, std::uint32_t position);
+
+}  // namespace zr::engine
