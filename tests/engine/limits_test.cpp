@@ -150,22 +150,39 @@ TEST(LongChains, OfJoinsAreRead) {
 
 // ---- budget
 
-TEST(Budget, OverItTheFurthestReadingFoundStands) {
+/// Budgets of so many steps for either search, whatever the text's length.
+engine::Options stepsAtMost(std::uint64_t lazy, std::uint64_t full) {
+    engine::Options options;
+    options.baseSteps = lazy;
+    options.fullBaseSteps = full;
+    options.stepsPerToken = options.fullStepsPerToken = 0;
+    return options;
+}
+
+TEST(Budget, OfTheFirstSearchIsMadeGoodByTheFullOne) {
     const std::vector<std::uint16_t> types =
         typesOf(u"SELECT a FROM t WHERE " + nested(u"dbo.f(", u"a", u")", 40) + u" = 1");
-    engine::Options options;
-    options.stepsPerToken = 0;
-    options.baseSteps = 1;
-    EXPECT_TRUE(recognise(types, options).overBudget);
+    for (const std::uint64_t lazy : {0, 1, 10, 100, 1000, 10000}) {
+        const engine::Recogniser::Result result = recognise(types, stepsAtMost(lazy, 1000000));
+        EXPECT_TRUE(result.found) << lazy;
+        EXPECT_FALSE(result.overBudget) << lazy;
+        EXPECT_EQ(result.high, types.size()) << lazy;
+    }
+}
+
+TEST(Budget, OverBothTheFurthestReadingFoundStands) {
+    const std::vector<std::uint16_t> types =
+        typesOf(u"SELECT a FROM t WHERE " + nested(u"dbo.f(", u"a", u")", 40) + u" = 1");
+    EXPECT_TRUE(recognise(types, stepsAtMost(1, 1)).overBudget);
     const engine::Recogniser::Result inside = recognise(types, engine::Options{});
     EXPECT_FALSE(inside.overBudget);
     EXPECT_EQ(inside.high, types.size());
-    // However small the budget: never further than the full search.
-    for (options.baseSteps = 2; options.baseSteps < 5000; options.baseSteps *= 2) {
-        const engine::Recogniser::Result cut = recognise(types, options);
+    // However small the budget: never further than the whole search.
+    for (std::uint64_t steps = 2; steps < 5000; steps *= 2) {
+        const engine::Recogniser::Result cut = recognise(types, stepsAtMost(steps, steps));
         if (cut.found) {
-            EXPECT_LE(cut.high, inside.high) << options.baseSteps;
-            EXPECT_GT(cut.high, 0U) << options.baseSteps;
+            EXPECT_LE(cut.high, inside.high) << steps;
+            EXPECT_GT(cut.high, 0U) << steps;
         }
     }
 }
@@ -182,9 +199,8 @@ TEST(Budget, OverItThereIsATreeAndANotice) {
         int notices = 0;
         zrSetDiagnosticFunction(count, &notices);
         Contexts c(text);
-        engine::ParserState state{&mssqlTables(), c.parser->pParser, c.parser->adaptor, engine::Options{}};
-        state.options.stepsPerToken = 0;
-        state.options.baseSteps = steps;
+        engine::ParserState state{&mssqlTables(), c.parser->pParser, c.parser->adaptor,
+                                  stepsAtMost(steps, steps)};
         const pANTLR3_BASE_TREE tree = engine::runRule(state, mssqlTables().parser->startRule).tree;
         zrSetDiagnosticFunction(nullptr, nullptr);
         ASSERT_NE(tree, nullptr);
