@@ -1,11 +1,12 @@
-// The engine against the reference: same reach, same tree, on the corpus, on sentences made from the tables
-// and on spoilt ones, and on a folder of real queries where one is given.
+// The engine against the reference, for every grammar: same reach, same tree, on the corpus, on sentences
+// made from the tables and on spoilt ones, and on a file of real queries where there is one.
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
 #include <fstream>
+#include <tuple>
 
-#include "tests/engine/mssql_tables.h"
 #include "tests/engine/reference_recogniser.h"
 #include "tests/engine/sentence_source.h"
 #include "tests/grammar/corpus_file.h"
@@ -16,17 +17,17 @@ namespace zr::test {
 namespace {
 
 constexpr std::size_t kMaxItems = 4000000;
-const Grammar& kMssql = kGrammars[0];
 
 /// What was compared, so that a test can tell that it compared anything.
 struct Counts {
     int compared = 0, whole = 0, recovered = 0, failed = 0, tooMuch = 0;
 };
 
-void compare(const std::u16string& text, Counts& counts, std::size_t maxTokens = 100000) {
-    const std::vector<TokenText> tokens = kMssql.lex(text);
+void compare(const Grammar& grammar, const std::u16string& text, Counts& counts,
+             std::size_t maxTokens = 100000) {
+    const std::vector<TokenText> tokens = grammar.lex(text);
     if (tokens.size() > maxTokens) return;
-    ReferenceRecogniser reference(mssqlTables(), tokens, kMaxItems);
+    ReferenceRecogniser reference(grammar.tables(), tokens, kMaxItems);
     ReferenceRecogniser::Reading expected;
     try {
         expected = reference.read();
@@ -34,7 +35,7 @@ void compare(const std::u16string& text, Counts& counts, std::size_t maxTokens =
         ++counts.tooMuch;
         return;
     }
-    const Reading found = kMssql.read(text);
+    const Reading found = grammar.read(text);
     ++counts.compared;
     if (!expected.found)
         ++counts.failed;
@@ -48,50 +49,71 @@ void compare(const std::u16string& text, Counts& counts, std::size_t maxTokens =
     }
 }
 
-TEST(EngineEqualsReference, OnTheCorpus) {
+std::string nameOf(std::size_t grammar) {
+    return std::string(kGrammars[grammar].corpus);
+}
+
+class EngineEqualsReference : public testing::TestWithParam<std::size_t> {
+ protected:
+    const Grammar& grammar() const { return kGrammars[GetParam()]; }
+};
+
+TEST_P(EngineEqualsReference, OnTheCorpus) {
     Counts counts;
-    for (const CorpusFile& file : readCorpus(std::filesystem::path(ZR_CORPUS_DIR) / kMssql.corpus))
+    for (const CorpusFile& file : readCorpus(std::filesystem::path(ZR_CORPUS_DIR) / grammar().corpus))
         for (const CorpusCase& one : file.cases) {
             SCOPED_TRACE(file.path.string() + ": " + one.title);
-            compare(one.text(), counts);
+            compare(grammar(), one.text(), counts);
         }
-    EXPECT_GT(counts.compared, 300);
-    EXPECT_GT(counts.whole, 100);
-    EXPECT_GT(counts.recovered, 0);
+    EXPECT_GT(counts.compared, 100);
+    EXPECT_GT(counts.whole, 50);
     EXPECT_GT(counts.failed, 0);
+    if (grammar().tables().parser->recoverRule != engine::kNone16) {
+        EXPECT_GT(counts.recovered, 0);
+    }
     EXPECT_EQ(counts.tooMuch, 0);
 }
 
-TEST(EngineEqualsReference, WhereTheSelectListIsMissingBehindTwoClosingParentheses) {
+TEST_P(EngineEqualsReference, OnRealQueries) {
+    const auto path = std::filesystem::path(ZR_REAL_QUERIES) / (nameOf(GetParam()) + ".jsonl");
+    std::ifstream in(path);
+    if (!in) GTEST_SKIP() << path << " is not here";
+    constexpr std::size_t kMaxTokens = 150;
     Counts counts;
-    compare(u"SELECT TOP (1)) a (", counts);
-    EXPECT_EQ(counts.recovered, 1);
+    for (std::string line; std::getline(in, line) && !HasFailure();) {
+        const std::size_t at = line.find("\"sql\": ");
+        ASSERT_NE(at, std::string::npos) << line;
+        std::string_view rest = std::string_view(line).substr(at + 7);
+        SCOPED_TRACE(line.substr(0, at));
+        compare(grammar(), readJsonString(rest), counts, kMaxTokens);
+    }
+    EXPECT_GT(counts.compared, 300);
+    EXPECT_GT(counts.whole, 50);
+    RecordProperty("too_much", counts.tooMuch);
 }
 
-TEST(EngineEqualsReference, WhereAnOuterCallTakesTheParenthesisThatAnInnerOneLeaves) {
-    Counts counts;
-    compare(u"SELECT MAX f.g(( & 0", counts);
-    EXPECT_EQ(counts.whole, 1);
-}
+INSTANTIATE_TEST_SUITE_P(Grammars, EngineEqualsReference, testing::Range(std::size_t{0}, kGrammarCount),
+                         [](const auto& grammar) { return nameOf(grammar.param); });
 
-class EngineEqualsReferenceOnSentences : public testing::TestWithParam<std::uint32_t> {};
+class EngineEqualsReferenceOnSentences
+    : public testing::TestWithParam<std::tuple<std::size_t, std::uint32_t>> {};
 
 TEST_P(EngineEqualsReferenceOnSentences, DerivedAndSpoilt) {
-    const std::uint32_t seed = GetParam();
-    SCOPED_TRACE("seed " + std::to_string(seed));
-    SentenceSource source(mssqlTables(), seed);
+    const Grammar& grammar = kGrammars[std::get<0>(GetParam())];
+    const engine::GrammarTable& tables = grammar.tables();
+    SentenceSource source(tables, std::get<1>(GetParam()));
     Counts derived, spoilt;
     for (int i = 0; i < 100; ++i) {
         std::vector<std::uint16_t> tokens =
-            source.sentence(mssqlTables().parser->statementRule, 4 + source.number(36));
+            source.sentence(tables.parser->statementRule, 4 + source.number(36));
         const std::u16string text = source.text(tokens);
         std::vector<std::uint16_t> types;
-        for (const TokenText& token : kMssql.lex(text))
+        for (const TokenText& token : grammar.lex(text))
             types.push_back(static_cast<std::uint16_t>(token.type));
         ASSERT_EQ(types, tokens) << quoteJson(text);
-        compare(text, derived);
+        compare(grammar, text, derived);
         source.spoil(tokens);
-        compare(source.text(tokens), spoilt);
+        compare(grammar, source.text(tokens), spoilt);
         if (HasFailure()) return;
     }
     EXPECT_EQ(derived.whole, derived.compared) << "what the tables derive is read to its end";
@@ -100,23 +122,32 @@ TEST_P(EngineEqualsReferenceOnSentences, DerivedAndSpoilt) {
     EXPECT_LT(spoilt.whole, spoilt.compared);
 }
 
-INSTANTIATE_TEST_SUITE_P(Seeds, EngineEqualsReferenceOnSentences, testing::Range(1u, 21u));
+INSTANTIATE_TEST_SUITE_P(Seeds, EngineEqualsReferenceOnSentences,
+                         testing::Combine(testing::Range(std::size_t{0}, kGrammarCount),
+                                          testing::Range(1u, 21u)),
+                         [](const auto& where) {
+                             return nameOf(std::get<0>(where.param)) + "_seed_" +
+                                    std::to_string(std::get<1>(where.param));
+                         });
 
-TEST(EngineEqualsReferenceCorpus, OnRealQueries) {
-    std::ifstream in(ZR_REAL_QUERIES);
-    if (!in) GTEST_SKIP() << ZR_REAL_QUERIES << " is not here";
-    constexpr std::size_t kMaxTokens = 150;
-    Counts counts;
-    for (std::string line; std::getline(in, line) && !HasFailure();) {
-        const std::size_t at = line.find("\"sql\": ");
-        ASSERT_NE(at, std::string::npos) << line;
-        std::string_view rest = std::string_view(line).substr(at + 7);
-        SCOPED_TRACE(line.substr(0, at));
-        compare(readJsonString(rest), counts, kMaxTokens);
+/// One text of one dialect that once came out differently.
+void expectEqual(std::string_view corpus, const std::u16string& text, int Counts::*outcome) {
+    for (std::size_t i = 0; i < kGrammarCount; ++i) {
+        if (kGrammars[i].corpus != corpus) continue;
+        Counts counts;
+        compare(kGrammars[i], text, counts);
+        EXPECT_EQ(counts.*outcome, 1);
+        return;
     }
-    EXPECT_GT(counts.compared, 500);
-    EXPECT_GT(counts.whole, 50);
-    RecordProperty("too_much", counts.tooMuch);
+    ADD_FAILURE() << "no grammar " << corpus;
+}
+
+TEST(EngineEqualsReferenceOnce, WhereTheSelectListIsMissingBehindTwoClosingParentheses) {
+    expectEqual("mssql", u"SELECT TOP (1)) a (", &Counts::recovered);
+}
+
+TEST(EngineEqualsReferenceOnce, WhereAnOuterCallTakesTheParenthesisThatAnInnerOneLeaves) {
+    expectEqual("mssql", u"SELECT MAX f.g(( & 0", &Counts::whole);
 }
 
 }  // namespace

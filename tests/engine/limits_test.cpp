@@ -13,7 +13,7 @@
 #include "grammar/engine/contexts.h"
 #include "grammar/engine/recogniser.h"
 #include "tests/engine/contexts.h"
-#include "tests/engine/mssql_tables.h"
+#include "tests/grammar/tables_of.h"
 
 namespace zr::test {
 namespace {
@@ -38,6 +38,10 @@ std::vector<std::uint16_t> typesOf(std::u16string_view text) {
         if (token->type != ANTLR3_TOKEN_EOF) types.push_back(static_cast<std::uint16_t>(token->type));
     }
     return types;
+}
+
+const engine::GrammarTable& mssqlTables() {
+    return tablesOf(Contexts(u"").parser);
 }
 
 engine::Recogniser::Result recognise(const std::vector<std::uint16_t>& types,

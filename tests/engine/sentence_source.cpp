@@ -190,7 +190,8 @@ void SentenceSource::spoil(std::vector<std::uint16_t>& tokens) {
 
 std::u16string SentenceSource::text(const std::vector<std::uint16_t>& tokens) const {
     std::u16string text;
-    for (const std::uint16_t type : tokens) text += spelling_[type] + u' ';
+    // A single blank may belong to a token: NOT IN is one where NOT and IN are two.
+    for (const std::uint16_t type : tokens) text += spelling_[type] + u"  ";
     return text;
 }
 

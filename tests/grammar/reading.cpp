@@ -6,18 +6,22 @@
 
 #include <new>
 #include <set>
+#include <type_traits>
 
 #include "tests/grammar/json_string.h"
+#include "tests/grammar/tables_of.h"
 
 namespace zr::test {
 namespace {
 
-struct Mssql {
-    using Lexer = pMSSQLLexer;
-    using Parser = pMSSQLParser;
-    static Lexer newLexer(pANTLR3_INPUT_STREAM input) { return MSSQLLexerNew(input); }
-    static Parser newParser(pANTLR3_COMMON_TOKEN_STREAM tokens) { return MSSQLParserNew(tokens); }
-    static ZRRuleReturn readStatement(Parser parser) { return parser->all_sql_query(parser); }
+/// The recognisers of one grammar. A statement's rule is the one that its start rule begins with.
+template <auto LexerNew, auto ParserNew, auto StatementRule>
+struct Recognisers {
+    using Lexer = decltype(LexerNew(nullptr));
+    using Parser = decltype(ParserNew(nullptr));
+    static Lexer newLexer(pANTLR3_INPUT_STREAM input) { return LexerNew(input); }
+    static Parser newParser(pANTLR3_COMMON_TOKEN_STREAM tokens) { return ParserNew(tokens); }
+    static ZRRuleReturn readStatement(Parser parser) { return (parser->*StatementRule)(parser); }
 };
 
 /// A token of the text is read from the text itself: a string that the runtime makes of UTF-16 input may bear
@@ -148,13 +152,25 @@ Reading readAgain(std::u16string_view text) {
 }
 
 template <typename G>
-constexpr Grammar grammar(std::string_view corpus, const char* (*tokenName)(int)) {
-    return {corpus, tokenName, &lex<G>, &read<G>, &readAgain<G>};
+const engine::GrammarTable& tables() {
+    return tablesOf(Pipeline<G>(u"").parser());
 }
+
+template <typename G>
+constexpr Grammar grammar(std::string_view corpus, const char* (*tokenName)(int)) {
+    return {corpus, tokenName, &lex<G>, &read<G>, &readAgain<G>, &tables<G>};
+}
+
+#define ZR_GRAMMAR(NAME, CORPUS, STATEMENT_RULE)                                          \
+    grammar<Recognisers<NAME##LexerNew, NAME##ParserNew,                                  \
+                        &std::remove_pointer_t<p##NAME##Parser>::STATEMENT_RULE>>(CORPUS, \
+                                                                                  &NAME##_token_name)
 
 }  // namespace
 
-const Grammar kGrammars[] = {grammar<Mssql>("mssql", &MSSQL_token_name)};
+const Grammar kGrammars[] = {
+    ZR_GRAMMAR(MSSQL, "mssql", all_sql_query),
+};
 const std::size_t kGrammarCount = std::size(kGrammars);
 
 }  // namespace zr::test

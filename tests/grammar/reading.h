@@ -5,6 +5,7 @@
 #include <string_view>
 #include <vector>
 
+#include "grammar/engine/tables.h"
 #include "tests/grammar/syntax_dump.h"
 
 namespace zr::test {
@@ -32,8 +33,10 @@ struct Grammar {
     Reading (*read)(std::u16string_view text);
     /// The same, with lexer, token stream and parser asked twice: what the second call returns.
     Reading (*readAgain)(std::u16string_view text);
+    const engine::GrammarTable& (*tables)();
 };
 
+/// Every test that is about all grammars goes over this list.
 extern const Grammar kGrammars[];
 extern const std::size_t kGrammarCount;
 

@@ -1,0 +1,14 @@
+#pragma once
+
+#include "grammar/engine/contexts.h"
+
+namespace zr::test {
+
+/// The tables that a grammar's parser runs on. They have no name outside their generated source, but every
+/// context of the grammar holds them.
+template <typename Parser>
+const engine::GrammarTable& tablesOf(Parser* parser) {
+    return *reinterpret_cast<typename engine::ParserGlue<Parser>::Holder*>(parser)->state.grammar;
+}
+
+}  // namespace zr::test
