@@ -2,6 +2,7 @@
 
 #include <antlr3.h>
 #include <zrparsersql/recognizers/MSSQL.h>
+#include <zrparsersql/recognizers/MySQLSelect.h>
 
 #include <type_traits>
 
@@ -30,7 +31,8 @@ struct NoRecognizers {
 using MssqlRecognizers =
     Recognizers<MSSQLLexerNewSSD, MSSQLParserNewSSD, &MSSQLParser_Ctx_struct::start_rule>;
 using OracleRecognizers = NoRecognizers;
-using MySqlRecognizers = NoRecognizers;
+using MySqlRecognizers =
+    Recognizers<MySQLSelectLexerNewSSD, MySQLSelectParserNewSSD, &MySQLSelectParser_Ctx_struct::start_rule>;
 using PostgreSqlRecognizers = NoRecognizers;
 using MsAccessRecognizers = NoRecognizers;
 

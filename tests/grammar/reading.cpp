@@ -3,6 +3,8 @@
 #include <zrparsersql/input_stream.h>
 #include <zrparsersql/recognizers/MSSQL.h>
 #include <zrparsersql/recognizers/MSSQL_tokens.h>
+#include <zrparsersql/recognizers/MySQLSelect.h>
+#include <zrparsersql/recognizers/MySQLSelect_tokens.h>
 
 #include <new>
 #include <set>
@@ -170,6 +172,7 @@ constexpr Grammar grammar(std::string_view corpus, const char* (*tokenName)(int)
 
 const Grammar kGrammars[] = {
     ZR_GRAMMAR(MSSQL, "mssql", all_sql_query),
+    ZR_GRAMMAR(MySQLSelect, "mysql", all_sql_query),
 };
 const std::size_t kGrammarCount = std::size(kGrammars);
 

@@ -2,6 +2,8 @@
 
 #include <zrparsersql/recognizers/MSSQL.h>
 #include <zrparsersql/recognizers/MSSQL_tokens.h>
+#include <zrparsersql/recognizers/MySQLSelect.h>
+#include <zrparsersql/recognizers/MySQLSelect_tokens.h>
 
 #include <new>
 #include <type_traits>
@@ -47,12 +49,13 @@ constexpr Grammar grammarOf() {
               &std::remove_pointer_t<p##NAME##Parser>::QUERY_RULE, NAME##_token_name>()
 
 constexpr Grammar kMssql = ZR_GRAMMAR(MSSQL, all_sql_query);
+constexpr Grammar kMysql = ZR_GRAMMAR(MySQLSelect, all_sql_query);
 
 #undef ZR_GRAMMAR
 
 constexpr Dialect kDialects[] = {
     {"mssql", &kMssql, DB_MSSQL},           {"mssqlfrom", nullptr, DB_NONE},
-    {"mysql", nullptr, DB_MYSQL},           {"oracle", nullptr, DB_ORACLE},
+    {"mysql", &kMysql, DB_MYSQL},           {"oracle", nullptr, DB_ORACLE},
     {"postgresql", nullptr, DB_POSTGRESQL}, {"msaccess", nullptr, DB_MSACCESS},
 };
 
