@@ -2,6 +2,7 @@
 
 #include "analysis/driver.h"
 #include "analysis/mssql_state.h"
+#include "analysis/mysql_state.h"
 #include "zrparsersql/analysis.h"
 #include "zrparsersql/sql_parsers.h"
 
@@ -16,6 +17,9 @@ void analyse(CZRQueryInfo& query, DBTypes kind) {
         case DB_MSSQL:
         case DB_MSSQL_20:
             zr::analyseQuery<CZRMSSQLParser, MSSQLStateSelectQuery>(query, asItIs);
+            break;
+        case DB_MYSQL:
+            zr::analyseQuery<CZRMySQLParcer, MySQLStateSelectQuery>(query, asItIs);
             break;
         default:
             break;

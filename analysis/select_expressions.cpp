@@ -1,4 +1,6 @@
 // Expressions: operators, functions, parameters, literals.
+#include <utility>
+
 #include "analysis/select_state.h"
 #include "parser/node_text.h"
 
@@ -73,10 +75,11 @@ void SelectState::ProcessParams(ItemList* list, CZRSQLTree* node) {
 }
 
 void SelectState::ProcessFunction(CZRSQLTree* node, ItemList* list) {
+    if (dialect_.functionsArePlain) return appendFunction(node, list);
     CZRSQLTree* const head = node->GetChild(0);
     // A column at the head comes out by itself, ahead of the function.
     if (roleOf(head) == Role::ColumnSpecification) ProcessExpression(head, list, node);
-    if (head->GetText().TrimLeft().EqualsNoCase(u"FN")) {
+    if (isEscape(head)) {
         // So does the function inside an escape, which then stands among the escape's parameters once more.
         work().once(*this, &SelectState::functionItemStep, node, list, nullptr);
         work().once(*this, &SelectState::functionStep, head->GetChild(0), list, nullptr);
@@ -87,23 +90,42 @@ void SelectState::ProcessFunction(CZRSQLTree* node, ItemList* list) {
 
 void SelectState::appendFunction(CZRSQLTree* node, ItemList* list) {
     CZRSQLTree* const head = node->GetChild(0);
-    const Role role = roleOf(node);
     SelectItem& item = append(list, newItem<SelectItem>());
-    item.m_name = head->GetText().TrimLeft();
+    item.m_name = functionName(head);
     item.m_tokenType = static_cast<int>(head->GetType());
     item.m_isOperator = IsOperator(head);
-    CZRSQLTree* parameters = node->GetChildCount() > 1 ? node->GetChild(1) : nullptr;
-    if (role == Role::UserFunction) {
+    if (roleOf(node) == Role::UserFunction) {
         item.m_kind = SIK_USER_FUNCTION;
-        m_query->AddUserFunction(item.m_name, parameters ? static_cast<int>(parameters->GetChildCount()) : 0);
+        m_query->AddUserFunction(item.m_name, node->GetChildCount() > 1
+                                                  ? static_cast<int>(node->GetChild(1)->GetChildCount())
+                                                  : 0);
     } else {
         item.m_kind = SIK_FUNCTION;
     }
-    if (role == Role::SearchCondition || item.m_name.EqualsNoCase(u"FN"))
-        parameters = head;
-    else if (roleOf(head) == Role::BetweenKeyword)
-        parameters = node;
-    if (parameters) ProcessParams(&item.m_items, parameters);
+    if (CZRSQLTree* const parameters = functionParameters(node)) ProcessParams(&item.m_items, parameters);
+}
+
+CString SelectState::functionName(CZRSQLTree* head) const {
+    CString name = head->GetText();
+    return (dialect_.functionsArePlain ? unquoted(std::move(name)) : name).TrimLeft();
+}
+
+bool SelectState::isEscape(CZRSQLTree* head) const {
+    return !dialect_.functionsArePlain && head->GetText().TrimLeft().EqualsNoCase(u"FN");
+}
+
+CZRSQLTree* SelectState::functionParameters(CZRSQLTree* node) {
+    CZRSQLTree* const head = node->GetChild(0);
+    if (roleOf(node) == Role::SearchCondition || isEscape(head)) return head;
+    switch (roleOf(head)) {
+        case Role::BetweenKeyword:
+            return dialect_.functionsArePlain ? head : node;
+        case Role::LikeKeyword:
+            // As a function LIKE has no parameters, which is intended: those of its call are not looked for.
+            return head;
+        default:
+            return node->GetChildCount() > 1 ? node->GetChild(1) : nullptr;
+    }
 }
 
 void SelectState::ProcessLiteral(CZRSQLTree* node, ItemList* list) {

@@ -19,6 +19,8 @@ struct Dialect {
     int nestedDataType;  // DataType of the descriptors of sub-queries and union branches
     char16_t quoteOpen;  // around names
     char16_t quoteClose;
+    // A function is a call and nothing else: no escapes, no column that comes out ahead of it.
+    bool functionsArePlain = false;
 };
 
 // Reads the tree of one SELECT and writes what it finds into one descriptor: copies of the clauses as lists
@@ -119,6 +121,8 @@ class SelectState {
         return std::make_unique<Item>();
     }
     SelectItem& appendText(ItemList* list, const CString& text, int kind);
+    // The node below a function whose children are its parameters, or null.
+    virtual CZRSQLTree* functionParameters(CZRSQLTree* node);
     // The item that stands for a part of a join, named " ".
     virtual SelectItem& appendJoinPart(ItemList* list);
 
@@ -149,6 +153,8 @@ class SelectState {
 
     void processItems(CZRSQLTree* clause, ItemList& list);
     void appendFunction(CZRSQLTree* node, ItemList* list);
+    CString functionName(CZRSQLTree* head) const;
+    bool isEscape(CZRSQLTree* head) const;
     AliasNames& aliasNames();
 
     const Dialect& dialect_;

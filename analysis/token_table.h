@@ -47,6 +47,7 @@ enum class Role : std::uint8_t {
     UserFunction,
     SearchCondition,
     BetweenKeyword,
+    LikeKeyword,
     RightParen,
     // Literals.
     SqlLiteral,
