@@ -54,14 +54,15 @@ Form operatorForm(const SelectItem& item, std::size_t operands) {
     if (isNamed(item, {u"BETWEEN"})) return {{}, spaced, u" AND ", {}};
     if (operands == 1) return {name + u" ", {}, {}, {}};
     // A list of values, unless a nested query stands there, which comes with parentheses of its own.
-    if (operands > 2 || (isNamed(item, {u"IN"}) && !classOf(*item.m_items.GetTail()).query))
+    if (operands > 2 || (isNamed(item, {u"IN", u"NOT IN"}) && !classOf(*item.m_items.GetTail()).query))
         return {{}, spaced + u"(", u", ", u")"};
     return {{}, spaced, {}, {}};
 }
 
 Form formOf(const SelectItem& item, std::size_t operands) {
     const Text name(item.m_name.View());
-    if (item.m_isOperator) return operatorForm(item, operands);
+    // Not every dialect counts NOT IN among its operators.
+    if (item.m_isOperator || isNamed(item, {u"NOT IN"})) return operatorForm(item, operands);
     if (isNamed(item, {u"CASE"})) return {name + u" ", u" ", u" ", u" END"};
     if (isNamed(item, {u"WHEN", u"THEN", u"ELSE"})) return {name + u" ", u" ", u" ", {}};
     const bool isFunction = item.m_kind == SIK_FUNCTION || item.m_kind == SIK_USER_FUNCTION;

@@ -182,15 +182,25 @@ class QueryPicture {
         table.appendTo(out_);
     }
 
+    // Some dialects leave all columns of a table as the table without a column.
+    static bool isAllColumns(const SelectItemField& field) {
+        return field.m_sourceField.IsEmpty() &&
+               !(field.m_sourceTable.IsEmpty() && field.m_tableAlias.IsEmpty());
+    }
+
     static Text columnName(const SelectItem& item) {
         if (isAlias(item)) return Text(item.m_items.GetTail()->m_text.View());
-        if (const SelectItemField* field = classOf(item).field)
+        if (const SelectItemField* field = classOf(item).field) {
+            if (isAllColumns(*field)) return u"*";
             return Text(field->m_sourceField.IsEmpty() ? field->m_text.View() : field->m_sourceField.View());
-        return u"-";
+        }
+        return item.m_kind == SIK_NUMBER && item.m_text == u"*" ? u"*" : u"-";
     }
 
     Text columnExpression(const SelectItem& item) {
-        return expression(isAlias(item) ? *item.m_items.GetHead() : item);
+        if (isAlias(item)) return expression(*item.m_items.GetHead());
+        const SelectItemField* const field = classOf(item).field;
+        return field && isAllColumns(*field) ? fieldText(*field) + u".*" : expression(item);
     }
 
     // The columns of sources that an expression reads, each once, in order.
@@ -217,8 +227,9 @@ class QueryPicture {
             source = Text(field.m_sourceTable.View());
         else
             source = onlySourceOf(field.m_sourceField);
-        if (field.m_sourceField.IsEmpty() || source.empty()) return source;
-        return source + u"." + Text(field.m_sourceField.View());
+        if (source.empty()) return source;
+        if (isAllColumns(field)) return source + u".*";
+        return field.m_sourceField.IsEmpty() ? source : source + u"." + Text(field.m_sourceField.View());
     }
 
     // The source of a column that is written without one: the only source there is, or the only one of the
