@@ -2,8 +2,11 @@
 // them. What differs on purpose is pinned below, one test each.
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <sstream>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "tests/analysis/analysed.h"
 #include "tests/analysis/plain_descriptor.h"
@@ -83,7 +86,13 @@ constexpr std::u16string_view kQueries[] = {
     u"SELECT a FROM t WHERE b IN ('x', 'y')",
     u"SELECT a FROM t WHERE b + c > 10",
     u"SELECT a FROM t WHERE t.b = t.c",
+    u"SELECT a FROM t WHERE NOT b = 1",
+    u"SELECT a FROM t WHERE (b = 1)",
+    u"SELECT a FROM t WHERE (b = 1 OR c = 2) AND e = 3",
+    u"SELECT a FROM t WHERE b = 1 AND (c = 2 OR e = 3)",
+    u"SELECT a FROM t WHERE b = 'x' AND YEAR(c) = 2020",
     u"SELECT a FROM t WHERE b IN (SELECT c FROM u)",
+    u"SELECT a FROM t WHERE b IN (SELECT c FROM u) AND e = 1",
     u"SELECT a FROM t WHERE b = 1 AND c IN (SELECT c FROM u WHERE e = 2)",
     // Joins.
     u"SELECT a FROM t JOIN u ON t.id = u.id",
@@ -96,6 +105,7 @@ constexpr std::u16string_view kQueries[] = {
     u"SELECT a FROM t INNER JOIN u ON t.id = u.id AND t.k = u.k",
     u"SELECT a FROM t o INNER JOIN u p ON o.id = p.id WHERE o.b = 1",
     u"SELECT a FROM t INNER JOIN u ON t.id = u.id INNER JOIN v ON u.id = v.id",
+    u"SELECT x.a FROM (SELECT a FROM t) x",
     u"SELECT a FROM t LEFT JOIN u ON t.id = u.id LEFT JOIN v ON u.id = v.id WHERE t.b > 1",
     // Clauses.
     u"SELECT a FROM t GROUP BY a",
@@ -133,5 +143,183 @@ TEST_P(CommonSubset, ComesToTheSameDescriptor) {
 
 INSTANTIATE_TEST_SUITE_P(Dialects, CommonSubset, testing::ValuesIn(kDialects),
                          [](const auto& dialect) { return dialect.param.name; });
+
+// ---- differences, one by one
+
+std::vector<std::string> linesOf(const std::string& text) {
+    std::vector<std::string> lines;
+    std::istringstream in(text);
+    for (std::string line; std::getline(in, line);) lines.push_back(line);
+    return lines;
+}
+
+// The lines of one descriptor that the other has not, in order, with "; " between them.
+std::string linesWithout(const std::vector<std::string>& lines, std::vector<std::string> others) {
+    std::string text;
+    for (const std::string& line : lines) {
+        if (const auto found = std::find(others.begin(), others.end(), line); found != others.end())
+            others.erase(found);
+        else
+            text += (text.empty() ? "" : "; ") + line;
+    }
+    return text;
+}
+
+// Pins what the descriptors of one text do not share: lines of SQL Server's alone, and of the other
+// dialect's.
+void expectDifference(std::u16string_view sql, DBTypes kind, std::string_view ofSqlServer,
+                      std::string_view ofOther) {
+    const std::vector<std::string> first = linesOf(plainDescriptor(Analysed(sql, DB_MSSQL).query));
+    const std::vector<std::string> second = linesOf(plainDescriptor(Analysed(sql, kind).query));
+    EXPECT_EQ(linesWithout(first, second), ofSqlServer) << CString(sql).toUtf8();
+    EXPECT_EQ(linesWithout(second, first), ofOther) << CString(sql).toUtf8();
+}
+
+void expectMysql(std::u16string_view sql, std::string_view ofSqlServer, std::string_view ofMysql) {
+    expectDifference(sql, DB_MYSQL, ofSqlServer, ofMysql);
+}
+
+TEST(DialectDifferences, MysqlTablesOfAListHaveNoCommaOverThem) {
+    expectMysql(u"SELECT a FROM t, u", "from 4 name=, operator token;   item 5 table=t;   item 5 table=u",
+                "from 5 table=t; from 5 table=u");
+}
+
+TEST(DialectDifferences, MysqlAllColumnsAreALiteral) {
+    expectMysql(u"SELECT * FROM t", "field |*; select 5 field=*", "select 1 text=*");
+}
+
+TEST(DialectDifferences, MysqlAllColumnsOfATableAreTheTableWithoutAColumn) {
+    expectMysql(u"SELECT t.* FROM t", "field t|*; select 5 table=t field=*", "field t|; select 5 table=t");
+    expectMysql(u"SELECT o.* FROM t o", "field |*; select 5 text=o field=* alias=o",
+                "select 5 text=o alias=o");
+}
+
+TEST(DialectDifferences, MysqlTopAndLimitAreNoLimit) {
+    expectMysql(u"SELECT TOP 5 a FROM t", "limit 0 5", "");
+    expectMysql(u"SELECT a FROM t LIMIT 5",
+                "alias limit name=LIMIT source=LIMIT of=.; from 4 name=ALIAS operator token; "
+                "  item 5 table=t;   item 1 text=LIMIT",
+                "from 5 table=t");
+}
+
+TEST(DialectDifferences, MysqlDistinctRowIsAPredicate) {
+    expectMysql(u"SELECT DISTINCTROW a FROM t",
+                "predicate 0; alias a name=a source=a of=.; field |DISTINCTROW; "
+                "select 4 name=ALIAS operator token;   item 5 field=DISTINCTROW;   item 1 text=a",
+                "predicate 3; field |a; select 5 field=a");
+}
+
+TEST(DialectDifferences, MysqlBetweenNeedsItsParenthesesAndKeepsItsOperator) {
+    expectMysql(u"SELECT a FROM t WHERE b BETWEEN 1 AND 2",
+                "where 4 name=BETWEEN operator token;   item 5 field=b;   item 1 text=1; "
+                "  item 1 text=2",
+                "where 5 field=b");
+    expectMysql(u"SELECT a FROM t WHERE (b BETWEEN 1 AND 2)", "  item 1 text=1;   item 1 text=2",
+                "  item 4 name=AND operator token;     item 1 text=1;     item 1 text=2");
+}
+
+TEST(DialectDifferences, MysqlNotInIsACondition) {
+    expectMysql(u"SELECT a FROM t WHERE b NOT IN (1, 2)", "",
+                "field |b; where 4 name=NOT IN token;   item 5 field=b;   item 1 text=1; "
+                "  item 1 text=2");
+}
+
+TEST(DialectDifferences, MysqlNotNullKeepsItsSpelling) {
+    expectMysql(u"SELECT a FROM t WHERE b is not null", "  item 1 text=NOT NULL", "  item 1 text=not null");
+}
+
+TEST(DialectDifferences, MysqlAnAliasHidesNoColumnInTheMap) {
+    expectMysql(u"SELECT a AS x FROM t ORDER BY x", "", "field |x");
+}
+
+TEST(DialectDifferences, MysqlOnlyAnAliasOfExactlyThatNameHidesATableInTheMap) {
+    expectMysql(u"SELECT O.a FROM t O", "", "field O|a table");
+    expectMysql(u"SELECT d.o.a FROM d.o o", "", "field |a");
+}
+
+TEST(DialectDifferences, MysqlACastLosesItsType) {
+    expectMysql(u"SELECT CAST(a AS INT) FROM t",
+                "  item 4 name=AS operator token;     item 5 field=a;     item 9 text=INT",
+                "  item 5 field=a");
+}
+
+TEST(DialectDifferences, MysqlBracketsAreNoQuotes) {
+    expectMysql(u"SELECT [a] FROM t", "field |a; select 5 field=a", "");
+}
+
+TEST(DialectDifferences, MysqlAnOwnerMakesNoFunction) {
+    expectMysql(u"SELECT dbo.f(a) FROM t",
+                "table t=t; field |a; select 7 name=f token;   item 5 field=a; from 5 table=t",
+                "table dbo=dbo; field dbo|f; select 5 table=dbo field=f");
+}
+
+TEST(DialectDifferences, MysqlNothingButANumberHasASign) {
+    expectMysql(u"SELECT -a FROM t", "field |a; select 4 name=- operator token;   item 5 field=a", "");
+}
+
+TEST(DialectDifferences, MysqlExistsIsACondition) {
+    expectMysql(u"SELECT a FROM t WHERE EXISTS (SELECT b FROM u)", "",
+                "table u=u; field |b; where 4 name=EXISTS token;   item 6 name=SUB_QUERY; "
+                "    predicate 0;     table t=t;     table u=u;     field |a;     field |b; "
+                "    select 5 field=b;     from 5 table=u");
+}
+
+TEST(DialectDifferences, MysqlThereIsNoFullJoin) {
+    expectMysql(u"SELECT a FROM t FULL JOIN u ON t.a = u.a",
+                "table u=u; field t|a; field u|a; from 4 name=JOIN operator token; "
+                "  item 0 name=  operator;     item 5 table=t;   item 5 table=u; "
+                "  item 4 name=ON operator token;     item 4 name== operator token; "
+                "      item 5 table=t field=a;       item 5 table=u field=a",
+                "from 5 table=t");
+}
+
+TEST(DialectDifferences, MysqlGroupsBeginWithAColumn) {
+    expectMysql(u"SELECT a FROM t GROUP BY YEAR(a)", "group 4 name=YEAR token;   item 5 field=a", "");
+}
+
+TEST(DialectDifferences, MysqlANestedQueryBehindJoinEndsTheReading) {
+    expectMysql(u"SELECT a FROM t INNER JOIN (SELECT b FROM u) x ON t.a = x.b",
+                "alias x name=x source=x of=.; table u=u; field |b; field t|a; "
+                "  item 4 name=ALIAS operator token;     item 6 name=SUB_QUERY;       predicate 0; "
+                "      alias x name=x source=x of=.;       table t=t;       table u=u; "
+                "      field |a;       field |b;       field t|a table;       select 5 field=b; "
+                "      from 5 table=u;     item 1 text=x;   item 4 name=ON operator token; "
+                "    item 4 name== operator token;       item 5 table=t field=a; "
+                "      item 5 text=x field=b alias=x",
+                "");
+}
+
+TEST(DialectDifferences, MysqlACommaBehindAJoinBelongsToItsCondition) {
+    expectMysql(u"SELECT a FROM t INNER JOIN u ON t.id = u.id, v",
+                "table v=v; from 4 name=, operator token;   item 4 name=JOIN operator token; "
+                "    item 0 name=  operator;       item 5 table=t;       item 1 text=INNER; "
+                "    item 5 table=u;     item 4 name=ON operator token; "
+                "      item 4 name== operator token;         item 5 table=t field=id; "
+                "        item 5 table=u field=id;   item 5 table=v",
+                "field |v; from 4 name=JOIN operator token;   item 0 name=  operator; "
+                "    item 5 table=t;     item 1 text=INNER;   item 5 table=u; "
+                "  item 4 name=ON operator token;     item 4 name== operator token; "
+                "      item 5 table=t field=id;       item 5 table=u field=id;       item 5 field=v");
+}
+
+TEST(DialectDifferences, MysqlAnItemTakesAStrayParenthesisSoThatACallMayEndBeforeIt) {
+    expectMysql(u"SELECT ROUND(a, 2) FROM t",
+                "field |a; select 4 name=ROUND token;   item 5 field=a;   item 1 text=2",
+                "alias a name=a source=a of=.; select 4 name=ALIAS operator token; "
+                "  item 4 name=ROUND token;   item 1 text=a; select 1 text=2");
+    expectMysql(u"SELECT SUM(a * b) FROM t",
+                "select 4 name=SUM token;   item 4 name=* operator token;     item 5 field=b",
+                "select 4 name=* operator token;   item 4 name=SUM token;   item 5 field=b");
+}
+
+TEST(DialectDifferences, MysqlASourceListTakesAStrayParenthesisSoThatANestedQueryMayGoOn) {
+    expectMysql(u"SELECT a FROM t WHERE b IN (SELECT c FROM u) UNION SELECT e FROM v",
+                "field |e;     field |e; union 8 name=UNION;   predicate 0;   table t=t;   table u=u; "
+                "  table v=v;   field |a;   field |b;   field |c;   field |e;   select 5 field=e; "
+                "  from 5 table=v",
+                "    union 8 name=UNION;       predicate 0;       table t=t;       table u=u; "
+                "      table v=v;       field |a;       field |b;       field |c;       field |e; "
+                "      select 5 field=e;       from 5 table=v");
+}
 
 }  // namespace
