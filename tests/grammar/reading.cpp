@@ -159,8 +159,18 @@ const engine::GrammarTable& tables() {
 }
 
 template <typename G>
+SyntaxDump readBySets(std::u16string_view text) {
+    Reading reading;
+    Pipeline<G> pipeline(text);
+    engine::Options& options = optionsOf(pipeline.parser());
+    options.baseSteps = options.stepsPerToken = 0;
+    copyTree(pipeline.parser()->start_rule(pipeline.parser()).tree, reading);
+    return reading.tree;
+}
+
+template <typename G>
 constexpr Grammar grammar(std::string_view corpus, const char* (*tokenName)(int)) {
-    return {corpus, tokenName, &lex<G>, &read<G>, &readAgain<G>, &tables<G>};
+    return {corpus, tokenName, &lex<G>, &read<G>, &readAgain<G>, &tables<G>, &readBySets<G>};
 }
 
 #define ZR_GRAMMAR(NAME, CORPUS, STATEMENT_RULE)                                          \

@@ -34,6 +34,9 @@ struct Grammar {
     /// The same, with lexer, token stream and parser asked twice: what the second call returns.
     Reading (*readAgain)(std::u16string_view text);
     const engine::GrammarTable& (*tables)();
+    /// The tree alone, found by the search that never turns back, which other texts come to only when they
+    /// are hard.
+    SyntaxDump (*readBySets)(std::u16string_view text);
 };
 
 /// Every test that is about all grammars goes over this list.

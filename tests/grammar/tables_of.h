@@ -11,4 +11,10 @@ const engine::GrammarTable& tablesOf(Parser* parser) {
     return *reinterpret_cast<typename engine::ParserGlue<Parser>::Holder*>(parser)->state.grammar;
 }
 
+/// The bounds of a context's runs, to be changed ahead of one.
+template <typename Parser>
+engine::Options& optionsOf(Parser* parser) {
+    return reinterpret_cast<typename engine::ParserGlue<Parser>::Holder*>(parser)->state.options;
+}
+
 }  // namespace zr::test
