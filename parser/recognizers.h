@@ -3,6 +3,7 @@
 #include <antlr3.h>
 #include <zrparsersql/recognizers/MSSQL.h>
 #include <zrparsersql/recognizers/MySQLSelect.h>
+#include <zrparsersql/recognizers/Oracle.h>
 
 #include <type_traits>
 
@@ -30,9 +31,10 @@ struct NoRecognizers {
 // The grammar of each facade.
 using MssqlRecognizers =
     Recognizers<MSSQLLexerNewSSD, MSSQLParserNewSSD, &MSSQLParser_Ctx_struct::start_rule>;
-using OracleRecognizers = NoRecognizers;
 using MySqlRecognizers =
     Recognizers<MySQLSelectLexerNewSSD, MySQLSelectParserNewSSD, &MySQLSelectParser_Ctx_struct::start_rule>;
+using OracleRecognizers =
+    Recognizers<OracleLexerNewSSD, OracleParserNewSSD, &OracleParser_Ctx_struct::start_rule>;
 using PostgreSqlRecognizers = NoRecognizers;
 using MsAccessRecognizers = NoRecognizers;
 

@@ -5,6 +5,8 @@
 #include <zrparsersql/recognizers/MSSQL_tokens.h>
 #include <zrparsersql/recognizers/MySQLSelect.h>
 #include <zrparsersql/recognizers/MySQLSelect_tokens.h>
+#include <zrparsersql/recognizers/Oracle.h>
+#include <zrparsersql/recognizers/Oracle_tokens.h>
 
 #include <new>
 #include <set>
@@ -183,6 +185,7 @@ constexpr Grammar grammar(std::string_view corpus, const char* (*tokenName)(int)
 const Grammar kGrammars[] = {
     ZR_GRAMMAR(MSSQL, "mssql", all_sql_query),
     ZR_GRAMMAR(MySQLSelect, "mysql", all_sql_query),
+    ZR_GRAMMAR(Oracle, "oracle", all_sql_query),
 };
 const std::size_t kGrammarCount = std::size(kGrammars);
 

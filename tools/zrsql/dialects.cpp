@@ -4,6 +4,8 @@
 #include <zrparsersql/recognizers/MSSQL_tokens.h>
 #include <zrparsersql/recognizers/MySQLSelect.h>
 #include <zrparsersql/recognizers/MySQLSelect_tokens.h>
+#include <zrparsersql/recognizers/Oracle.h>
+#include <zrparsersql/recognizers/Oracle_tokens.h>
 
 #include <new>
 #include <type_traits>
@@ -50,12 +52,13 @@ constexpr Grammar grammarOf() {
 
 constexpr Grammar kMssql = ZR_GRAMMAR(MSSQL, all_sql_query);
 constexpr Grammar kMysql = ZR_GRAMMAR(MySQLSelect, all_sql_query);
+constexpr Grammar kOracle = ZR_GRAMMAR(Oracle, all_sql_query);
 
 #undef ZR_GRAMMAR
 
 constexpr Dialect kDialects[] = {
     {"mssql", &kMssql, DB_MSSQL},           {"mssqlfrom", nullptr, DB_NONE},
-    {"mysql", &kMysql, DB_MYSQL},           {"oracle", nullptr, DB_ORACLE},
+    {"mysql", &kMysql, DB_MYSQL},           {"oracle", &kOracle, DB_ORACLE},
     {"postgresql", nullptr, DB_POSTGRESQL}, {"msaccess", nullptr, DB_MSACCESS},
 };
 
