@@ -30,10 +30,14 @@ struct Recognisers {
 
 /// A token of the text is read from the text itself: a string that the runtime makes of UTF-16 input may bear
 /// the wrong encoding. Imaginary and error nodes have plain characters for a text.
-std::u16string textOf(const ANTLR3_COMMON_TOKEN& token) {
+std::u16string textOf(ANTLR3_COMMON_TOKEN& token) {
     if (token.textState == ANTLR3_TEXT_CHARP) {
         const std::string_view name = reinterpret_cast<const char*>(token.tokText.chars);
         return {name.begin(), name.end()};
+    }
+    if (token.textState == ANTLR3_TEXT_STRING || token.type == ANTLR3_TOKEN_EOF) {
+        const ANTLR3_STRING& text = *token.getText(&token);
+        return {reinterpret_cast<const char16_t*>(text.chars), text.len};
     }
     const auto* first = reinterpret_cast<const char16_t*>(token.start);
     const auto* last = reinterpret_cast<const char16_t*>(token.stop);
@@ -52,7 +56,8 @@ template <typename G>
 class Pipeline {
  public:
     explicit Pipeline(std::u16string_view text)
-        : input_(check(zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size())))),
+        : text_(text),
+          input_(check(zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size())))),
           lexer_(check(G::newLexer(input_))),
           tokens_(check(antlr3CommonTokenStreamSourceNew(1025, lexer_->pLexer->rec->state->tokSource))),
           parser_(check(G::newParser(tokens_))) {}
@@ -74,15 +79,20 @@ class Pipeline {
         std::vector<TokenText> out;
         const ANTLR3_UINT32 count = tokens_->tokens->count;
         for (ANTLR3_UINT32 i = 0; i < count; ++i) {
-            auto* token = static_cast<pANTLR3_COMMON_TOKEN>(tokens_->tokens->get(tokens_->tokens, i));
-            const auto type = static_cast<int>(token->getType(token));
-            if (type != static_cast<int>(ANTLR3_TOKEN_EOF)) out.push_back({type, textOf(*token)});
+            ANTLR3_COMMON_TOKEN& token = tokenAt(i);
+            if (!isSeen(token)) continue;
+            out.push_back({static_cast<int>(token.getType(&token)), textOf(token), offset(token.start),
+                           offset(token.stop) + 1});
         }
         return out;
     }
 
+    /// Tokens in front of the place where the parser stands, hidden ones not counted.
     std::size_t position() {
-        return static_cast<std::size_t>(tokens_->tstream->istream->index(tokens_->tstream->istream));
+        const auto index = tokens_->tstream->istream->index(tokens_->tstream->istream);
+        std::size_t count = 0;
+        for (ANTLR3_UINT32 i = 0; i < index && i < tokens_->tokens->count; ++i) count += isSeen(tokenAt(i));
+        return count;
     }
 
  private:
@@ -92,6 +102,21 @@ class Pipeline {
         return made;
     }
 
+    ANTLR3_COMMON_TOKEN& tokenAt(ANTLR3_UINT32 index) {
+        return *static_cast<pANTLR3_COMMON_TOKEN>(tokens_->tokens->get(tokens_->tokens, index));
+    }
+
+    /// Whether a token is of the text and not hidden from the parser.
+    static bool isSeen(ANTLR3_COMMON_TOKEN& token) {
+        return token.getType(&token) != ANTLR3_TOKEN_EOF && token.channel == ANTLR3_TOKEN_DEFAULT_CHANNEL;
+    }
+
+    /// The runtime's places in an in-place stream are addresses.
+    std::size_t offset(ANTLR3_MARKER place) const {
+        return static_cast<std::size_t>(reinterpret_cast<const char16_t*>(place) - text_.data());
+    }
+
+    std::u16string_view text_;
     pANTLR3_INPUT_STREAM input_;
     typename G::Lexer lexer_;
     pANTLR3_COMMON_TOKEN_STREAM tokens_;
@@ -99,6 +124,7 @@ class Pipeline {
 };
 
 void copyTree(pANTLR3_BASE_TREE root, Reading& reading) {
+    reading.rootIsList = root->isNilNode(root) != 0;
     struct Pending {
         pANTLR3_BASE_TREE node;
         std::size_t depth;
@@ -112,9 +138,14 @@ void copyTree(pANTLR3_BASE_TREE root, Reading& reading) {
             reading.wellFormed = false;
             return;
         }
-        const bool nil = node->isNilNode(node);
+        const bool nil = node->isNilNode(node) != 0;
         const int type = nil ? 0 : static_cast<int>(node->getType(node));
-        reading.tree.add(type, quoteJson(textOf(node)), depth);
+        const std::string text = quoteJson(textOf(node));
+        reading.tree.add(type, text, depth);
+        if (!reading.rootIsList)
+            reading.statement.add(type, text, depth);
+        else if (depth > 0 && (depth > 1 || reading.statement.empty()))
+            reading.statement.add(type, text, depth - 1);
         if (type == 0 && !nil) reading.hasErrorNode = true;
         for (ANTLR3_UINT32 i = node->getChildCount(node); i-- > 0;)
             pending.push_back({static_cast<pANTLR3_BASE_TREE>(node->getChild(node, i)), depth + 1});

@@ -12,7 +12,8 @@ namespace zr::test {
 
 struct TokenText {
     int type;
-    std::u16string text;
+    std::u16string text;   ///< without what the lexer cuts from its ends
+    std::size_t from, to;  ///< where it stands in the text, uncut
     bool operator==(const TokenText&) const = default;
 };
 
@@ -20,8 +21,10 @@ struct TokenText {
 struct Reading {
     std::vector<TokenText> tokens;  ///< without the end of input
     SyntaxDump tree;                ///< what the start rule returns
-    bool wellFormed = true;         ///< no node stands in the tree twice
-    std::size_t taken = 0;          ///< tokens that the statement's own rule takes
+    SyntaxDump statement;           ///< the same without the tail where the root is a list of both
+    bool rootIsList = false;
+    bool wellFormed = true;  ///< no node stands in the tree twice
+    std::size_t taken = 0;   ///< tokens that the statement's own rule takes
     bool hasErrorNode = false;
 };
 
