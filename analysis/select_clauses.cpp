@@ -69,7 +69,7 @@ void SelectState::ProcessPredicate(CZRSQLTree* node) {
     if (role != Role::TopKeyword) return;
     const int count = leadingNumber(node->GetChild(0)->GetChild(0)->GetText());
     // A TOP with PERCENT or WITH TIES is no row count.
-    if (node->GetChildCount() < 2) m_query->SetLimit(count);
+    if (node->GetChildCount() < 2 || dialect_.topIsAlwaysALimit) m_query->SetLimit(count);
 }
 
 void SelectState::ProcessSelectItem(CZRSQLTree* node, ItemList* list) {
@@ -86,7 +86,8 @@ void SelectState::ProcessSelectItem(CZRSQLTree* node, ItemList* list) {
             case Role::UserFunction:
                 return ProcessFunction(node, list);
             case Role::SqlLiteral:
-                return ProcessLiteral(node->GetChild(0), list);
+                if (!dialect_.literalsAreNoItems) ProcessLiteral(node->GetChild(0), list);
+                return;
             case Role::Asterisk:
                 return ProcessLiteral(node, list);
             case Role::AscKeyword:
@@ -152,7 +153,7 @@ void SelectState::FillField(CZRSQLTree* node, SelectItemField& item) {
     bool isQualified = hasDatabase;
     if (roleOf(node->GetChild(at)) == Role::TableName) {
         const CString table = GetNodeText(node->GetChild(at));
-        if (hasDatabase || !IsKnownAlias(table)) {
+        if (hasDatabase || !isTableAlias(table)) {
             field->m_table = table;
             item.m_sourceTable = table;
         } else {
@@ -164,7 +165,7 @@ void SelectState::FillField(CZRSQLTree* node, SelectItemField& item) {
     }
     if (roleOf(node->GetChild(at)) == Role::ColumnName) {
         const CString column = GetNodeText(node->GetChild(at));
-        if (isQualified || !IsKnownAlias(column)) {
+        if (isQualified || !isColumnAlias(column)) {
             field->m_field = column;
             item.m_sourceField = column;
         } else {

@@ -18,7 +18,7 @@ void SelectState::ProcessExpression(CZRSQLTree* node, ItemList* list, CZRSQLTree
                 append(list, MakeTableItem(node));
                 return;
             case Role::NewName:
-                appendText(list, GetNodeText(node), SIK_NUMBER);
+                appendText(list, newNameText(node), SIK_NUMBER);
                 return;
             case Role::JoinPrefix:
                 return ProcessParams(&appendJoinPart(list).m_items, node);
@@ -66,6 +66,9 @@ void SelectState::ProcessOperator(CZRSQLTree* node, ItemList* list, CZRSQLTree* 
     item.m_isOperator = 1;
     item.m_kind = SIK_FUNCTION;
     item.m_tokenType = static_cast<int>(node->GetType());
+    if (dialect_.fillsMissingJoinPrefix && item.m_name.EqualsNoCase(u"JOIN") &&
+        roleOf(node->GetChild(0)) != Role::JoinPrefix)
+        appendText(&item.m_items, u" ", SIK_VALUE);
     if (parent && roleOf(parent) == Role::NestedJoin) item.m_nested = 1;
     ProcessParams(&item.m_items, node);
 }

@@ -88,7 +88,7 @@ void SelectState::collectTable(CZRSQLTree* node) {
             break;
         case Role::TableName:
             // Behind a database stands a table, even where an alias has its name.
-            if (const CString name = GetNodeText(node); m_afterDbName || !IsKnownAlias(name)) {
+            if (const CString name = GetNodeText(node); m_afterDbName || !isTableAlias(name)) {
                 enterTable(name);
                 m_afterDbName = 0;
             }
@@ -124,7 +124,7 @@ std::unique_ptr<CFieldObject> SelectState::MakeFieldObject(CZRSQLTree* node) {
     if (hasDatabase) ++at;
     if (roleOf(node->GetChild(at)) == Role::TableName) {
         const CString table = GetNodeText(node->GetChild(at));
-        if (hasDatabase || !IsKnownAlias(table)) {
+        if (hasDatabase || !isTableAlias(table)) {
             field->m_table = table;
             field->m_hasTable = 1;
         }
@@ -132,7 +132,7 @@ std::unique_ptr<CFieldObject> SelectState::MakeFieldObject(CZRSQLTree* node) {
     }
     if (roleOf(node->GetChild(at)) == Role::ColumnName) {
         const CString column = GetNodeText(node->GetChild(at));
-        if (hasDatabase || !IsKnownAlias(column)) field->m_field = column;
+        if (hasDatabase || !isColumnAlias(column)) field->m_field = column;
     }
     return field;
 }

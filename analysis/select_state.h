@@ -21,6 +21,9 @@ struct Dialect {
     char16_t quoteClose;
     // A function is a call and nothing else: no escapes, no column that comes out ahead of it.
     bool functionsArePlain = false;
+    bool literalsAreNoItems = false;      // a literal that is an item of a clause by itself is passed over
+    bool topIsAlwaysALimit = false;       // one with PERCENT or WITH TIES as well
+    bool fillsMissingJoinPrefix = false;  // a JOIN with nothing in front of it gets an item for that
 };
 
 // Reads the tree of one SELECT and writes what it finds into one descriptor: copies of the clauses as lists
@@ -50,7 +53,7 @@ class SelectState {
 
     // Nested selects anywhere below the node: one state, and one descriptor in m_subQueries, for each.
     void CollectSubQueries(CZRSQLTree* node);
-    void CollectAliases(CZRSQLTree* node);
+    virtual void CollectAliases(CZRSQLTree* node);
     void CollectTables();
     void CollectFields();
 
@@ -106,6 +109,13 @@ class SelectState {
     // Under the two texts joined; replaces what stands there.
     void enterField(std::unique_ptr<CFieldObject> field);
 
+    // Whether a name in front of a column, and the name of a table, stands for an alias.
+    virtual bool isTableAlias(const CString& name) { return IsKnownAlias(name); }
+    // Whether the bare name of a column stands for an alias.
+    virtual bool isColumnAlias(const CString& name) { return IsKnownAlias(name); }
+    // The text of the item for an alias's new name.
+    virtual CString newNameText(CZRSQLTree* node) { return GetNodeText(node); }
+
     // The name without its quotes, when it begins with one.
     CString unquoted(CString name) const;
 
@@ -120,6 +130,7 @@ class SelectState {
         countItem();
         return std::make_unique<Item>();
     }
+    AliasNames& aliasNames();
     SelectItem& appendText(ItemList* list, const CString& text, int kind);
     // The node below a function whose children are its parameters, or null.
     virtual CZRSQLTree* functionParameters(CZRSQLTree* node);
@@ -155,7 +166,6 @@ class SelectState {
     void appendFunction(CZRSQLTree* node, ItemList* list);
     CString functionName(CZRSQLTree* head) const;
     bool isEscape(CZRSQLTree* head) const;
-    AliasNames& aliasNames();
 
     const Dialect& dialect_;
     std::unique_ptr<Walk> ownWalk_;  // of the outermost state
