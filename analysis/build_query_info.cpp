@@ -3,6 +3,7 @@
 #include "analysis/driver.h"
 #include "analysis/mssql_state.h"
 #include "analysis/mysql_state.h"
+#include "analysis/oracle_state.h"
 #include "zrparsersql/analysis.h"
 #include "zrparsersql/sql_parsers.h"
 
@@ -20,6 +21,9 @@ void analyse(CZRQueryInfo& query, DBTypes kind) {
             break;
         case DB_MYSQL:
             zr::analyseQuery<CZRMySQLParcer, MySQLStateSelectQuery>(query, asItIs);
+            break;
+        case DB_ORACLE:
+            zr::analyseQuery<CZROracleParser, OracleStateSelectQuery>(query, asItIs);
             break;
         default:
             break;
