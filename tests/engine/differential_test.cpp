@@ -104,14 +104,22 @@ TEST_P(EngineEqualsReferenceOnSentences, DerivedAndSpoilt) {
     const engine::GrammarTable& tables = grammar.tables();
     SentenceSource source(tables, std::get<1>(GetParam()));
     Counts derived, spoilt;
+    int unspellable = 0;
     for (int i = 0; i < 100; ++i) {
-        std::vector<std::uint16_t> tokens =
-            source.sentence(tables.parser->statementRule, 4 + source.number(36));
-        const std::u16string text = source.text(tokens);
-        std::vector<std::uint16_t> types;
-        for (const TokenText& token : grammar.lex(text))
-            types.push_back(static_cast<std::uint16_t>(token.type));
-        ASSERT_EQ(types, tokens) << quoteJson(text);
+        std::vector<std::uint16_t> tokens;
+        std::u16string text;
+        // Some sentences have no text: two quotes with tokens between are one token to a lexer that has
+        // strings.
+        for (bool isSpelt = false; !isSpelt && unspellable < 100;) {
+            tokens = source.sentence(tables.parser->statementRule, 4 + source.number(36));
+            text = source.text(tokens);
+            std::vector<std::uint16_t> types;
+            for (const TokenText& token : grammar.lex(text))
+                types.push_back(static_cast<std::uint16_t>(token.type));
+            isSpelt = types == tokens;
+            if (!isSpelt) ++unspellable;
+        }
+        ASSERT_LT(unspellable, 100) << quoteJson(text);
         compare(grammar, text, derived);
         source.spoil(tokens);
         compare(grammar, source.text(tokens), spoilt);
