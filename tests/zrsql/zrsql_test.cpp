@@ -57,7 +57,7 @@ TEST_P(UnbuiltDialect, IsToldToBeMissing) {
 }
 
 INSTANTIATE_TEST_SUITE_P(Dialects, UnbuiltDialect,
-                         testing::Values("mssqlfrom", "oracle", "postgresql", "msaccess"));
+                         testing::Values("mssqlfrom", "postgresql", "msaccess"));
 
 TEST(ZrsqlUse, HelpAndVersionAreNoFailure) {
     const auto help = runZrsql({"--help"});

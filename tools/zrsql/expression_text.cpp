@@ -20,6 +20,8 @@ bool isNamed(const SelectItem& item, std::initializer_list<View> names) {
 }
 
 Text quoted(View text) {
+    // In a dialect whose lexer knows strings they bring their quotes along; elsewhere they hold none.
+    if (text.size() > 1 && text.front() == u'\'' && text.back() == u'\'') return Text(text);
     Text result = u"'";
     for (const char16_t unit : text) {
         if (unit == u'\'') result += unit;
