@@ -378,6 +378,13 @@ TEST(OracleExpressions, UserFunctionsWithAndWithoutOwnerAreCounted) {
     EXPECT_EQ(*q.database.UserFunctions.Find(u"g"), u"0");
 }
 
+TEST(OracleExpressions, SubstringIsAUsersFunctionAndSubstrIsNot) {
+    const OracleQuery q(u"SELECT SUBSTRING(a, 1), SUBSTR(a, 1) FROM t");
+    EXPECT_EQ(q.select(), "(7 name=SUBSTRING " + typed(Oracle_IDENTIFICATOR) +
+                              " (5 field=a) (1 text=1)) (4 name=SUBSTR " + typed(Oracle_SUBSTR) +
+                              " (5 field=a) (1 text=1))");
+}
+
 TEST(OracleExpressions, RowNumberHoldsOverWithTheFirstColumnOfEachPart) {
     EXPECT_EQ(OracleQuery(u"SELECT ROW_NUMBER() OVER (PARTITION BY a, b ORDER BY c DESC) FROM t").select(),
               "(4 name=ROW_NUMBER " + typed(Oracle_ROW_NUMBER) + " (4 name=OVER " + typed(Oracle_OVER) +
@@ -406,6 +413,13 @@ TEST(OracleJoins, PrefixAndPostfixPartsAreNestedOperators) {
                                 typed(Oracle_ON_KEYWORD) + " (4 name== op " + typed(Oracle_EQ) +
                                 " (5 table=u field=y) (5 table=v field=y))))) (4 name=ON op " +
                                 typed(Oracle_ON_KEYWORD) + " (5 field=z)))");
+}
+
+TEST(OracleJoins, LogicalOperatorsStayBelowTheirOn) {
+    EXPECT_EQ(OracleQuery(u"SELECT a FROM t JOIN u ON x AND y").from(),
+              "(4 name=JOIN op " + typed(Oracle_JOIN_KEYWORD) +
+                  " (0 name=  op nested (5 table=t)) (5 table=u) (4 name=ON op " + typed(Oracle_ON_KEYWORD) +
+                  " (4 name=AND op " + typed(Oracle_AND_KEYWORD) + " (5 field=x) (5 field=y))))");
 }
 
 TEST(OracleJoins, AJoinWithoutAPrefixGetsABlankInItsPlace) {
