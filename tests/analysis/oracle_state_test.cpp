@@ -12,6 +12,7 @@
 #include "tests/analysis/analysed.h"
 #include "tests/analysis/descriptor_text.h"
 #include "tests/analysis/hand_made_tree.h"
+#include "tests/parser/small_stack.h"
 #include "zrparsersql/sql_parsers.h"
 
 namespace {
@@ -148,6 +149,19 @@ TEST(OracleAliases, OfNestedSelectsInAConditionAreCollected) {
 TEST(OracleAliases, OfRowNumberIsAColumns) {
     EXPECT_EQ(keysOf(OracleQuery(u"SELECT ROW_NUMBER() OVER (ORDER BY a) rn FROM t").query.m_aliases),
               "rn_FIELD");
+}
+
+TEST(OracleAliases, AreCollectedAtAnyDepthOnASmallMachineStack) {
+    std::u16string sql, end;
+    for (int depth = 0; depth < 2'000; ++depth) {
+        sql += u"SELECT a b FROM (";
+        end += u") x";
+    }
+    onSmallStack([&] {
+        const OracleQuery q(sql + u"SELECT c y FROM t z" + end);
+        EXPECT_EQ(keysOf(q.query.m_aliases), "b_FIELD|x_TABLE|y_FIELD|z_TABLE");
+        EXPECT_EQ(keysOf(q.query.m_sourceTables), "t");
+    });
 }
 
 // ---------------------------------------------------------------------------------------------- look-ups
