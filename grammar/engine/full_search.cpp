@@ -8,6 +8,9 @@ namespace {
 
 constexpr std::size_t kFirstMemo = 1024;
 
+/// Places that no more than two tail loops stopped at have a bit of their own each.
+constexpr std::size_t kPlainStops = 4;
+
 bool isZeroWidth(Op op) {
     return op == Op::Root || op == Op::ScopeBegin || op == Op::ScopeEnd;
 }
@@ -156,7 +159,8 @@ bool FullSearch::mayCall(std::uint32_t entry, Item& item) {
     return text_.guarded(node, place.low);
 }
 
-/// Whether what stands behind a call could take the next token.
+/// Whether what stands behind a call could take the next token. Where it couldn't, neither closers nor tail
+/// loops do anything on the way to the rule's end, if there is one.
 bool FullSearch::goesOn(std::uint32_t entry, const NodeRow& call, const Place& place) const {
     if (isStart(entry)) return true;
     const std::uint32_t any = table_.contextSets[call.context * (table_.loopCount + 1u) + table_.loopCount];
@@ -217,7 +221,8 @@ FullSearch::Outcome FullSearch::findEnds(std::uint32_t root) {
     const auto start = [&](std::uint32_t entry) {
         works_.push_back({entry, static_cast<std::uint32_t>(items_.size()),
                           static_cast<std::uint32_t>(ends_.size()),
-                          static_cast<std::uint32_t>(slices_.size()), false});
+                          static_cast<std::uint32_t>(slices_.size()),
+                          static_cast<std::uint32_t>(arrivals_.size()), false});
         const std::uint32_t position = entries_[entry].position;
         items_.push_back({{position, position, 0}, skip(table_.rules[entries_[entry].rule].entry)});
     };
@@ -248,11 +253,12 @@ bool FullSearch::follow(std::uint32_t entry, Item item, bool returned, std::uint
     ++steps_;
     for (;; returned = false) {
         const NodeRow& node = table_.nodes[item.node];
-        if ((node.flags & kMerge) && !returned && !entersOnce(entry, item)) return false;
         switch (node.op) {
             case Op::Choice: {
                 std::uint32_t mask = branchMask(entry, item);
                 if (mask == 0) return false;
+                if ((node.flags & kMerge) && !std::has_single_bit(mask) && !entersOnce(entry, item))
+                    return false;
                 const Item first = afterBranch(item, static_cast<std::uint32_t>(std::countr_zero(mask)));
                 for (mask &= mask - 1; mask != 0; mask &= mask - 1)
                     items_.push_back(afterBranch(item, static_cast<std::uint32_t>(std::countr_zero(mask))));
@@ -261,6 +267,7 @@ bool FullSearch::follow(std::uint32_t entry, Item item, bool returned, std::uint
             }
             case Op::Call: {
                 if (!mayCall(entry, item)) return false;
+                if ((node.flags & kMerge) && !returned && !entersOnce(entry, item)) return false;
                 const std::uint32_t called = entryFor(node.arg, item.place.low);
                 if (!entries_[called].done) {
                     entries_[called].mayRecover =
@@ -269,18 +276,7 @@ bool FullSearch::follow(std::uint32_t entry, Item item, bool returned, std::uint
                     child = called;
                     return true;
                 }
-                const Slice ends = entries_[called].ends;
-                const Rest rest = restBehind(node);
-                // Ends that are also ends of this entry go there all at once.
-                const bool passOn = rest == Rest::Plain && ends.count != 0 &&
-                                    pool_[ends.first].high != entries_[called].position;
-                if (passOn) slices_.push_back(ends);
-                steps_ += ends.count / 8;
-                Item next{};
-                for (std::uint32_t i = ends.first; i < ends.first + ends.count; ++i)
-                    if (comesBack(item, entries_[called], pool_[i], next) &&
-                        ((rest != Rest::Open && !passOn) || goesOn(entry, node, next.place)))
-                        items_.push_back(next);
+                spread(entry, item, entries_[called]);
                 return false;
             }
             case Op::End:
@@ -292,6 +288,42 @@ bool FullSearch::follow(std::uint32_t entry, Item item, bool returned, std::uint
         }
         item.node = node.run;
     }
+}
+
+/// Goes on from all ends of a call.
+void FullSearch::spread(std::uint32_t entry, const Item& call, const Entry& called) {
+    constexpr std::uint32_t kMany = 8;
+    const NodeRow& node = table_.nodes[call.node];
+    const Slice ends = called.ends;
+    const Rest rest = restBehind(node);
+    // Ends that are also ends of this entry go there all at once.
+    const bool passOn = rest == Rest::Plain && ends.count != 0 && pool_[ends.first].high != called.position;
+    if (passOn) slices_.push_back(ends);
+    Arrivals* arrivals = ends.count >= kMany ? &arrivalsAt(node.run, entries_[entry].position) : nullptr;
+    steps_ += ends.count / 32;
+    Item next{};
+    for (std::uint32_t i = ends.first; i < ends.first + ends.count; ++i) {
+        if (!comesBack(call, called, pool_[i], next)) continue;
+        const Place& place = next.place;
+        if (arrivals && place.low == place.high && place.stopped < kPlainStops) {
+            const std::size_t bit = (place.low - arrivals->from) * kPlainStops + place.stopped;
+            std::uint64_t& word = arrivals->bits[bit / 64];
+            if ((word >> (bit % 64)) & 1) continue;
+            word |= std::uint64_t{1} << (bit % 64);
+        }
+        if (goesOn(entry, node, place))
+            items_.push_back(next);
+        else if (rest == Rest::Other || (rest == Rest::Plain && !passOn))
+            ends_.push_back(endOf(entry, place));
+    }
+}
+
+FullSearch::Arrivals& FullSearch::arrivalsAt(std::uint16_t node, std::uint32_t from) {
+    for (std::size_t i = works_.back().arrivals; i < arrivals_.size(); ++i)
+        if (arrivals_[i].node == node) return arrivals_[i];
+    arrivals_.push_back({node, from, {}});
+    arrivals_.back().bits.resize((text_.count() - from + 1) / 16 + 1);
+    return arrivals_.back();
 }
 
 void FullSearch::finishEntry(const Work& work) {
@@ -314,12 +346,7 @@ void FullSearch::finishEntry(const Work& work) {
     if (shared) {
         entry.ends = *slices;
     } else {
-        for (auto s = slices; s != slices_.end(); ++s) {
-            if (s != slices && *s == *(s - 1)) continue;
-            steps_ += s->count / 4;
-            for (std::uint32_t i = 0; i < s->count; ++i)
-                ends_.push_back(endOf(work.entry, pool_[s->first + i]));
-        }
+        gather(work);
         sortFrom(work.ends);
         entry.ends = {static_cast<std::uint32_t>(pool_.size()),
                       static_cast<std::uint32_t>(ends_.size()) - work.ends};
@@ -327,8 +354,35 @@ void FullSearch::finishEntry(const Work& work) {
     }
     ends_.resize(work.ends);
     slices_.resize(work.slices);
+    arrivals_.resize(work.arrivals);
     if (entry.mayRecover && entry.ends.count == 0) recover(entry);
     entry.done = true;
+}
+
+/// Puts the ends that an entry has from its calls with those that it has by itself. Calls at many places
+/// share most of their ends, so plain ones are marked by position and not sorted.
+void FullSearch::gather(const Work& work) {
+    const std::uint32_t from = entries_[work.entry].position;
+    marks_.assign((text_.count() - from + 1) / 16 + 1, 0);
+    for (std::size_t s = work.slices; s < slices_.size(); ++s) {
+        if (s != work.slices && slices_[s] == slices_[s - 1]) continue;
+        steps_ += slices_[s].count / 32;
+        for (std::uint32_t i = 0; i < slices_[s].count; ++i) {
+            const Place place = endOf(work.entry, pool_[slices_[s].first + i]);
+            if (place.low != place.high || place.stopped >= kPlainStops) {
+                ends_.push_back(place);
+                continue;
+            }
+            const std::size_t bit = (place.low - from) * kPlainStops + place.stopped;
+            marks_[bit / 64] |= std::uint64_t{1} << (bit % 64);
+        }
+    }
+    for (std::size_t word = 0; word < marks_.size(); ++word)
+        for (std::uint64_t left = marks_[word]; left != 0; left &= left - 1) {
+            const std::size_t bit = word * 64 + static_cast<std::size_t>(std::countr_zero(left));
+            const auto position = static_cast<std::uint32_t>(from + bit / kPlainStops);
+            ends_.push_back({position, position, static_cast<std::uint8_t>(bit % kPlainStops)});
+        }
 }
 
 /// The recover rule had no derivation: it stands for the tokens up to the first that can follow it at the
@@ -463,7 +517,7 @@ bool FullSearch::branch(const Walk& walk, const Item& item, std::uint32_t index,
     const Place& end = pool_[called.ends.first + index];
     return comesBack(item, called, end, next) &&
            (goesOn(walk.entry, node, next.place) ||
-            (restBehind(node) == Rest::Plain ? isWanted(walk, next.place) : restBehind(node) == Rest::Other));
+            (restBehind(node) != Rest::Open && isWanted(walk, next.place)));
 }
 
 /// Whether any way from an item comes to a wanted end of the walk's entry.

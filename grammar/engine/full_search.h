@@ -79,8 +79,16 @@ class FullSearch {
     /// An entry whose ends are being found: what it has put on the three stacks starts at these places.
     struct Work {
         std::uint32_t entry;
-        std::uint32_t items, ends, slices;
+        std::uint32_t items, ends, slices, arrivals;
         bool waiting;  ///< for the ends of the call on top of the items
+    };
+
+    /// The plain places at which one entry has come to one node: calls that have many ends each lead to the
+    /// same ones over and over.
+    struct Arrivals {
+        std::uint16_t node;
+        std::uint32_t from;  ///< position of the first bits
+        std::vector<std::uint64_t> bits;
     };
 
     /// A point where several ways go on from, in the search for one that leads to a wanted end.
@@ -126,7 +134,10 @@ class FullSearch {
 
     Outcome findEnds(std::uint32_t root);
     bool follow(std::uint32_t entry, Item item, bool returned, std::uint32_t& child);
+    void spread(std::uint32_t entry, const Item& call, const Entry& called);
+    Arrivals& arrivalsAt(std::uint16_t node, std::uint32_t from);
     void finishEntry(const Work& work);
+    void gather(const Work& work);
     void recover(Entry& entry);
 
     void writeDown(std::uint32_t root);
@@ -152,6 +163,8 @@ class FullSearch {
     std::vector<Item> items_;
     std::vector<Place> ends_;
     std::vector<Slice> slices_;
+    std::vector<Arrivals> arrivals_;
+    std::vector<std::uint64_t> marks_;
     std::vector<Rest> rests_;  ///< by node behind a call
     std::uint64_t steps_ = 0;
     std::uint32_t reached_ = 0;

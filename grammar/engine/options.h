@@ -16,8 +16,8 @@ struct Options {
     std::uint64_t stepsPerToken = 64;
     /// Steps of the search that takes over then. Past them the furthest reading of a last, narrow search
     /// stands, and a notice goes to the diagnostics.
-    std::uint64_t fullBaseSteps = 20000000;
-    std::uint64_t fullStepsPerToken = 4000;
+    std::uint64_t fullBaseSteps = 2000000;
+    std::uint64_t fullStepsPerToken = 1000;
     /// Tokens of one text.
     std::uint32_t maxTokens = 20000000;
 };
