@@ -14,8 +14,8 @@
 
 namespace {
 
-// Queries that Oracle reads otherwise, as the tests of its select state tell: a literal by itself is no item,
-// SUBSTRING is no word of its own, and a condition of a join keeps its logical operators.
+// Queries that Oracle reads otherwise: a literal by itself is no item, SUBSTRING is no word of its own, and
+// the ON of a join keeps its logical operators below it.
 constexpr std::u16string_view kOtherwiseInOracle[] = {
     u"SELECT 1 FROM t",
     u"SELECT 1, 2.5, 'text' FROM t",
@@ -356,6 +356,123 @@ TEST(DialectDifferences, MysqlASourceListTakesAStrayParenthesisSoThatANestedQuer
                 "    union 8 name=UNION;       predicate 0;       table t=t;       table u=u; "
                 "      table v=v;       field |a;       field |b;       field |c;       field |e; "
                 "      select 5 field=e;       from 5 table=v");
+}
+
+void expectOracle(std::u16string_view sql, std::string_view ofSqlServer, std::string_view ofOracle) {
+    expectDifference(sql, DB_ORACLE, ofSqlServer, ofOracle);
+}
+
+TEST(DialectDifferences, OracleAliasesOfColumnsKnowTheirKindAndColumn) {
+    expectOracle(u"SELECT t.a AS x FROM t", "alias x name=x source=x of=.",
+                 "alias x_FIELD name=x source=x of=t.a");
+}
+
+TEST(DialectDifferences, OracleAliasesOfTablesKnowTheirKindAndTable) {
+    expectOracle(u"SELECT o.a FROM t o", "alias o name=o source=o of=.",
+                 "alias o_TABLE name=o source=o of=t.; field t|a table");
+}
+
+TEST(DialectDifferences, OracleAnAliasOfAColumnHidesNoTable) {
+    expectOracle(u"SELECT a x FROM x", "alias x name=x source=x of=.",
+                 "alias x_FIELD name=x source=x of=.a; table x=x");
+}
+
+TEST(DialectDifferences, OracleAnAliasOfATableHidesNoColumn) {
+    expectOracle(u"SELECT x FROM t x", "alias x name=x source=x of=.; select 5 text=x",
+                 "alias x_TABLE name=x source=x of=t.; field |x; select 5 field=x");
+}
+
+TEST(DialectDifferences, OracleStringsKeepTheirQuotes) {
+    expectOracle(u"SELECT a FROM t WHERE b = 'x y'", "  item 2 text=x y", "  item 2 text='x y'");
+    expectOracle(u"SELECT a FROM t WHERE b = ''", "  item 2 text= ", "  item 2 text=''");
+}
+
+TEST(DialectDifferences, OracleALiteralByItselfIsNoItem) {
+    expectOracle(u"SELECT 1, 'x', a FROM t", "select 1 text=1; select 2 text=x", "");
+}
+
+TEST(DialectDifferences, OraclePartsOfAJoinAreNested) {
+    expectOracle(u"SELECT a FROM t JOIN u ON b = 1", "  item 0 name=  operator",
+                 "  item 0 name=  operator nested");
+}
+
+TEST(DialectDifferences, OracleAJoinWithoutAPrefixGetsABlank) {
+    expectOracle(u"SELECT a FROM JOIN u", "", "  item 0 text= ");
+}
+
+TEST(DialectDifferences, OracleOnStaysAboveItsLogicalOperators) {
+    expectOracle(
+        u"SELECT a FROM t JOIN u ON b = 1 AND c = 2",
+        "  item 0 name=  operator;   item 4 name=AND operator token;     item 4 name=ON operator token;     "
+        "item 4 name== operator token;       item 5 field=c;       item 1 text=2",
+        "  item 0 name=  operator nested;   item 4 name=ON operator token;     item 4 name=AND operator "
+        "token;       item 4 name== operator token;         item 5 field=c;         item 1 text=2");
+}
+
+TEST(DialectDifferences, OracleATopOfAShareIsALimit) {
+    expectOracle(u"SELECT TOP 5 PERCENT a FROM t", "", "limit 0 5");
+}
+
+TEST(DialectDifferences, OracleNewNamesKeepTheirQuotesInTheirItem) {
+    expectOracle(u"SELECT a AS \"My X\" FROM t", "alias my x name=My X source=My X of=.;   item 1 text=My X",
+                 "alias my x_FIELD name=My X source=My X of=.a;   item 1 text=\"My X\"");
+}
+
+TEST(DialectDifferences, OracleWordsOfSqlServerAreUserFunctions) {
+    expectOracle(u"SELECT SUBSTRING(a, 1), ISNULL(b, 0) FROM t",
+                 "select 4 name=SUBSTRING token; select 4 name=ISNULL token",
+                 "select 7 name=SUBSTRING token; select 7 name=ISNULL token");
+}
+
+TEST(DialectDifferences, OracleAUserFunctionNeedsNoOwner) {
+    expectOracle(u"SELECT f(a) FROM t", "field |f; select 5 field=f",
+                 "table t=t; field |a; select 7 name=f token;   item 5 field=a; from 5 table=t");
+}
+
+TEST(DialectDifferences, OracleBoundsStandUnderTheirOperator) {
+    expectOracle(u"SELECT a FROM t WHERE b BETWEEN 1 AND 2", "  item 1 text=1;   item 1 text=2",
+                 "  item 4 name=AND operator token;     item 1 text=1;     item 1 text=2");
+}
+
+TEST(DialectDifferences, OracleAllColumnsAreALiteral) {
+    expectOracle(u"SELECT * FROM t", "field |*; select 5 field=*", "select 1 text=*");
+}
+
+TEST(DialectDifferences, OracleNotInIsAnIn) {
+    expectOracle(
+        u"SELECT a FROM t WHERE b NOT IN (1, 2)", "",
+        "field |b; where 4 name=IN operator token;   item 5 field=b;   item 1 text=1;   item 1 text=2");
+}
+
+TEST(DialectDifferences, OracleAMinusSignIsNoPartOfAName) {
+    expectOracle(u"SELECT a-b FROM t", "field |a-b; select 5 field=a-b",
+                 "field |a; field |b; select 4 name=- operator token;   item 5 field=a;   item 5 field=b");
+}
+
+TEST(DialectDifferences, OracleGroupsBeginWithAColumn) {
+    expectOracle(u"SELECT a FROM t GROUP BY YEAR(a)", "group 4 name=YEAR token;   item 5 field=a", "");
+}
+
+TEST(DialectDifferences, OracleConcatenationIsAnOperator) {
+    expectOracle(u"SELECT a || b FROM t", "select 5 field=a",
+                 "table t=t; field |b; select 4 name=|| operator token;   item 5 field=a;   item 5 field=b; "
+                 "from 5 table=t");
+}
+
+TEST(DialectDifferences, OracleAComparisonTakesTheItemsAroundIt) {
+    expectOracle(u"SELECT a, b = 1 FROM t", "select 5 field=a", "  item 5 field=a");
+}
+
+TEST(DialectDifferences, OracleATableBehindAJoinBelongsToItsCondition) {
+    expectOracle(
+        u"SELECT a FROM t INNER JOIN u ON t.id = u.id, v",
+        "table v=v; from 4 name=, operator token;   item 4 name=JOIN operator token;     item 0 name=  "
+        "operator;       item 5 table=t;       item 1 text=INNER;     item 5 table=u;     item 4 name=ON "
+        "operator token;       item 4 name== operator token;         item 5 table=t field=id;         item 5 "
+        "table=u field=id;   item 5 table=v",
+        "field |v; from 4 name=JOIN operator token;   item 0 name=  operator nested;     item 5 table=t;     "
+        "item 1 text=INNER;   item 5 table=u;   item 4 name=ON operator token;     item 4 name== operator "
+        "token;       item 5 table=t field=id;       item 5 table=u field=id;       item 5 field=v");
 }
 
 }  // namespace
