@@ -50,6 +50,7 @@ enum class Role : std::uint8_t {
     LikeKeyword,
     RightParen,
     // Literals.
+    Cast,
     SqlLiteral,
     NumberLiteral,
     SqlString,
