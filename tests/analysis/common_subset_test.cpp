@@ -26,6 +26,34 @@ constexpr std::u16string_view kOtherwiseInOracle[] = {
     u"SELECT a FROM t INNER JOIN u ON t.id = u.id AND t.k = u.k",
 };
 
+// Queries that PostgreSQL reads otherwise, as postgresql_differences_test.cpp pins one by one: a leaf is no
+// item, such as the words of a join and the asterisk of COUNT(*), directions lose their word, a decimal
+// number keeps its first two tokens, and YEAR is no function.
+constexpr std::u16string_view kOtherwiseInPostgresql[] = {
+    u"SELECT t.a, u.b FROM t INNER JOIN u ON t.id = u.id",
+    u"SELECT 1, 2.5, 'text' FROM t",
+    u"SELECT o.a, c.b FROM orders o INNER JOIN customers c ON o.id = c.id",
+    u"SELECT t.a * u.b FROM t INNER JOIN u ON t.id = u.id",
+    u"SELECT COUNT(*) FROM t",
+    u"SELECT a FROM t WHERE b = 'x' AND YEAR(c) = 2020",
+    u"SELECT a FROM t INNER JOIN u ON t.id = u.id",
+    u"SELECT a FROM t LEFT JOIN u ON t.id = u.id",
+    u"SELECT a FROM t RIGHT JOIN u ON t.id = u.id",
+    u"SELECT a FROM t LEFT OUTER JOIN u ON t.id = u.id",
+    u"SELECT a FROM t RIGHT OUTER JOIN u ON t.id = u.id",
+    u"SELECT a FROM t CROSS JOIN u",
+    u"SELECT a FROM t INNER JOIN u ON t.id = u.id AND t.k = u.k",
+    u"SELECT a FROM t o INNER JOIN u p ON o.id = p.id WHERE o.b = 1",
+    u"SELECT a FROM t INNER JOIN u ON t.id = u.id INNER JOIN v ON u.id = v.id",
+    u"SELECT a FROM t LEFT JOIN u ON t.id = u.id LEFT JOIN v ON u.id = v.id WHERE t.b > 1",
+    u"SELECT a, COUNT(*) FROM t GROUP BY a",
+    u"SELECT a, COUNT(*) FROM t GROUP BY a HAVING COUNT(*) > 1",
+    u"SELECT a FROM t ORDER BY a ASC",
+    u"SELECT a FROM t ORDER BY a DESC, b",
+    u"SELECT a FROM t ORDER BY a, b DESC",
+    u"SELECT a, SUM(b) FROM t WHERE c = 1 GROUP BY a HAVING SUM(b) > 10 ORDER BY a DESC",
+};
+
 // The dialects that are compared with SQL Server.
 struct Compared {
     const char* name;
@@ -40,6 +68,7 @@ constexpr Compared kDialects[] = {
      DB_ORACLE,
      {.aliasesAreKept = true, .stringsAreQuoted = true, .joinPartsAreNested = true},
      kOtherwiseInOracle},
+    {"postgresql", DB_POSTGRESQL, {}, kOtherwiseInPostgresql},
 };
 
 constexpr std::u16string_view kQueries[] = {
@@ -58,7 +87,7 @@ constexpr std::u16string_view kQueries[] = {
     u"select a from t where b = 1",
     // Aliases.
     u"SELECT a AS x FROM t",
-    u"SELECT a x, b y FROM t",
+    u"SELECT a x, b z FROM t",
     u"SELECT a + b AS total FROM t",
     u"SELECT o.a FROM t o",
     u"SELECT o.a, o.b AS x FROM t AS o",
