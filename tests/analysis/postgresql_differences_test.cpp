@@ -47,6 +47,14 @@ TEST(PostgresqlDiffersFromSqlServer, ANumberOfThreeTokensLosesItsThird) {
     EXPECT_EQ(Pg(sql).select(), "(1 text=2.)");
 }
 
+TEST(PostgresqlDiffersFromSqlServer, YearIsAUnitOfIntervalsAndNoFunction) {
+    const std::u16string_view sql = u"SELECT a FROM t WHERE b = 1 AND YEAR(c) = 2020";
+    EXPECT_EQ(listText(Analysed(sql).query.m_whereItem->m_items),
+              "(4 name=AND op type=125 (4 name== op type=254 (5 field=b) (1 text=1)) "
+              "(4 name== op type=254 (4 name=YEAR type=173 (5 field=c)) (1 text=2020)))");
+    EXPECT_EQ(Pg(sql).where(), "(4 name== op type=354 (5 field=b) (1 text=1))");
+}
+
 TEST(PostgresqlDiffersFromSqlServer, AnAsteriskAloneIsAPredicate) {
     const std::u16string_view sql = u"SELECT * FROM t";
     EXPECT_EQ(listText(Analysed(sql).query.m_selectItems), "(5 field=*)");

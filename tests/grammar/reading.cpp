@@ -200,7 +200,7 @@ SyntaxDump readBySets(std::u16string_view text) {
     engine::Options& options = optionsOf(pipeline.parser());
     options.baseSteps = options.stepsPerToken = 0;
     copyTree(pipeline.parser()->start_rule(pipeline.parser()).tree, reading);
-    return reading.tree;
+    return reading.statement;
 }
 
 template <typename G>
