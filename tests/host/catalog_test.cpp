@@ -27,13 +27,13 @@ TEST(Catalog, GivesTheIdToldOrElseTheNameInBraces) {
 
 TEST(Catalog, ClonesKeepIdsAndBelongToThemselves) {
     const auto database = readCatalog(R"([{"table": "a", "columns": ["x"]}])");
-    const std::unique_ptr<CatalogDatabase> clone(database->Clone());
+    const std::unique_ptr<Database> clone(database->Clone());
     CZRTableInfo* table = clone->FindTableBySrcName(u"a");
     ASSERT_NE(table, nullptr);
     EXPECT_NE(table, database->FindTableBySrcName(u"a"));
     EXPECT_EQ(table->GetID(), u"{a}");
     EXPECT_EQ(table->GetDatabase(), clone.get());
-    auto* field = dynamic_cast<CatalogField*>(table->FindFieldBySrcName(u"x"));
+    auto* field = dynamic_cast<Field*>(table->FindFieldBySrcName(u"x"));
     ASSERT_NE(field, nullptr);
     EXPECT_EQ(field->GetOwner(), table);
 }

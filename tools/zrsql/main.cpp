@@ -23,11 +23,12 @@ namespace {
 constexpr int kUnreadable = 1;
 
 std::unique_ptr<CZRDatabaseInfo> openDatabase(const Options& options) {
-    if (options.catalog.empty()) return std::make_unique<host::CatalogDatabase>();
+    if (options.catalog.empty()) return std::make_unique<host::Database>();
+    if (options.catalog != "-") return host::openCatalog(options.catalog);
     try {
-        return host::readCatalog(readBytes(options.catalog));
+        return host::readCatalog(readBytes("-"));
     } catch (const host::CatalogError& problem) {
-        throw InputError(options.catalog + ": " + problem.what());
+        throw InputError(std::string("standard input: ") + problem.what());
     }
 }
 
