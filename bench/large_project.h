@@ -65,8 +65,7 @@ inline CString queryText(int number, const ProjectSize& size) {
         u"SELECT a.column_0, a.column_1 AS name_%d, b.column_4, SUM(b.column_5 * 2) AS total FROM table_%d a "
         u"INNER JOIN table_%d b ON a.column_0 = b.column_3",
         number, table(0), table(1));
-    if (number % 4)
-        text += numbered(u" INNER JOIN query_%d q", number - 1) + u" ON q.column_0 = a.column_0";
+    if (number % 4) text += numbered(u" INNER JOIN query_%d q", number - 1) + u" ON q.column_0 = a.column_0";
     text += u" WHERE a.column_2 LIKE 'A%' AND b.column_6 > 10";
     if (number % 4) text += numbered(u" AND query_%d.total > 5", number - 1);
     return text + u" ORDER BY b.column_4";

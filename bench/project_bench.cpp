@@ -51,44 +51,51 @@ void analyseAll(Database& database) {
     for (CZRQueryInfo* query : database.Queries) BuildQueryInfo(query, DB_MSSQL);
 }
 
-void analyse(benchmark::State& state) {
+/// The time of a step over a project made anew for each round.
+template <class Prepare, class Step>
+void measure(benchmark::State& state, Prepare prepare, Step step) {
+    std::unique_ptr<Database> database;
     for (auto _ : state) {
         state.PauseTiming();
-        const std::unique_ptr<Database> database = zr::bench::makeProject(kLargeProject);
+        database = zr::bench::makeProject(kLargeProject);
+        prepare(*database);
         state.ResumeTiming();
-        analyseAll(*database);
-        state.PauseTiming();
+        step(*database);
     }
+}
+
+void analyse(benchmark::State& state) {
+    measure(
+        state, [](Database&) {}, analyseAll);
 }
 
 /// Everything that looks sources and columns up: sources, validation, and the items of all clauses.
 void resolve(benchmark::State& state) {
     int correct = 0;
-    for (auto _ : state) {
-        state.PauseTiming();
-        const std::unique_ptr<Database> database = zr::bench::makeProject(kLargeProject);
-        analyseAll(*database);
-        state.ResumeTiming();
-        database->SortQueries();
-        for (CZRQueryInfo* query : database->Queries) {
+    measure(state, analyseAll, [&correct](Database& database) {
+        database.SortQueries();
+        for (CZRQueryInfo* query : database.Queries) {
             query->ResolveSources();
             correct += query->GetCorrect() == 0;
             query->ResolveAllItems();
         }
-        state.PauseTiming();
-    }
+    });
     state.counters["valid queries"] =
         benchmark::Counter(static_cast<double>(correct), benchmark::Counter::kAvgIterations);
 }
 
+template <class Run>
+void registerOne(const std::string& name, Run run) {
+    benchmark::RegisterBenchmark(name.c_str(), run)
+        ->Unit(benchmark::kMillisecond)
+        ->UseRealTime()
+        ->Iterations(3);
+}
+
 void registerForms(const char* name, void (*run)(benchmark::State&, StorageForm)) {
     for (const StorageForm form : {StorageForm::Json, StorageForm::Sqlite})
-        benchmark::RegisterBenchmark(
-            (std::string(name) + (form == StorageForm::Json ? "/json" : "/sqlite")).c_str(),
-            [run, form](benchmark::State& state) { run(state, form); })
-            ->Unit(benchmark::kMillisecond)
-            ->UseRealTime()
-            ->Iterations(3);
+        registerOne(std::string(name) + (form == StorageForm::Json ? "/json" : "/sqlite"),
+                    [run, form](benchmark::State& state) { run(state, form); });
 }
 
 }  // namespace
@@ -97,8 +104,8 @@ int main(int argc, char** argv) {
     registerForms("save_new", saveNew);
     registerForms("save_over_old", saveOver);
     registerForms("load", load);
-    for (const auto& [name, run] : {std::pair{"analyse", analyse}, std::pair{"resolve", resolve}})
-        benchmark::RegisterBenchmark(name, run)->Unit(benchmark::kMillisecond)->UseRealTime()->Iterations(3);
+    registerOne("analyse", analyse);
+    registerOne("resolve", resolve);
     benchmark::Initialize(&argc, argv);
     benchmark::RunSpecifiedBenchmarks();
     for (const StorageForm form : {StorageForm::Json, StorageForm::Sqlite})

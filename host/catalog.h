@@ -20,9 +20,9 @@ class CatalogError : public std::runtime_error {
 // where.
 std::unique_ptr<Database> readCatalog(std::string_view json);
 
-// The catalogue of a file: such a list, or a stored project (project.h) of either form. The IDs of a project's
-// tables, columns and queries are made of their names in the same way. Throws CatalogError; the message
-// begins with the file's name.
+// The catalogue of a file: such a list, or a stored project (project.h) of either form. The IDs of a
+// project's tables, columns and queries are made of their names in the same way. Throws CatalogError; the
+// message begins with the file's name.
 std::unique_ptr<Database> openCatalog(const std::string& path);
 
 }  // namespace zr::host

@@ -13,8 +13,8 @@ class FileError : public std::runtime_error {
 };
 
 // Gives a file a new content in one step: whatever interrupts it, the file holds the old content or the new
-// one, whole. The new content is written beside the file, brought to the disk, and then takes its name. Raises
-// FileError and leaves the file as it was when that can't be done. A link stays a link.
+// one, whole. The new content is written beside the file, brought to the disk, and then takes its name.
+// Raises FileError and leaves the file as it was when that can't be done. A link stays a link.
 void replaceFile(const std::string& path, std::string_view bytes);
 
 // All bytes of a file. Raises FileError.

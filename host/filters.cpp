@@ -8,8 +8,8 @@ namespace zr::host {
 namespace {
 
 // By FilterCondition.
-constexpr const char16_t* kOperators[] = {u" = ",  u" <> ", u" < ",    u" <= ",
-                                          u" > ",  u" >= ", u" LIKE ", u" NOT LIKE "};
+constexpr const char16_t* kOperators[] = {u" = ", u" <> ", u" < ",    u" <= ",
+                                          u" > ", u" >= ", u" LIKE ", u" NOT LIKE "};
 
 bool isNumber(int valueType) {
     return valueType >= FV_INTEGER && valueType <= FV_FLOATING;

@@ -25,7 +25,8 @@ class JsonReader {
     // Puts the values and sections of the object into a section, which is to be empty. Places are lines from
     // 1 on. Raises StorageError, with the line and what is wrong, for a text that is no JSON object, a value
     // that is neither a text nor a whole number of 32 bits, a name that stands twice, more than
-    // kMostValues values in a section, and sections more than kMostLevels deep. Needs no machine stack for the depth.
+    // kMostValues values in a section, and sections more than kMostLevels deep. Needs no machine stack for
+    // the depth.
     void read(std::string_view json, StoredSection& section);
 
     // The opposite of nameInUtf8; holds as long as the reader. Raises StorageError for a broken escape.

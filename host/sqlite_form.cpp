@@ -120,8 +120,8 @@ void requireProject(Connection& connection) {
         throw StorageError("the database is no project");
     const int version = connection.number("PRAGMA user_version");
     if (version != kFormVersion)
-        throw StorageError("the database has the form " + std::to_string(version) + " of a project, and only " +
-                           std::to_string(kFormVersion) + " is known");
+        throw StorageError("the database has the form " + std::to_string(version) +
+                           " of a project, and only " + std::to_string(kFormVersion) + " is known");
 }
 
 // Puts the rows together as they come.
@@ -221,7 +221,9 @@ class SectionWriter {
 // Replaces the content of the database, or fills an empty one.
 void writeAll(Connection& connection, const StoredSection& root) {
     connection.run("BEGIN IMMEDIATE");
-    if (connection.number("PRAGMA page_count") == 0) {
+    const bool isEmpty = connection.number("PRAGMA application_id") == 0 &&
+                         connection.number("SELECT count(*) FROM sqlite_schema") == 0;
+    if (isEmpty) {
         connection.run("PRAGMA application_id = " + std::to_string(kApplicationId));
         connection.run("PRAGMA user_version = " + std::to_string(kFormVersion));
     } else {

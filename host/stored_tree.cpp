@@ -30,9 +30,8 @@ std::string inQuotes(const CString& name) {
 template <class Visit>
 bool walk(const StoredSection& section, const std::string& path, const Visit& visit) {
     if (visit(section, path)) return true;
-    return std::any_of(section.children.begin(), section.children.end(), [&](const auto& child) {
-        return walk(*child, joined(path, child->name), visit);
-    });
+    return std::any_of(section.children.begin(), section.children.end(),
+                       [&](const auto& child) { return walk(*child, joined(path, child->name), visit); });
 }
 
 }  // namespace
