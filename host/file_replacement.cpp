@@ -50,6 +50,7 @@ class FileBeside {
     FileBeside(const FileBeside&) = delete;
     FileBeside& operator=(const FileBeside&) = delete;
 
+    const std::string& path() const { return path_; }
     void write(std::string_view bytes) {
         while (!bytes.empty()) {
             const ssize_t count = ::write(file_.number(), bytes.data(), bytes.size());
@@ -102,6 +103,12 @@ std::string withoutLinks(const std::string& path) {
 void replaceFile(const std::string& path, std::string_view bytes) {
     FileBeside beside(withoutLinks(path));
     beside.write(bytes);
+    beside.takeName();
+}
+
+void replaceFileBy(const std::string& path, const std::function<void(const std::string&)>& write) {
+    FileBeside beside(withoutLinks(path));
+    write(beside.path());
     beside.takeName();
 }
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <stdexcept>
 #include <string>
 #include <string_view>
@@ -16,6 +17,9 @@ class FileError : public std::runtime_error {
 // one, whole. The new content is written beside the file, brought to the disk, and then takes its name.
 // Raises FileError and leaves the file as it was when that can't be done. A link stays a link.
 void replaceFile(const std::string& path, std::string_view bytes);
+
+// The same with a content that write brings into the empty file whose path it is given.
+void replaceFileBy(const std::string& path, const std::function<void(const std::string&)>& write);
 
 // All bytes of a file. Raises FileError.
 std::string readFile(const std::string& path);

@@ -219,7 +219,8 @@ class SectionWriter {
 };
 
 // Replaces the content of the database, or fills an empty one.
-void writeAll(Connection& connection, const StoredSection& root) {
+void writeInto(const std::string& path, const StoredSection& root) {
+    Connection connection(path, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE);
     connection.run("BEGIN IMMEDIATE");
     const bool isEmpty = connection.number("PRAGMA application_id") == 0 &&
                          connection.number("SELECT count(*) FROM sqlite_schema") == 0;
@@ -258,10 +259,14 @@ StoredTree readSqlite(const std::string& path) {
 
 void writeSqlite(const std::string& path, const StoredSection& root) {
     std::error_code failed;
-    const bool isNew = !std::filesystem::exists(path, failed);
+    const auto oldSize = std::filesystem::file_size(path, failed);
+    const bool isNew = static_cast<bool>(failed);
     try {
-        Connection connection(path, SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE);
-        writeAll(connection, root);
+        // What is no database gives way as a whole; a database is changed in place.
+        if (!isNew && oldSize > 0 && !isSqliteFile(path))
+            replaceFileBy(path, [&root](const std::string& beside) { writeInto(beside, root); });
+        else
+            writeInto(path, root);
     } catch (const std::runtime_error& error) {
         // What was not there before is not there afterwards.
         if (isNew && std::filesystem::file_size(path, failed) == 0) std::filesystem::remove(path, failed);

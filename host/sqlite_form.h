@@ -18,8 +18,9 @@ bool isSqliteFile(const std::string& path);
 StoredTree readSqlite(const std::string& path);
 
 // Replaces all that the file holds, or makes it, in one transaction: whatever interrupts it, the next reader
-// finds the old content or the new one, whole. Raises FileError when it can't be done, and for a database
-// that is there and is no project.
+// finds the old content or the new one, whole. A file that is no database is replaced as replaceFile does.
+// Raises FileError when it can't be done, and for a database that is there and is no project: that one stays
+// as it is.
 void writeSqlite(const std::string& path, const StoredSection& root);
 
 }  // namespace zr::host

@@ -76,9 +76,17 @@ const Dialect* findDialect(std::string_view name) {
     return nullptr;
 }
 
-std::string dialectNames() {
+const Dialect* findDialect(DBTypes kind) {
+    if (kind == DB_MSSQL_20) kind = DB_MSSQL;
+    for (const Dialect& dialect : kDialects)
+        if (kind != DB_NONE && dialect.kind == kind) return &dialect;
+    return nullptr;
+}
+
+std::string dialectNames(bool withAnalysis) {
     std::string names;
     for (const Dialect& dialect : kDialects) {
+        if (withAnalysis && dialect.kind == DB_NONE) continue;
         if (!names.empty()) names += ", ";
         names += dialect.name;
     }

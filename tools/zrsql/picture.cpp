@@ -253,8 +253,9 @@ class QueryPicture {
     FromNames names_;
 };
 
-void drawText(Text& out, std::u16string_view text) {
-    out += u"SQL\n";
+}  // namespace
+
+void appendSql(Text& out, std::u16string_view text) {
     while (!text.empty()) {
         const std::size_t end = text.find_first_of(u"\r\n");
         const std::u16string_view line = text.substr(0, end);
@@ -264,25 +265,24 @@ void drawText(Text& out, std::u16string_view text) {
     }
 }
 
-void drawStop(Text& out, const ReadPlace& place) {
+void appendStop(Text& out, const ReadPlace& place) {
     if (!place.stop) return;
     out += u"\nRead " + number(place.taken) + u" of " + number(place.all) + u" tokens; stopped at line " +
            number(place.stop->line) + u", column " + number(place.stop->column) + u", before \"" +
            place.stop->text + u"\"\n";
 }
 
-}  // namespace
-
 void drawPicture(std::string& out, const CString& text, const CZRQueryInfo& root, const ReadPlace& place) {
     Text picture;
-    drawText(picture, text);
+    picture += u"SQL\n";
+    appendSql(picture, text);
     Numbering numbering;
     numbering.numberOf(root);
     while (const CZRQueryInfo* query = numbering.next()) {
         if (query != &root) picture += u"\n" + Text(u"Query ") + number(numbering.numberOf(*query)) + u'\n';
         QueryPicture(picture, *query, query != &root, numbering).draw();
     }
-    drawStop(picture, place);
+    appendStop(picture, place);
     out += CString(picture).toUtf8();
 }
 
