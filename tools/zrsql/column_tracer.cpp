@@ -21,8 +21,10 @@ void addNew(std::vector<ColumnOrigin>& to, const std::vector<ColumnOrigin>& orig
 const CString* starQualifier(const SelectItem& item) {
     static const CString none;
     if (const SelectItemField* field = classOf(item).field) {
-        if (field->m_sourceField != kStar) return nullptr;
-        return field->m_tableAlias.IsEmpty() ? &field->m_sourceTable : &field->m_tableAlias;
+        const CString& qualifier = field->m_tableAlias.IsEmpty() ? field->m_sourceTable : field->m_tableAlias;
+        // Some dialects leave all columns of a table as the table without a column.
+        const bool isTable = field->m_sourceField.IsEmpty() && !qualifier.IsEmpty();
+        return isTable || field->m_sourceField == kStar ? &qualifier : nullptr;
     }
     return item.m_text == kStar && item.m_items.IsEmpty() ? &none : nullptr;
 }
