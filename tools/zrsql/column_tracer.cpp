@@ -38,11 +38,20 @@ CString nameOf(const SelectItem& item) {
 
 }  // namespace
 
-ColumnTracer::Known ColumnTracer::known(const CString& name) {
-    const auto [place, isNew] = known_.try_emplace(name);
+ColumnTracer::ColumnTracer(CZRDatabaseInfo& database) : database_(database) {
+    for (CZRTableInfo* table : database.Tables) byId_.try_emplace(table->GetID(), Meaning{table, nullptr});
+    for (const CZRQueryInfo* query : database.Queries)
+        byId_.try_emplace(query->GetID(), Meaning{nullptr, query});
+}
+
+ColumnTracer::Meaning ColumnTracer::meaningOf(const CZRQueryInfo& query, const CString& source) {
+    // The analysis has looked up nearly all of them; the lists are long to search.
+    if (const CString* id = query.m_sourceTables.Find(source))
+        if (const auto found = byId_.find(*id); found != byId_.end()) return found->second;
+    const auto [place, isNew] = byName_.try_emplace(source);
     if (isNew) {
-        place->second.table = database_.FindTableBySrcName(name);
-        if (!place->second.table) place->second.query = database_.FindQueryBySrcName(name);
+        place->second.table = database_.FindTableBySrcName(source);
+        if (!place->second.table) place->second.query = database_.FindQueryBySrcName(source);
     }
     return place->second;
 }
@@ -55,9 +64,9 @@ ColumnTracer::Sources ColumnTracer::sourcesOf(const CZRQueryInfo& query) {
         source.query = from.query;
         if (from.table) {
             source.name = from.table->m_sourceTable;
-            const Known meant = known(source.name);
-            source.table = meant.table;
-            source.query = meant.query;
+            const Meaning meaning = meaningOf(query, source.name);
+            source.table = meaning.table;
+            source.query = meaning.query;
         }
         sources.push_back(std::move(source));
     }

@@ -31,10 +31,17 @@ class ColumnTracer {
  public:
     using Columns = std::vector<ResultColumn>;
 
+    // What a name means in the database: a table, else a query, or neither.
+    struct Meaning {
+        CZRTableInfo* table = nullptr;
+        const CZRQueryInfo* query = nullptr;
+    };
+
     // The database is to stay as it is for as long as the object lives.
-    explicit ColumnTracer(CZRDatabaseInfo& database) : database_(database) {}
+    explicit ColumnTracer(CZRDatabaseInfo& database);
 
     const Columns& columnsOf(const CZRQueryInfo& query);
+    Meaning meaningOf(const CZRQueryInfo& query, const CString& source);
 
  private:
     // A source of a FROM clause, with what it is: a table, a query, or neither of them known.
@@ -45,12 +52,7 @@ class ColumnTracer {
         const CZRQueryInfo* query = nullptr;
     };
     using Sources = std::vector<Source>;
-    struct Known {
-        CZRTableInfo* table;
-        const CZRQueryInfo* query;
-    };
 
-    Known known(const CString& name);
     Sources sourcesOf(const CZRQueryInfo& query);
     std::vector<const CZRQueryInfo*> queriesBehind(const CZRQueryInfo& query);
     Columns trace(const CZRQueryInfo& query);
@@ -64,7 +66,8 @@ class ColumnTracer {
     bool hasColumn(const Source& source, const CString& name);
 
     CZRDatabaseInfo& database_;
-    std::unordered_map<CString, Known> known_;
+    std::unordered_map<CString, Meaning> byId_;
+    std::unordered_map<CString, Meaning> byName_;  // those that were looked up
     std::unordered_map<const CZRQueryInfo*, Columns> traced_;
 };
 

@@ -46,6 +46,10 @@ void ProjectWords::addTo(CLI::App& app) {
         ->type_name("FILE");
     addForm(*created);
 
+    created->footer(
+        "Example:\n  zrsql project new shop.json -d mssql --schema dbo\n\n"
+        "Ends with status 1, and makes nothing, when the file is there or can't be written.");
+
     CLI::App* table = add("add-table", "Add a table", ProjectCommand::AddTable);
     table->add_option("NAME", options_.name, "Name of the table")->required();
     table->add_option("COLUMN", options_.columns,
@@ -61,12 +65,18 @@ void ProjectWords::addTo(CLI::App& app) {
         ->type_name("KEY")
         ->allow_extra_args(false);
 
+    table->footer(
+        "Example:\n  zrsql project add-table shop.json orders id:int customer_id:int \\\n"
+        "      --key id --references \"customer_id=customers(id)\"");
+
     CLI::App* query = add("add-query", "Add a query", ProjectCommand::AddQuery);
     query->add_option("NAME", options_.name, "Name of the query")->required();
     CLI::Option* text = query->add_option("TEXT", text_, "The SQL text; - or nothing reads standard input");
     query->add_option("-f,--file", options_.textFile, "Read the SQL text from a file (UTF-8)")
         ->type_name("FILE")
         ->excludes(text);
+
+    query->footer("Example:\n  zrsql project add-query shop.json all_orders \"SELECT * FROM orders\"");
 
     add("list", "List tables and queries", ProjectCommand::List);
     add("show", "Show a table, a query, or the project's options", ProjectCommand::Show)
@@ -78,12 +88,25 @@ void ProjectWords::addTo(CLI::App& app) {
     convert->add_option("TARGET", options_.target, "The file to write")->required();
     addForm(*convert);
 
+    convert->footer(
+        "Example:\n  zrsql project convert shop.json shop.db\n\n"
+        "Nothing is lost: every stored name and value is written as it stands.");
+
     CLI::App* analyze = add("analyze", "Analyse the queries and show where each result column comes from",
                             ProjectCommand::Analyze);
     analyze->add_option("NAME", options_.names, "Show these queries only");
     analyze->add_option("--format", format_, "Form of the output: pretty, json")
         ->check(CLI::IsMember({"pretty", "json"}))
         ->type_name("FORMAT");
+    analyze->footer(
+        "Example:\n  zrsql project analyze shop.json all_orders\n\n"
+        "Each query is analysed behind those that it reads from. Queries that read from each other in a\n"
+        "ring are an error. Wrong SQL is none: what was read of it is shown.");
+    project_->footer(
+        "A project that is read may have any name. One that is made is JSON for a name that ends in .json,\n"
+        "SQLite for .db, .sqlite or .sqlite3. Exit status: 0 done, 1 a file can't be read or written or is "
+        "no\n"
+        "whole project, 2 wrong use.");
 }
 
 std::optional<ProjectOptions> ProjectWords::read() const {

@@ -85,10 +85,9 @@ Text expressionOf(const ResultColumn& column) {
 }
 
 // What a source of the query is in the project.
-std::string_view meaningOf(const CZRQueryInfo& query, const CString& source) {
-    const CZRSourceInfo* known = query.FindSource(source);
-    if (!known) return "unknown";
-    return dynamic_cast<const CZRQueryInfo*>(known) ? "query" : "table";
+std::string_view wordFor(const ColumnTracer::Meaning& meaning) {
+    if (meaning.table) return "table";
+    return meaning.query ? "query" : "unknown";
 }
 
 bool endsInFirstClause(const CZRQueryInfo& query) {
@@ -226,7 +225,7 @@ void appendAnalysis(std::string& out, const CZRQueryInfo& query, ColumnTracer& t
     appendBlock(text, u"Columns", columns);
     TextTable sources;
     for (const auto* source : sortedEntries(query.m_sourceTables)) {
-        const std::string_view meaning = meaningOf(query, source->key);
+        const std::string_view meaning = wordFor(tracer.meaningOf(query, source->key));
         sources.add({textOf(source->key), meaning == "unknown" ? u"not in the project" : textOf(meaning)});
     }
     appendBlock(text, u"Sources", sources);
@@ -248,7 +247,7 @@ void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, ColumnTrace
         out += '{';
         JsonMembers entry(out);
         entry.text("name", source->key.View());
-        entry.ascii("is", meaningOf(query, source->key));
+        entry.ascii("is", wordFor(tracer.meaningOf(query, source->key)));
         out += '}';
     }
     out += ']';
