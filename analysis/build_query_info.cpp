@@ -4,6 +4,7 @@
 #include "analysis/mssql_state.h"
 #include "analysis/mysql_state.h"
 #include "analysis/oracle_state.h"
+#include "analysis/postgresql_state.h"
 #include "zrparsersql/analysis.h"
 #include "zrparsersql/sql_parsers.h"
 
@@ -24,6 +25,9 @@ void analyse(CZRQueryInfo& query, DBTypes kind) {
             break;
         case DB_ORACLE:
             zr::analyseQuery<CZROracleParser, OracleStateSelectQuery>(query, asItIs);
+            break;
+        case DB_POSTGRESQL:
+            zr::analyseQuery<CZRPostgreParser, PostgreStateSelectQuery>(query, asItIs);
             break;
         default:
             break;

@@ -8,14 +8,18 @@ namespace zr {
 
 void SelectState::ProcessExpression(CZRSQLTree* node, ItemList* list, CZRSQLTree* parent) {
     if (!node) return;
-    while (!IsOperator(node)) {
+    for (;;) {
+        if (dialect_.leavesAreNoOperands && !node->GetChildCount()) return;
+        if (IsOperator(node)) return ProcessOperator(node, list, parent);
         switch (roleOf(node)) {
             case Role::SelectQuery:
                 return ProcessSubQuery(node, list);
             case Role::ColumnSpecification:
                 return ProcessColumn(node, list);
             case Role::TableSpecification:
-                append(list, MakeTableItem(node));
+                append(list, tableOperand(node));
+                return;
+            case Role::Cast:
                 return;
             case Role::NewName:
                 appendText(list, newNameText(node), SIK_NUMBER);
@@ -50,7 +54,6 @@ void SelectState::ProcessExpression(CZRSQLTree* node, ItemList* list, CZRSQLTree
                 node = node->GetChild(0);
         }
     }
-    ProcessOperator(node, list, parent);
 }
 
 void SelectState::joinPostfixStep(CZRSQLTree* node, ItemList* list, CZRSQLTree* parent) {

@@ -21,9 +21,14 @@ struct Dialect {
     char16_t quoteClose;
     // A function is a call and nothing else: no escapes, no column that comes out ahead of it.
     bool functionsArePlain = false;
-    bool literalsAreNoItems = false;      // a literal that is an item of a clause by itself is passed over
-    bool topIsAlwaysALimit = false;       // one with PERCENT or WITH TIES as well
-    bool fillsMissingJoinPrefix = false;  // a JOIN with nothing in front of it gets an item for that
+    // A literal that is an item of a clause by itself is passed over.
+    bool literalsAreNoItems = false;
+    // A TOP with PERCENT or WITH TIES is one as well.
+    bool topIsAlwaysALimit = false;
+    // A JOIN with nothing in front of it gets an item for that.
+    bool fillsMissingJoinPrefix = false;
+    // A node without children is never an item of an expression.
+    bool leavesAreNoOperands = false;
 };
 
 // Reads the tree of one SELECT and writes what it finds into one descriptor: copies of the clauses as lists
@@ -132,6 +137,8 @@ class SelectState {
     }
     AliasNames& aliasNames();
     SelectItem& appendText(ItemList* list, const CString& text, int kind);
+    // The item for a table that stands in an expression, such as the left side of a join.
+    virtual std::unique_ptr<SelectItem> tableOperand(CZRSQLTree* node) { return MakeTableItem(node); }
     // The node below a function whose children are its parameters, or null.
     virtual CZRSQLTree* functionParameters(CZRSQLTree* node);
     // The item that stands for a part of a join, named " ".

@@ -25,6 +25,7 @@ enum class Role : std::uint8_t {
     ColumnSpecification,
     TableSpecification,
     DbName,
+    SchemaName,
     TableName,
     ColumnName,
     NewName,
@@ -50,6 +51,7 @@ enum class Role : std::uint8_t {
     LikeKeyword,
     RightParen,
     // Literals.
+    Cast,
     SqlLiteral,
     NumberLiteral,
     SqlString,

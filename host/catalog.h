@@ -5,42 +5,9 @@
 #include <string>
 #include <string_view>
 
-#include "zrparsersql/database_info.h"
+#include "host/database.h"
 
 namespace zr::host {
-
-// A column that is known by name only.
-class CatalogField : public CZRFieldInfo {
- public:
-    CatalogField* Clone(int selectedOnly = 0) const override;
-    bool IsDerivedSource() const override { return false; }
-    bool IsBaseTable() const override { return false; }
-    void SetOwner(CZRTableInfo* owner) override { owner_ = owner; }
-    CString GetTypeDefinition() const override { return TypeMapped; }
-    CString GetCollation() const override { return CString(); }
-    int IsExcludedFromKey() const override { return 0; }
-
-    CZRTableInfo* GetOwner() const { return owner_; }
-
- private:
-    CZRTableInfo* owner_ = nullptr;
-};
-
-class CatalogTable : public CZRTableInfo {
- public:
-    CatalogTable() = default;
-    CatalogTable(const CatalogTable& other, int selectedOnly) : CZRTableInfo(other, selectedOnly) {}
-    CatalogTable* Clone(int selectedOnly = 0) const override;
-};
-
-// The model of one source database as far as a catalogue tells it. A clone keeps all IDs, so that what is
-// resolved against a clone means the same object of the original.
-class CatalogDatabase : public CZRDatabaseInfo {
- public:
-    CatalogDatabase() = default;
-    CatalogDatabase(const CatalogDatabase& other, int selectedOnly) : CZRDatabaseInfo(other, selectedOnly) {}
-    CatalogDatabase* Clone(int selectedOnly = 0) const override;
-};
 
 class CatalogError : public std::runtime_error {
  public:
@@ -51,6 +18,11 @@ class CatalogError : public std::runtime_error {
 // and id may be left out; a table without an id gets its name in braces, so that equal catalogues give equal
 // IDs. Other members are passed over. The JSON text is UTF-8. Throws CatalogError, with what is wrong and
 // where.
-std::unique_ptr<CatalogDatabase> readCatalog(std::string_view json);
+std::unique_ptr<Database> readCatalog(std::string_view json);
+
+// The catalogue of a file: such a list, or a stored project (project.h) of either form. The IDs of a
+// project's tables, columns and queries are made of their names in the same way. Throws CatalogError; the
+// message begins with the file's name.
+std::unique_ptr<Database> openCatalog(const std::string& path);
 
 }  // namespace zr::host

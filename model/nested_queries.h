@@ -2,6 +2,8 @@
 
 #include <vector>
 
+#include "zrparsersql/nested_queries.h"
+
 class CZRDatabaseInfo;
 class CZRQueryInfo;
 class SelectItem;
@@ -19,8 +21,5 @@ inline CZRQueryInfo* nestedQueryOf(const SelectItem& item) {
 // The queries of the union branches of a query: those that its m_unionItems hold, and their branches in turn,
 // in order. A chain of unions stands nested, each branch inside the one before.
 std::vector<CZRQueryInfo*> unionBranchesOf(const CZRQueryInfo& query);
-
-// A query and every descriptor nested in it, at any depth, wherever it hangs.
-std::vector<CZRQueryInfo*> withNestedQueries(CZRQueryInfo& query);
 
 }  // namespace zr

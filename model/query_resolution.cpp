@@ -33,6 +33,12 @@ class ItemResolver {
         }
     }
 
+    void resolveAll(const CList<SelectItem*>& items) {
+        if (items.IsEmpty()) return;
+        query_.Resolved = 0;
+        for (SelectItem* item : items) resolve(item);
+    }
+
  private:
     // A qualified name that is a column of the query after all does not stand for an alias's expression.
     void dropExpression(SelectItemField& item) {
@@ -164,20 +170,19 @@ void CZRQueryInfo::ResolveItem(SelectItem* item) {
 }
 
 void CZRQueryInfo::ResolveItems(CList<SelectItem*>& items) {
-    if (items.IsEmpty()) return;
-    Resolved = 0;
-    ItemResolver resolver(*this);
-    for (SelectItem* item : items) resolver.resolve(item);
+    ItemResolver(*this).resolveAll(items);
 }
 
 void CZRQueryInfo::ResolveAllItems() {
-    ResolveItems(m_selectItems);
-    ResolveItems(m_fromItems);
-    ResolveItems(m_orderItems);
-    if (m_whereItem) ResolveItems(m_whereItem->m_items);
-    ResolveItems(m_groupItems);
-    ResolveItems(m_havingItems);
-    ResolveItems(m_unionItems);
+    // One resolver for all, so that the sources are looked up once.
+    ItemResolver resolver(*this);
+    resolver.resolveAll(m_selectItems);
+    resolver.resolveAll(m_fromItems);
+    resolver.resolveAll(m_orderItems);
+    if (m_whereItem) resolver.resolveAll(m_whereItem->m_items);
+    resolver.resolveAll(m_groupItems);
+    resolver.resolveAll(m_havingItems);
+    resolver.resolveAll(m_unionItems);
 }
 
 CString CZRQueryInfo::MatchSelectList(const CList<SelectItem*>& items, const SelectItemField& wanted,

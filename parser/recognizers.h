@@ -4,6 +4,7 @@
 #include <zrparsersql/recognizers/MSSQL.h>
 #include <zrparsersql/recognizers/MySQLSelect.h>
 #include <zrparsersql/recognizers/Oracle.h>
+#include <zrparsersql/recognizers/PostgreSQL.h>
 
 #include <type_traits>
 
@@ -35,7 +36,8 @@ using MySqlRecognizers =
     Recognizers<MySQLSelectLexerNewSSD, MySQLSelectParserNewSSD, &MySQLSelectParser_Ctx_struct::start_rule>;
 using OracleRecognizers =
     Recognizers<OracleLexerNewSSD, OracleParserNewSSD, &OracleParser_Ctx_struct::start_rule>;
-using PostgreSqlRecognizers = NoRecognizers;
+using PostgreSqlRecognizers =
+    Recognizers<PostgreSQLLexerNewSSD, PostgreSQLParserNewSSD, &PostgreSQLParser_Ctx_struct::start_rule>;
 using MsAccessRecognizers = NoRecognizers;
 
 }  // namespace zr

@@ -10,13 +10,15 @@ const Node& at(const Program& p, int node) {
     return p.nodes[static_cast<std::size_t>(node)];
 }
 
-/// The token that a Choice takes optionally and drops, or -1. A loop's round comes back to the Choice itself.
+/// The token that a Choice takes optionally, or -1: once, dropped or kept, or any number of times, dropped. A
+/// loop's round comes back to the Choice itself.
 int softToken(const Program& p, int index) {
     const Node& node = at(p, index);
     if (node.op != Op::Choice || node.targets.size() != 2) return -1;
     const Node& body = at(p, node.targets[0]);
-    if (body.op != Op::Token || body.mark != Mark::Drop) return -1;
-    return body.next == node.targets[1] || body.next == index ? body.arg : -1;
+    if (body.op != Op::Token || body.mark == Mark::Root) return -1;
+    const bool isLoop = body.next == index && body.mark == Mark::Drop;
+    return body.next == node.targets[1] || isLoop ? body.arg : -1;
 }
 
 /// `(CLOSER!)?` or `(CLOSER!)*`, with or without the parentheses.
@@ -178,7 +180,9 @@ void applyCloser(Program& program, int closer) {
     for (std::size_t i = 0; i < program.nodes.size(); ++i) {
         if (softToken(program, static_cast<int>(i)) != closer) continue;
         Node& node = program.nodes[i];
-        const bool star = at(program, node.targets[0]).next == static_cast<int>(i);
+        const Node& body = at(program, node.targets[0]);
+        const bool star = body.next == static_cast<int>(i);
+        node.mark = body.mark;
         node.op = star ? Op::SoftStar : Op::Soft;
         node.arg = closer;
         node.next = node.targets[1];

@@ -16,8 +16,8 @@ enum class Op : std::uint8_t {
     Set,         ///< takes a token of set `arg`
     Call,        ///< runs rule `arg`
     Choice,      ///< tries the targets in order
-    Soft,        ///< takes the closer if it is there, dropped; decided later (see docs/recogniser.md)
-    SoftStar,    ///< the same, any number
+    Soft,        ///< takes the closer if it is there; decided later (see docs/recogniser.md)
+    SoftStar,    ///< the same, any number, dropped
     Root,        ///< the tree so far becomes the children of an imaginary node `arg`
     ScopeBegin,  ///< an inlined rule starts: marks inside work on its own tree
     ScopeEnd,    ///< and ends: its tree goes to the outer one by the mark of its ScopeBegin

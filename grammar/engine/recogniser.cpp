@@ -197,7 +197,7 @@ bool Recogniser::isOpenEnd(const Entry& entry, std::uint32_t low, std::uint32_t 
     // Whether an empty end counts is for those around to say; a search with few ends keeps what it has.
     if (high == entry.position || endsEach_ != 0) return true;
     // The recover rule may take what nothing else could.
-    if (recovering_ && (recoverPlace_ == kNone || high <= recoverPlace_)) return true;
+    if (recovering_) return true;
     const Context& context = contexts_[entry.context];
     const auto contains = [](const ClassSet& set, std::uint32_t cls) {
         return ((set[cls / 64] >> (cls % 64)) & 1) != 0;

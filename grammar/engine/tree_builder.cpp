@@ -113,8 +113,9 @@ void TreeBuilder::locate(std::uint32_t from, std::uint32_t exact) {
                 step.at = after;
                 break;
         }
-        // Where a call ends is told by what comes behind it; the slot keeps that position for the descent.
-        if (step.child != Recogniser::kNone) step.high = after;
+        // Where a call or an optional closer ends is told by what comes behind it; the slot keeps that
+        // position.
+        if (step.child != Recogniser::kNone || table_.nodes[step.node].op == Op::Soft) step.high = after;
         after = step.at;
     }
 }
@@ -198,6 +199,9 @@ const std::vector<pANTLR3_BASE_TREE>& TreeBuilder::build(const Recogniser::Resul
             case Op::Set:
             case Op::Hard:
                 token(step);
+                break;
+            case Op::Soft:
+                if (step.high > step.at) token(step);
                 break;
             case Op::ScopeBegin:
                 openScope(node.mark, step.at);

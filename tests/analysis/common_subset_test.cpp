@@ -14,8 +14,8 @@
 
 namespace {
 
-// Queries that Oracle reads otherwise, as the tests of its select state tell: a literal by itself is no item,
-// SUBSTRING is no word of its own, and a condition of a join keeps its logical operators.
+// Queries that Oracle reads otherwise: a literal by itself is no item, SUBSTRING is no word of its own, and
+// the ON of a join keeps its logical operators below it.
 constexpr std::u16string_view kOtherwiseInOracle[] = {
     u"SELECT 1 FROM t",
     u"SELECT 1, 2.5, 'text' FROM t",
@@ -24,6 +24,34 @@ constexpr std::u16string_view kOtherwiseInOracle[] = {
     u"SELECT NULL FROM t",
     u"SELECT a FROM t WHERE SUBSTRING(b, 1, 3) = 'x'",
     u"SELECT a FROM t INNER JOIN u ON t.id = u.id AND t.k = u.k",
+};
+
+// Queries that PostgreSQL reads otherwise, as postgresql_differences_test.cpp pins one by one: a leaf is no
+// item, such as the words of a join and the asterisk of COUNT(*), directions lose their word, a decimal
+// number keeps its first two tokens, and YEAR is no function.
+constexpr std::u16string_view kOtherwiseInPostgresql[] = {
+    u"SELECT t.a, u.b FROM t INNER JOIN u ON t.id = u.id",
+    u"SELECT 1, 2.5, 'text' FROM t",
+    u"SELECT o.a, c.b FROM orders o INNER JOIN customers c ON o.id = c.id",
+    u"SELECT t.a * u.b FROM t INNER JOIN u ON t.id = u.id",
+    u"SELECT COUNT(*) FROM t",
+    u"SELECT a FROM t WHERE b = 'x' AND YEAR(c) = 2020",
+    u"SELECT a FROM t INNER JOIN u ON t.id = u.id",
+    u"SELECT a FROM t LEFT JOIN u ON t.id = u.id",
+    u"SELECT a FROM t RIGHT JOIN u ON t.id = u.id",
+    u"SELECT a FROM t LEFT OUTER JOIN u ON t.id = u.id",
+    u"SELECT a FROM t RIGHT OUTER JOIN u ON t.id = u.id",
+    u"SELECT a FROM t CROSS JOIN u",
+    u"SELECT a FROM t INNER JOIN u ON t.id = u.id AND t.k = u.k",
+    u"SELECT a FROM t o INNER JOIN u p ON o.id = p.id WHERE o.b = 1",
+    u"SELECT a FROM t INNER JOIN u ON t.id = u.id INNER JOIN v ON u.id = v.id",
+    u"SELECT a FROM t LEFT JOIN u ON t.id = u.id LEFT JOIN v ON u.id = v.id WHERE t.b > 1",
+    u"SELECT a, COUNT(*) FROM t GROUP BY a",
+    u"SELECT a, COUNT(*) FROM t GROUP BY a HAVING COUNT(*) > 1",
+    u"SELECT a FROM t ORDER BY a ASC",
+    u"SELECT a FROM t ORDER BY a DESC, b",
+    u"SELECT a FROM t ORDER BY a, b DESC",
+    u"SELECT a, SUM(b) FROM t WHERE c = 1 GROUP BY a HAVING SUM(b) > 10 ORDER BY a DESC",
 };
 
 // The dialects that are compared with SQL Server.
@@ -40,6 +68,7 @@ constexpr Compared kDialects[] = {
      DB_ORACLE,
      {.aliasesAreKept = true, .stringsAreQuoted = true, .joinPartsAreNested = true},
      kOtherwiseInOracle},
+    {"postgresql", DB_POSTGRESQL, {}, kOtherwiseInPostgresql},
 };
 
 constexpr std::u16string_view kQueries[] = {
@@ -58,7 +87,7 @@ constexpr std::u16string_view kQueries[] = {
     u"select a from t where b = 1",
     // Aliases.
     u"SELECT a AS x FROM t",
-    u"SELECT a x, b y FROM t",
+    u"SELECT a x, b z FROM t",
     u"SELECT a + b AS total FROM t",
     u"SELECT o.a FROM t o",
     u"SELECT o.a, o.b AS x FROM t AS o",
@@ -356,6 +385,123 @@ TEST(DialectDifferences, MysqlASourceListTakesAStrayParenthesisSoThatANestedQuer
                 "    union 8 name=UNION;       predicate 0;       table t=t;       table u=u; "
                 "      table v=v;       field |a;       field |b;       field |c;       field |e; "
                 "      select 5 field=e;       from 5 table=v");
+}
+
+void expectOracle(std::u16string_view sql, std::string_view ofSqlServer, std::string_view ofOracle) {
+    expectDifference(sql, DB_ORACLE, ofSqlServer, ofOracle);
+}
+
+TEST(DialectDifferences, OracleAliasesOfColumnsKnowTheirKindAndColumn) {
+    expectOracle(u"SELECT t.a AS x FROM t", "alias x name=x source=x of=.",
+                 "alias x_FIELD name=x source=x of=t.a");
+}
+
+TEST(DialectDifferences, OracleAliasesOfTablesKnowTheirKindAndTable) {
+    expectOracle(u"SELECT o.a FROM t o", "alias o name=o source=o of=.",
+                 "alias o_TABLE name=o source=o of=t.; field t|a table");
+}
+
+TEST(DialectDifferences, OracleAnAliasOfAColumnHidesNoTable) {
+    expectOracle(u"SELECT a x FROM x", "alias x name=x source=x of=.",
+                 "alias x_FIELD name=x source=x of=.a; table x=x");
+}
+
+TEST(DialectDifferences, OracleAnAliasOfATableHidesNoColumn) {
+    expectOracle(u"SELECT x FROM t x", "alias x name=x source=x of=.; select 5 text=x",
+                 "alias x_TABLE name=x source=x of=t.; field |x; select 5 field=x");
+}
+
+TEST(DialectDifferences, OracleStringsKeepTheirQuotes) {
+    expectOracle(u"SELECT a FROM t WHERE b = 'x y'", "  item 2 text=x y", "  item 2 text='x y'");
+    expectOracle(u"SELECT a FROM t WHERE b = ''", "  item 2 text= ", "  item 2 text=''");
+}
+
+TEST(DialectDifferences, OracleALiteralByItselfIsNoItem) {
+    expectOracle(u"SELECT 1, 'x', a FROM t", "select 1 text=1; select 2 text=x", "");
+}
+
+TEST(DialectDifferences, OraclePartsOfAJoinAreNested) {
+    expectOracle(u"SELECT a FROM t JOIN u ON b = 1", "  item 0 name=  operator",
+                 "  item 0 name=  operator nested");
+}
+
+TEST(DialectDifferences, OracleAJoinWithoutAPrefixGetsABlank) {
+    expectOracle(u"SELECT a FROM JOIN u", "", "  item 0 text= ");
+}
+
+TEST(DialectDifferences, OracleOnStaysAboveItsLogicalOperators) {
+    expectOracle(
+        u"SELECT a FROM t JOIN u ON b = 1 AND c = 2",
+        "  item 0 name=  operator;   item 4 name=AND operator token;     item 4 name=ON operator token;     "
+        "item 4 name== operator token;       item 5 field=c;       item 1 text=2",
+        "  item 0 name=  operator nested;   item 4 name=ON operator token;     item 4 name=AND operator "
+        "token;       item 4 name== operator token;         item 5 field=c;         item 1 text=2");
+}
+
+TEST(DialectDifferences, OracleATopOfAShareIsALimit) {
+    expectOracle(u"SELECT TOP 5 PERCENT a FROM t", "", "limit 0 5");
+}
+
+TEST(DialectDifferences, OracleNewNamesKeepTheirQuotesInTheirItem) {
+    expectOracle(u"SELECT a AS \"My X\" FROM t", "alias my x name=My X source=My X of=.;   item 1 text=My X",
+                 "alias my x_FIELD name=My X source=My X of=.a;   item 1 text=\"My X\"");
+}
+
+TEST(DialectDifferences, OracleWordsOfSqlServerAreUserFunctions) {
+    expectOracle(u"SELECT SUBSTRING(a, 1), ISNULL(b, 0) FROM t",
+                 "select 4 name=SUBSTRING token; select 4 name=ISNULL token",
+                 "select 7 name=SUBSTRING token; select 7 name=ISNULL token");
+}
+
+TEST(DialectDifferences, OracleAUserFunctionNeedsNoOwner) {
+    expectOracle(u"SELECT f(a) FROM t", "field |f; select 5 field=f",
+                 "table t=t; field |a; select 7 name=f token;   item 5 field=a; from 5 table=t");
+}
+
+TEST(DialectDifferences, OracleBoundsStandUnderTheirOperator) {
+    expectOracle(u"SELECT a FROM t WHERE b BETWEEN 1 AND 2", "  item 1 text=1;   item 1 text=2",
+                 "  item 4 name=AND operator token;     item 1 text=1;     item 1 text=2");
+}
+
+TEST(DialectDifferences, OracleAllColumnsAreALiteral) {
+    expectOracle(u"SELECT * FROM t", "field |*; select 5 field=*", "select 1 text=*");
+}
+
+TEST(DialectDifferences, OracleNotInIsAnIn) {
+    expectOracle(
+        u"SELECT a FROM t WHERE b NOT IN (1, 2)", "",
+        "field |b; where 4 name=IN operator token;   item 5 field=b;   item 1 text=1;   item 1 text=2");
+}
+
+TEST(DialectDifferences, OracleAMinusSignIsNoPartOfAName) {
+    expectOracle(u"SELECT a-b FROM t", "field |a-b; select 5 field=a-b",
+                 "field |a; field |b; select 4 name=- operator token;   item 5 field=a;   item 5 field=b");
+}
+
+TEST(DialectDifferences, OracleGroupsBeginWithAColumn) {
+    expectOracle(u"SELECT a FROM t GROUP BY YEAR(a)", "group 4 name=YEAR token;   item 5 field=a", "");
+}
+
+TEST(DialectDifferences, OracleConcatenationIsAnOperator) {
+    expectOracle(u"SELECT a || b FROM t", "select 5 field=a",
+                 "table t=t; field |b; select 4 name=|| operator token;   item 5 field=a;   item 5 field=b; "
+                 "from 5 table=t");
+}
+
+TEST(DialectDifferences, OracleAComparisonTakesTheItemsAroundIt) {
+    expectOracle(u"SELECT a, b = 1 FROM t", "select 5 field=a", "  item 5 field=a");
+}
+
+TEST(DialectDifferences, OracleATableBehindAJoinBelongsToItsCondition) {
+    expectOracle(
+        u"SELECT a FROM t INNER JOIN u ON t.id = u.id, v",
+        "table v=v; from 4 name=, operator token;   item 4 name=JOIN operator token;     item 0 name=  "
+        "operator;       item 5 table=t;       item 1 text=INNER;     item 5 table=u;     item 4 name=ON "
+        "operator token;       item 4 name== operator token;         item 5 table=t field=id;         item 5 "
+        "table=u field=id;   item 5 table=v",
+        "field |v; from 4 name=JOIN operator token;   item 0 name=  operator nested;     item 5 table=t;     "
+        "item 1 text=INNER;   item 5 table=u;   item 4 name=ON operator token;     item 4 name== operator "
+        "token;       item 5 table=t field=id;       item 5 table=u field=id;       item 5 field=v");
 }
 
 }  // namespace

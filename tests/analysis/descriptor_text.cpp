@@ -25,6 +25,8 @@ std::string itemText(const SelectItem& item) {
         add(out, "table", field->m_sourceTable);
         add(out, "field", field->m_sourceField);
         add(out, "alias", field->m_tableAlias);
+        add(out, "schema", field->m_schemaName);
+        add(out, "db", field->m_dbName);
     }
     if (queryOf(item)) out += " query";
     for (const SelectItem* child : item.m_items) out += ' ' + itemText(*child);

@@ -235,7 +235,8 @@ void ReferenceRecogniser::build(std::vector<Scope>& scopes, Place place, std::ui
                 const Item& taken = itemsAt(place)[item];
                 item = taken.rest;
                 if (taken.way != 0) break;
-                ++place.position;
+                const TokenText& token = tokens_[place.position++];
+                if (node.mark == Mark::None) scopes.back().list.push_back({token.type, token.text, {}});
                 if (node.op == Op::SoftStar) continue;
                 break;
             }

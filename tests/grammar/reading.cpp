@@ -7,6 +7,8 @@
 #include <zrparsersql/recognizers/MySQLSelect_tokens.h>
 #include <zrparsersql/recognizers/Oracle.h>
 #include <zrparsersql/recognizers/Oracle_tokens.h>
+#include <zrparsersql/recognizers/PostgreSQL.h>
+#include <zrparsersql/recognizers/PostgreSQL_tokens.h>
 
 #include <new>
 #include <set>
@@ -198,7 +200,7 @@ SyntaxDump readBySets(std::u16string_view text) {
     engine::Options& options = optionsOf(pipeline.parser());
     options.baseSteps = options.stepsPerToken = 0;
     copyTree(pipeline.parser()->start_rule(pipeline.parser()).tree, reading);
-    return reading.tree;
+    return reading.statement;
 }
 
 template <typename G>
@@ -217,6 +219,7 @@ const Grammar kGrammars[] = {
     ZR_GRAMMAR(MSSQL, "mssql", all_sql_query),
     ZR_GRAMMAR(MySQLSelect, "mysql", all_sql_query),
     ZR_GRAMMAR(Oracle, "oracle", all_sql_query),
+    ZR_GRAMMAR(PostgreSQL, "postgresql", all_sql_query),
 };
 const std::size_t kGrammarCount = std::size(kGrammars);
 

@@ -37,8 +37,8 @@ struct Grammar {
     /// The same, with lexer, token stream and parser asked twice: what the second call returns.
     Reading (*readAgain)(std::u16string_view text);
     const engine::GrammarTable& (*tables)();
-    /// The tree alone, found by the search that never turns back, which other texts come to only when they
-    /// are hard.
+    /// The statement's tree alone, found by the search that never turns back, which other texts come to only
+    /// when they are hard.
     SyntaxDump (*readBySets)(std::u16string_view text);
 };
 

@@ -1,6 +1,9 @@
 #include "host/catalog.h"
 
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
+
+#include "tests/host/projects.h"
 
 namespace zr::host {
 namespace {
@@ -27,13 +30,13 @@ TEST(Catalog, GivesTheIdToldOrElseTheNameInBraces) {
 
 TEST(Catalog, ClonesKeepIdsAndBelongToThemselves) {
     const auto database = readCatalog(R"([{"table": "a", "columns": ["x"]}])");
-    const std::unique_ptr<CatalogDatabase> clone(database->Clone());
+    const std::unique_ptr<Database> clone(database->Clone());
     CZRTableInfo* table = clone->FindTableBySrcName(u"a");
     ASSERT_NE(table, nullptr);
     EXPECT_NE(table, database->FindTableBySrcName(u"a"));
     EXPECT_EQ(table->GetID(), u"{a}");
     EXPECT_EQ(table->GetDatabase(), clone.get());
-    auto* field = dynamic_cast<CatalogField*>(table->FindFieldBySrcName(u"x"));
+    auto* field = dynamic_cast<Field*>(table->FindFieldBySrcName(u"x"));
     ASSERT_NE(field, nullptr);
     EXPECT_EQ(field->GetOwner(), table);
 }
@@ -61,6 +64,47 @@ TEST(Catalog, ARefusalTellsWhichTable) {
     } catch (const CatalogError& problem) {
         EXPECT_STREQ(problem.what(), "table 2 of the catalogue: \"table\" has to be a text");
     }
+}
+
+TEST(CatalogFile, MayBeAListOrAProjectOfEitherForm) {
+    const test::Folder folder;
+    test::writeBytes(folder.path("list"), R"([{"table": "orders", "columns": ["id"]}])");
+    saveProject(*test::smallProject(), folder.path("json"), StorageForm::Json);
+    saveProject(*test::smallProject(), folder.path("sqlite"), StorageForm::Sqlite);
+    for (const char* name : {"list", "json", "sqlite"}) {
+        const auto catalog = openCatalog(folder.path(name));
+        CZRTableInfo* table = catalog->FindTableBySrcName(u"orders");
+        ASSERT_NE(table, nullptr) << name;
+        EXPECT_EQ(table->GetID(), u"{orders}") << name;
+        EXPECT_EQ(table->FindFieldBySrcName(u"id")->GetID(), u"{orders.id}") << name;
+    }
+    const auto catalog = openCatalog(folder.path("sqlite"));
+    EXPECT_EQ(catalog->FindQueryBySrcName(u"all_orders")->GetID(), u"{all_orders}");
+    EXPECT_EQ(catalog->FindTableBySrcName(u"orders")->ForeignKeys.GetHead()->GetReferencedTableID(),
+              u"{customers}");
+}
+
+TEST(CatalogFile, ThatIsBrokenIsNamed) {
+    const test::Folder folder;
+    const auto complaint = [&](const std::string& bytes) -> std::string {
+        test::writeBytes(folder.path("c"), bytes);
+        try {
+            openCatalog(folder.path("c"));
+        } catch (const CatalogError& error) {
+            return error.what();
+        }
+        return {};
+    };
+    for (const char* bytes : {"", "[", "[{}]", "{", "{}", "{\"Format\": 5}", "7"})
+        EXPECT_THAT(complaint(bytes), testing::StartsWith(folder.path("c") + ": ")) << bytes;
+    EXPECT_THROW(openCatalog(folder.path("none")), CatalogError);
+    EXPECT_THROW(openCatalog(folder.path("")), CatalogError);
+}
+
+TEST(Catalog, NestedTenThousandDeepIsRefused) {
+    const std::string deep = std::string(10000, '[') + std::string(10000, ']');
+    EXPECT_THROW(readCatalog(deep), CatalogError);
+    EXPECT_THROW(readCatalog(deep.substr(0, 10000)), CatalogError);
 }
 
 }  // namespace

@@ -85,7 +85,7 @@ TEST_P(Corpus, HasOneDescriptorALineThatAgreesWithTheTokens) {
     }
 }
 
-INSTANTIATE_TEST_SUITE_P(Dialects, Corpus, testing::Values("mssql", "mysql", "oracle"),
+INSTANTIATE_TEST_SUITE_P(Dialects, Corpus, testing::Values("mssql", "mysql", "oracle", "postgresql"),
                          [](const testing::TestParamInfo<std::string>& file) { return file.param; });
 
 }  // namespace

@@ -24,6 +24,8 @@ ReadPlace::Stop placeOf(std::u16string_view text, std::size_t offset) {
     return stop;
 }
 
+}  // namespace
+
 void appendRead(std::string& out, const ReadPlace& place) {
     out += '{';
     JsonMembers members(out);
@@ -43,8 +45,6 @@ void appendRead(std::string& out, const ReadPlace& place) {
     }
     out += '}';
 }
-
-}  // namespace
 
 ReadPlace readPlace(const Grammar& grammar, std::u16string_view text) {
     Recogniser recogniser(grammar, text);

@@ -46,4 +46,7 @@ class Analyst {
 
 ReadPlace readPlace(const Grammar& grammar, std::u16string_view text);
 
+// {"tokens":..,"of":..,"stop":..}
+void appendRead(std::string& out, const ReadPlace& place);
+
 }  // namespace zr::tool

@@ -6,6 +6,8 @@
 #include <zrparsersql/recognizers/MySQLSelect_tokens.h>
 #include <zrparsersql/recognizers/Oracle.h>
 #include <zrparsersql/recognizers/Oracle_tokens.h>
+#include <zrparsersql/recognizers/PostgreSQL.h>
+#include <zrparsersql/recognizers/PostgreSQL_tokens.h>
 
 #include <new>
 #include <type_traits>
@@ -53,13 +55,17 @@ constexpr Grammar grammarOf() {
 constexpr Grammar kMssql = ZR_GRAMMAR(MSSQL, all_sql_query);
 constexpr Grammar kMysql = ZR_GRAMMAR(MySQLSelect, all_sql_query);
 constexpr Grammar kOracle = ZR_GRAMMAR(Oracle, all_sql_query);
+constexpr Grammar kPostgresql = ZR_GRAMMAR(PostgreSQL, all_sql_query);
 
 #undef ZR_GRAMMAR
 
 constexpr Dialect kDialects[] = {
-    {"mssql", &kMssql, DB_MSSQL},           {"mssqlfrom", nullptr, DB_NONE},
-    {"mysql", &kMysql, DB_MYSQL},           {"oracle", &kOracle, DB_ORACLE},
-    {"postgresql", nullptr, DB_POSTGRESQL}, {"msaccess", nullptr, DB_MSACCESS},
+    {"mssql", &kMssql, DB_MSSQL},
+    {"mssqlfrom", nullptr, DB_NONE},
+    {"mysql", &kMysql, DB_MYSQL},
+    {"oracle", &kOracle, DB_ORACLE},
+    {"postgresql", &kPostgresql, DB_POSTGRESQL},
+    {"msaccess", nullptr, DB_MSACCESS},
 };
 
 }  // namespace
@@ -70,9 +76,17 @@ const Dialect* findDialect(std::string_view name) {
     return nullptr;
 }
 
-std::string dialectNames() {
+const Dialect* findDialect(DBTypes kind) {
+    if (kind == DB_MSSQL_20) kind = DB_MSSQL;
+    for (const Dialect& dialect : kDialects)
+        if (kind != DB_NONE && dialect.kind == kind) return &dialect;
+    return nullptr;
+}
+
+std::string dialectNames(bool withAnalysis) {
     std::string names;
     for (const Dialect& dialect : kDialects) {
+        if (withAnalysis && dialect.kind == DB_NONE) continue;
         if (!names.empty()) names += ", ";
         names += dialect.name;
     }

@@ -17,7 +17,10 @@ struct Dialect {
 // Null for a name that is no dialect's.
 const Dialect* findDialect(std::string_view name);
 
-// All names, for help and messages.
-std::string dialectNames();
+// The dialect by which a kind of database is analysed; null for a kind that has none.
+const Dialect* findDialect(DBTypes kind);
+
+// All names, or those with an analysis, for help and messages.
+std::string dialectNames(bool withAnalysis = false);
 
 }  // namespace zr::tool

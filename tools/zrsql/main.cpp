@@ -13,6 +13,7 @@
 #include "json_line.h"
 #include "json_text.h"
 #include "options.h"
+#include "project_commands.h"
 #include "token_format.h"
 #include "tree_format.h"
 
@@ -21,13 +22,15 @@ namespace zr::tool {
 namespace {
 
 constexpr int kUnreadable = 1;
+constexpr int kWrongUse = 2;
 
 std::unique_ptr<CZRDatabaseInfo> openDatabase(const Options& options) {
-    if (options.catalog.empty()) return std::make_unique<host::CatalogDatabase>();
+    if (options.catalog.empty()) return std::make_unique<host::Database>();
+    if (options.catalog != "-") return host::openCatalog(options.catalog);
     try {
-        return host::readCatalog(readBytes(options.catalog));
+        return host::readCatalog(readBytes("-"));
     } catch (const host::CatalogError& problem) {
-        throw InputError(options.catalog + ": " + problem.what());
+        throw InputError(std::string("standard input: ") + problem.what());
     }
 }
 
@@ -119,6 +122,12 @@ void runLines(const Options& options, const CZRDatabaseInfo& prototype) {
 }
 
 void run(const Options& options) {
+    if (options.project) {
+        std::string told;
+        runProject(*options.project, told);
+        std::fwrite(told.data(), 1, told.size(), stdout);
+        return;
+    }
     const auto database = openDatabase(options);
     if (!options.jsonLines.empty()) return runLines(options, *database);
     const std::string bytes = options.text ? *options.text : readBytes(options.file);
@@ -144,6 +153,9 @@ int main(int argc, char** argv) {
             return kUnreadable;
         }
         return 0;
+    } catch (const WrongUse& problem) {
+        std::fprintf(stderr, "zrsql: %s\n", problem.what());
+        return kWrongUse;
     } catch (const std::exception& problem) {
         std::fprintf(stderr, "zrsql: %s\n", problem.what());
         return kUnreadable;

@@ -82,11 +82,17 @@ std::optional<Options> readOptions(int argc, char** argv, int& exitStatus) {
     addFormat(analyze, words, {"json", "pretty"});
     analyze
         ->add_option("--catalog", words.catalog,
-                     "Tables of the database (JSON), to resolve the query's sources")
+                     "Tables of the database, to resolve the query's sources: a JSON list or a project")
         ->type_name("FILE");
 
+    ProjectWords projectWords;
+    projectWords.addTo(app);
+
+    Options options;
     try {
         app.parse(argc, argv);
+        options.project = projectWords.read();
+        if (options.project) return options;
     } catch (const CLI::Success& asked) {  // help or version
         exitStatus = app.exit(asked);
         return std::nullopt;
@@ -96,7 +102,6 @@ std::optional<Options> readOptions(int argc, char** argv, int& exitStatus) {
         return std::nullopt;
     }
 
-    Options options;
     options.command = tokens->parsed() ? Command::Tokens : tree->parsed() ? Command::Tree : Command::Analyze;
     options.dialect = findDialect(words.dialect);
     if (const std::string complaint = complaintAbout(options.dialect, words, options.command);

@@ -5,6 +5,7 @@
 #include <string_view>
 
 #include "dialects.h"
+#include "project_options.h"
 #include "tree_format.h"
 
 namespace zr::tool {
@@ -21,6 +22,7 @@ struct Options {
     bool asPicture = false;  // analyze: for a person instead of JSON
     std::string catalog;     // empty: none
     unsigned jobs = 1;
+    std::optional<ProjectOptions> project;  // given: nothing of the above counts
 };
 
 // Reads the command line. Where there is nothing to run (help was asked for, or the use is wrong), writes to

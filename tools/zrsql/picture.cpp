@@ -9,6 +9,8 @@
 
 #include "descriptor_access.h"
 #include "expression_text.h"
+#include "from_sources.h"
+#include "text_table.h"
 #include "zrparsersql/database_info.h"
 
 namespace zr::tool {
@@ -17,63 +19,15 @@ namespace {
 
 using Text = std::u16string;
 
-template <class Integer>
-Text number(Integer value) {
-    const std::string digits = std::to_string(value);
-    return Text(digits.begin(), digits.end());
-}
-
 Text lowered(const CString& name) {
     CString lower = name;
     return Text(lower.MakeLower().View());
-}
-
-// Calls visit for an item and everything below it, nested queries left out, in order.
-template <class Visit>
-void forEachItem(const SelectItem& root, Visit visit) {
-    std::vector<const SelectItem*> todo = {&root};
-    while (!todo.empty()) {
-        const SelectItem* item = todo.back();
-        todo.pop_back();
-        visit(*item);
-        std::vector<const SelectItem*> below(item->m_items.begin(), item->m_items.end());
-        todo.insert(todo.end(), below.rbegin(), below.rend());
-    }
 }
 
 void joinTo(Text& text, const Text& part, std::u16string_view between) {
     if (!text.empty()) text += between;
     text += part;
 }
-
-// Lines of cells, each column as wide as its widest cell, up to a bound. A column without any text takes no
-// room.
-class Table {
- public:
-    void add(std::vector<Text> cells) { lines_.push_back(std::move(cells)); }
-    void appendTo(Text& out) const {
-        static constexpr std::size_t widest = 40;
-        std::vector<std::size_t> widths;
-        for (const auto& cells : lines_) {
-            widths.resize(std::max(widths.size(), cells.size()));
-            for (std::size_t at = 0; at < cells.size(); ++at)
-                widths[at] = std::max(widths[at], std::min(cells[at].size(), widest));
-        }
-        for (const auto& cells : lines_) {
-            Text line = u" ";
-            for (std::size_t at = 0; at < cells.size(); ++at) {
-                if (widths[at])
-                    line += u' ' + cells[at] +
-                            Text(widths[at] + 1 - std::min(cells[at].size(), widths[at]), u' ');
-            }
-            line.erase(line.find_last_not_of(u' ') + 1);
-            out += line + u'\n';
-        }
-    }
-
- private:
-    std::vector<std::vector<Text>> lines_;
-};
 
 // Query descriptors get numbers as they are met; the picture shows them one below the other.
 class Numbering {
@@ -100,8 +54,7 @@ class Numbering {
 class FromNames {
  public:
     FromNames(const CZRQueryInfo& query, Numbering& numbering) {
-        for (const SelectItem* from : query.m_fromItems)
-            forEachItem(*from, [&](const SelectItem& item) { add(item, numbering); });
+        for (const FromSource& source : fromSources(query)) add(source, numbering);
     }
 
     // Names of the sources, each once, in order.
@@ -124,25 +77,15 @@ class FromNames {
     }
 
  private:
-    void add(const SelectItem& item, Numbering& numbering) {
-        if (isAlias(item)) {
-            const CString& alias = item.m_items.GetTail()->m_text;
-            const SelectItem& named = *item.m_items.GetHead();
-            meanings_[lowered(alias)] = sourceName(named, numbering);
-            if (const SelectItemField* table = classOf(named).field)
-                tableAliases_.emplace_back(lowered(table->m_sourceTable), alias);
-        } else if (const Text source = sourceName(item, numbering);
-                   !source.empty() && std::find(sources_.begin(), sources_.end(), source) == sources_.end()) {
-            sources_.push_back(source);
+    void add(const FromSource& source, Numbering& numbering) {
+        const Text name =
+            source.query ? numbering.nameOf(*source.query) : Text(source.table->m_sourceTable.View());
+        if (!source.alias.IsEmpty()) {
+            meanings_[lowered(source.alias)] = name;
+            if (source.table) tableAliases_.emplace_back(lowered(source.table->m_sourceTable), source.alias);
         }
-    }
-
-    // Empty for an item that is no source, such as a column of a join's condition.
-    static Text sourceName(const SelectItem& item, Numbering& numbering) {
-        const ItemClass itemClass = classOf(item);
-        if (itemClass.query) return numbering.nameOf(*itemClass.query);
-        const bool isTable = itemClass.field && itemClass.field->m_sourceField.IsEmpty();
-        return isTable ? Text(itemClass.field->m_sourceTable.View()) : Text();
+        if (!name.empty() && std::find(sources_.begin(), sources_.end(), name) == sources_.end())
+            sources_.push_back(name);
     }
 
     std::vector<Text> sources_;
@@ -172,7 +115,7 @@ class QueryPicture {
             out_ += u"  none\n";
             return;
         }
-        Table table;
+        TextTable table;
         std::size_t place = 0;
         for (const SelectItem* item : query_.m_selectItems) {
             const Text origin = originOf(*item);
@@ -248,8 +191,9 @@ class QueryPicture {
     }
 
     void drawSources() {
-        const bool hasCatalog = query_.m_database && !query_.m_database->Tables.IsEmpty();
-        Table table;
+        const bool hasCatalog = query_.m_database && !(query_.m_database->Tables.IsEmpty() &&
+                                                       query_.m_database->Queries.IsEmpty());
+        TextTable table;
         for (const auto* entry : sortedEntries(query_.m_sourceTables)) {
             const bool isOwn = names_.hasSource(entry->key);
             // A nested query's descriptor lists what the outer ones read as well.
@@ -268,7 +212,7 @@ class QueryPicture {
     }
 
     void drawClauses() {
-        Table table;
+        TextTable table;
         static constexpr std::u16string_view predicates[] = {u"", u"ALL", u"DISTINCT", u"DISTINCTROW",
                                                              u"", u"*"};
         if (query_.m_predicate > 0 && query_.m_predicate < static_cast<int>(std::size(predicates)))
@@ -290,7 +234,7 @@ class QueryPicture {
         return query_.m_limitOffset ? count + u" from row " + number(query_.m_limitOffset) : count;
     }
 
-    void addClause(Table& table, const Text& name, const CList<SelectItem*>& items,
+    void addClause(TextTable& table, const Text& name, const CList<SelectItem*>& items,
                    std::u16string_view between) {
         Text text;
         for (const SelectItem* item : items) joinTo(text, expression(*item), between);
@@ -309,8 +253,9 @@ class QueryPicture {
     FromNames names_;
 };
 
-void drawText(Text& out, std::u16string_view text) {
-    out += u"SQL\n";
+}  // namespace
+
+void appendSql(Text& out, std::u16string_view text) {
     while (!text.empty()) {
         const std::size_t end = text.find_first_of(u"\r\n");
         const std::u16string_view line = text.substr(0, end);
@@ -320,25 +265,24 @@ void drawText(Text& out, std::u16string_view text) {
     }
 }
 
-void drawStop(Text& out, const ReadPlace& place) {
+void appendStop(Text& out, const ReadPlace& place) {
     if (!place.stop) return;
     out += u"\nRead " + number(place.taken) + u" of " + number(place.all) + u" tokens; stopped at line " +
            number(place.stop->line) + u", column " + number(place.stop->column) + u", before \"" +
            place.stop->text + u"\"\n";
 }
 
-}  // namespace
-
 void drawPicture(std::string& out, const CString& text, const CZRQueryInfo& root, const ReadPlace& place) {
     Text picture;
-    drawText(picture, text);
+    picture += u"SQL\n";
+    appendSql(picture, text);
     Numbering numbering;
     numbering.numberOf(root);
     while (const CZRQueryInfo* query = numbering.next()) {
         if (query != &root) picture += u"\n" + Text(u"Query ") + number(numbering.numberOf(*query)) + u'\n';
         QueryPicture(picture, *query, query != &root, numbering).draw();
     }
-    drawStop(picture, place);
+    appendStop(picture, place);
     out += CString(picture).toUtf8();
 }
 

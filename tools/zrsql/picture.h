@@ -12,4 +12,9 @@ namespace zr::tool {
 // read to its end, the last line tells where the reading stopped.
 void drawPicture(std::string& out, const CString& text, const CZRQueryInfo& query, const ReadPlace& place);
 
+// The lines of a text, indented.
+void appendSql(std::u16string& out, std::u16string_view text);
+// That line about the place where the reading stopped, with an empty one before it; nothing when it did not.
+void appendStop(std::u16string& out, const ReadPlace& place);
+
 }  // namespace zr::tool

@@ -31,7 +31,8 @@ void walk(pANTLR3_BASE_TREE root, Visitor& visitor) {
     std::vector<Step> path;
     const auto enter = [&](pANTLR3_BASE_TREE tree, ANTLR3_UINT32 place) {
         const ANTLR3_UINT32 count = tree->getChildCount(tree);
-        const auto text = runtimeText(tree->getText(tree));
+        // The runtime's own text of a nil node is plain characters.
+        const auto text = tree->isNilNode(tree) ? u"nil" : runtimeText(tree->getText(tree));
         visitor.enter(Node{tokenNumber(tree->getType(tree)), text, count, path.size(), place});
         path.push_back({tree, count, 0});
     };

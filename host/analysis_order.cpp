@@ -1,0 +1,114 @@
+#include "host/analysis_order.h"
+
+#include <algorithm>
+#include <unordered_map>
+#include <vector>
+
+#include "zrparsersql/analysis.h"
+#include "zrparsersql/nested_queries.h"
+
+namespace zr::host {
+
+namespace {
+
+using Queries = std::vector<CZRQueryInfo*>;
+
+using QueriesById = std::unordered_map<CString, CZRQueryInfo*>;
+
+// Which queries of the database a query names, at any depth. A query's descriptor is not touched: only an
+// analysis tells, and that one is made on the side.
+Queries queriesReadBy(const CZRQueryInfo& query, Database& database, const QueriesById& byId) {
+    CZRQueryInfo scratch;
+    scratch.m_sql = query.m_sql;
+    scratch.SetDatabase(&database);
+    BuildQueryInfo(&scratch, database.GetDBType());
+    Queries read;
+    for (CZRQueryInfo* each : zr::withNestedQueries(scratch)) {
+        each->SetDatabase(&database);
+        each->ResolveSources();
+        for (const auto& source : each->m_sourceTables) {
+            const auto found = byId.find(source.value);
+            if (found != byId.end() && std::find(read.begin(), read.end(), found->second) == read.end())
+                read.push_back(found->second);
+        }
+    }
+    return read;
+}
+
+class ReadingOrder {
+ public:
+    explicit ReadingOrder(Database& database) {
+        QueriesById byId;
+        for (CZRQueryInfo* query : database.Queries) byId.emplace(query->GetID(), query);
+        for (CZRQueryInfo* query : database.Queries) readBy_[query] = queriesReadBy(*query, database, byId);
+    }
+
+    const Queries& readBy(CZRQueryInfo* query) const { return readBy_.at(query); }
+
+    // A ring of queries, each reading from the next and the last from the first; empty when there is none.
+    Queries findRing(const Database& database) {
+        for (CZRQueryInfo* query : database.Queries) {
+            Queries ring = findRingFrom(query);
+            if (!ring.empty()) return ring;
+        }
+        return {};
+    }
+
+ private:
+    enum class Mark { New, OnPath, Done };
+
+    // Depth first, with the path on a stack of its own.
+    Queries findRingFrom(CZRQueryInfo* start) {
+        if (marks_[start] != Mark::New) return {};
+        Queries path{start};
+        std::vector<std::size_t> next{0};
+        marks_[start] = Mark::OnPath;
+        while (!path.empty()) {
+            const Queries& readFrom = readBy_.at(path.back());
+            if (next.back() == readFrom.size()) {
+                marks_[path.back()] = Mark::Done;
+                path.pop_back();
+                next.pop_back();
+                continue;
+            }
+            CZRQueryInfo* read = readFrom[next.back()++];
+            if (marks_[read] == Mark::OnPath)
+                return Queries(std::find(path.begin(), path.end(), read), path.end());
+            if (marks_[read] == Mark::Done) continue;
+            marks_[read] = Mark::OnPath;
+            path.push_back(read);
+            next.push_back(0);
+        }
+        return {};
+    }
+
+    std::unordered_map<CZRQueryInfo*, Queries> readBy_;
+    std::unordered_map<CZRQueryInfo*, Mark> marks_;
+};
+
+std::string ringText(const Queries& ring) {
+    std::string text;
+    for (const CZRQueryInfo* query : ring) text += query->GetSrcName().toUtf8() + " reads from ";
+    return text + ring.front()->GetSrcName().toUtf8();
+}
+
+}  // namespace
+
+void analyseQueries(Database& database) {
+    ReadingOrder order(database);
+    if (const Queries ring = order.findRing(database); !ring.empty())
+        throw CyclicQueries("queries read from each other in a ring: " + ringText(ring));
+
+    // The database sorts by what the descriptors tell of their sources.
+    for (CZRQueryInfo* query : database.Queries) {
+        query->m_sourceTables.RemoveAll();
+        for (const CZRQueryInfo* read : order.readBy(query))
+            query->m_sourceTables[read->GetSrcName()] = read->GetID();
+    }
+    database.SortQueries();
+    for (CZRQueryInfo* query : database.Queries) query->m_sourceTables.RemoveAll();
+
+    for (CZRQueryInfo* query : database.Queries) BuildQueryInfo(query, database.GetDBType());
+}
+
+}  // namespace zr::host

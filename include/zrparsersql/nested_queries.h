@@ -1,0 +1,16 @@
+#pragma once
+
+#include <vector>
+
+#include "zrparsersql/export.h"
+
+class CZRQueryInfo;
+
+namespace zr {
+
+// A query and every descriptor nested in it, at any depth, wherever it hangs: sub-queries, union branches,
+// expressions, records of unions. The query stands first. The pointers hold as long as the query is not
+// changed.
+ZR_API std::vector<CZRQueryInfo*> withNestedQueries(CZRQueryInfo& query);
+
+}  // namespace zr
