@@ -11,6 +11,11 @@ constexpr std::size_t kFirstMemo = 1024;
 /// Places that no more than two tail loops stopped at have a bit of their own each.
 constexpr std::size_t kPlainStops = 4;
 
+/// Of a mask that isn't empty.
+bool isSingle(std::uint32_t mask) {
+    return (mask & (mask - 1)) == 0;
+}
+
 bool isZeroWidth(Op op) {
     return op == Op::Root || op == Op::ScopeBegin || op == Op::ScopeEnd;
 }
@@ -257,8 +262,7 @@ bool FullSearch::follow(std::uint32_t entry, Item item, bool returned, std::uint
             case Op::Choice: {
                 std::uint32_t mask = branchMask(entry, item);
                 if (mask == 0) return false;
-                if ((node.flags & kMerge) && !std::has_single_bit(mask) && !entersOnce(entry, item))
-                    return false;
+                if ((node.flags & kMerge) && !isSingle(mask) && !entersOnce(entry, item)) return false;
                 const Item first = afterBranch(item, static_cast<std::uint32_t>(std::countr_zero(mask)));
                 for (mask &= mask - 1; mask != 0; mask &= mask - 1)
                     items_.push_back(afterBranch(item, static_cast<std::uint32_t>(std::countr_zero(mask))));
@@ -456,9 +460,8 @@ bool FullSearch::walkOn(std::size_t index) {
             case Op::Choice: {
                 std::uint32_t mask = branchMask(walk.entry, walk.at);
                 // One of them leads on, or nobody had come here.
-                while (
-                    !std::has_single_bit(mask) &&
-                    !leadsOn(walk, afterBranch(walk.at, static_cast<std::uint32_t>(std::countr_zero(mask)))))
+                while (!isSingle(mask) && !leadsOn(walk, afterBranch(walk.at, static_cast<std::uint32_t>(
+                                                                                  std::countr_zero(mask)))))
                     mask &= mask - 1;
                 const auto taken = static_cast<std::uint32_t>(std::countr_zero(mask));
                 walk.state = addState(target(node, taken), walk.at.place, walk.state, kNone, kNone);
@@ -515,6 +518,8 @@ bool FullSearch::branch(const Walk& walk, const Item& item, std::uint32_t index,
     }
     const Entry& called = entries_[entryAt(node.arg, item.place.low)];
     const Place& end = pool_[called.ends.first + index];
+    // Nothing leads back.
+    if (end.low > wanted_[walk.wanted.first + walk.wanted.count - 1].high) return false;
     return comesBack(item, called, end, next) &&
            (goesOn(walk.entry, node, next.place) ||
             (restBehind(node) != Rest::Open && isWanted(walk, next.place)));
@@ -528,7 +533,13 @@ bool FullSearch::leadsOn(const Walk& walk, const Item& item) {
             const NodeRow& node = table_.nodes[from.node];
             ++steps_;
             if (node.op == Op::End) return isWanted(walk, from.place) ? Answer::Yes : Answer::No;
-            if (node.op == Op::Choice) break;
+            if (node.op == Op::Choice) {
+                const std::uint32_t mask = branchMask(walk.entry, from);
+                if (mask == 0) return Answer::No;
+                if (!isSingle(mask)) break;
+                from = afterBranch(from, static_cast<std::uint32_t>(std::countr_zero(mask)));
+                continue;
+            }
             if (node.op == Op::Call) {
                 if (!mayCall(walk.entry, from)) return Answer::No;
                 break;
