@@ -482,6 +482,7 @@ void tokenClasses(Program& p, const Facts& facts, int maxToken) {
         if (n.op == Op::Choice)
             for (int t : n.targets) sets.push_back(&p.nodes[index(t)].first);
     sets.push_back(&p.recoverFollow);
+    sets.push_back(&p.owing);
     const std::set<int> closer{p.closer};
     sets.push_back(&closer);
 
@@ -540,6 +541,7 @@ void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts,
                 const auto& first = program.nodes[index(n.run)].first;
                 program.recoverFollow.insert(first.begin(), first.end());
             }
+    program.owing = owingTokens(program);
     tokenClasses(program, facts, maxToken);
 }
 

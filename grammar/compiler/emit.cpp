@@ -260,6 +260,7 @@ class Emitter {
             contextSets.push_back(classSet(c.any));
         }
         const int recoverFollow = classSet(program_.recoverFollow);
+        const int owing = program_.owing.empty() ? 0xFFFF : classSet(program_.owing);
 
         std::vector<std::pair<std::size_t, std::size_t>> choices;
         std::vector<int> targets;
@@ -331,7 +332,7 @@ class Emitter {
           << vocabulary_.maxNumber << ", classSets, " << firstBase << ", " << openers << ", " << recoverFollow
           << ", guards, " << guards.size() << ", " << std::max(program_.closer, 0) << ", " << parser_.start
           << ", " << parser_.statement << ", " << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule)
-          << ", " << left << ", " << right << ", " << parser_.keepTail << ", seconds, "
+          << ", " << left << ", " << right << ", " << owing << ", " << parser_.keepTail << ", seconds, "
           << program_.tailLoops.size() << ", contextSets, contextFlags, " << program_.contexts.size()
           << "};\n\n";
     }

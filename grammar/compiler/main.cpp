@@ -50,6 +50,9 @@ int main(int argc, char** argv) {
         std::string why;
         const int closer = findCloser(grammar, facts, program, why);
         if (closer >= 0) applyCloser(program, closer);
+        for (const char* name : {"LEFT_PAREN", "LEFT_PAREN_"})
+            if (const auto found = vocabulary.numberOf.find(name); found != vocabulary.numberOf.end())
+                program.opener = found->second;
         analyse(program, grammar, facts, vocabulary.maxNumber);
         if (verbose)
             std::cerr << grammar.name << ": " << grammar.rules.size() << " rules, " << program.nodes.size()

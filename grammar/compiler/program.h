@@ -82,6 +82,8 @@ struct Program {
     /// be over". Told apart no finer than token classes are.
     std::vector<std::map<int, std::set<int>>> second;
     int closer = -1;
+    int opener = -1;      ///< the left parenthesis
+    std::set<int> owing;  ///< see owingTokens()
     std::set<int> recoverFollow;
     std::vector<int> classOf;  ///< by token number
     int classes = 0;

@@ -214,7 +214,7 @@ bool FullSearch::comesBack(const Item& call, const Entry& called, const Place& e
 /// alike.
 FullSearch::Place FullSearch::endOf(std::uint32_t entry, Place place) {
     if (place.low == place.high) return place;
-    const std::uint32_t run = text_.runEnd(place.low), needed = text_.openedBefore(entries_[entry].position);
+    const std::uint32_t run = text_.runEnd(place.low), needed = text_.closersOwedAt(entries_[entry].position);
     if (run - place.low > needed) place.low = std::min(place.high, run - needed);
     return place;
 }

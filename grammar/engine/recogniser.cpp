@@ -226,7 +226,7 @@ bool Recogniser::isCovered(const Entry& entry, std::uint32_t low, std::uint32_t 
     for (int i = 0; i < kLooked && at != kNone; ++i, at = ends_[at].next) {
         const End& end = ends_[at];
         if (end.high == high && (end.stopped & ~stopped) == 0 && text_.runEnd(low) == text_.runEnd(end.low) &&
-            text_.runEnd(low) - end.low >= text_.openedBefore(entry.position))
+            text_.runEnd(low) - end.low >= text_.closersOwedAt(entry.position))
             return true;
     }
     return false;

@@ -7,7 +7,7 @@
 /// engine never runs tables of another layout.
 namespace zr::engine {
 
-constexpr std::uint32_t kTableVersion = 4;
+constexpr std::uint32_t kTableVersion = 5;
 
 constexpr std::uint16_t kNone16 = 0xFFFF;
 
@@ -129,6 +129,8 @@ struct ParserTable {
     std::uint16_t startRule, statementRule;
     std::uint16_t recoverRule;            ///< rule or kNone16
     std::uint16_t leftParen, rightParen;  ///< token numbers for "the same parenthesis depth", 0 for none
+    /// Class set of tokens of which a rule took one by itself for every closer that it must take, or kNone16.
+    std::uint16_t owing;
     std::uint8_t keepTail;
     /// [rule * classes + class of the first token]: class set of what can come second, kNone16 for anything.
     const std::uint16_t* seconds;

@@ -33,7 +33,7 @@ void TextIndex::index() {
     candidates_.assign(table_->guardCount, {});
     barriers_.assign(table_->guardCount, {});
     nextOpener_.clear();
-    openedBefore_.clear();
+    owedAt_.clear();
 }
 
 void TextIndex::indexGuard(std::uint16_t number) {
@@ -88,13 +88,14 @@ std::uint8_t TextIndex::stoppedAfter(const NodeRow& choice, std::uint32_t branch
     return static_cast<std::uint8_t>(stopped | (1u << choice.context));
 }
 
-std::uint32_t TextIndex::openedBefore(std::uint32_t position) {
-    if (openedBefore_.empty()) {
-        openedBefore_.resize(count_ + 1);
+std::uint32_t TextIndex::closersOwedAt(std::uint32_t position) {
+    if (table_->owing == kNone16) return kNone;
+    if (owedAt_.empty()) {
+        owedAt_.resize(count_ + 1);
         for (std::uint32_t i = 0; i < count_; ++i)
-            openedBefore_[i + 1] = openedBefore_[i] + (type(i) == table_->leftParen ? 1 : 0);
+            owedAt_[i + 1] = owedAt_[i] + (inSet(table_->owing, classes_[i]) ? 1 : 0);
     }
-    return openedBefore_[position];
+    return owedAt_[position];
 }
 
 std::uint32_t skippedTo(const ParserTable& table, const TextIndex& text, std::uint32_t position) {

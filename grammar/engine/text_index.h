@@ -58,8 +58,9 @@ class TextIndex {
     std::uint8_t stoppedAfter(const NodeRow& choice, std::uint32_t branch, std::uint32_t low,
                               std::uint32_t high, std::uint8_t stopped) const;
 
-    /// Opening parentheses ahead of a position.
-    std::uint32_t openedBefore(std::uint32_t position);
+    /// How many closers rules that started ahead of a position must take behind it, at most: one for each
+    /// opening parenthesis. kNone when the grammar doesn't tell.
+    std::uint32_t closersOwedAt(std::uint32_t position);
 
  private:
     void index();
@@ -74,7 +75,7 @@ class TextIndex {
     std::vector<std::vector<std::uint32_t>> candidates_;  ///< by guard: next position that could satisfy it
     std::vector<std::vector<std::uint32_t>> barriers_;    ///< by guard: next position outside
     std::vector<std::uint32_t> nextOpener_;
-    std::vector<std::uint32_t> openedBefore_;
+    std::vector<std::uint32_t> owedAt_;
 };
 
 /// Where skipping ends that starts at a position in place of the recover rule: the first token that can
