@@ -1,11 +1,14 @@
 #include <utility>
 
 #include "analysis/driver.h"
+#include "analysis/msaccess_state.h"
 #include "analysis/mssql_state.h"
 #include "analysis/mysql_state.h"
 #include "analysis/oracle_state.h"
 #include "analysis/postgresql_state.h"
+#include "grammar/engine/diagnostics.h"
 #include "zrparsersql/analysis.h"
+#include "zrparsersql/query_text.h"
 #include "zrparsersql/sql_parsers.h"
 
 namespace {
@@ -14,8 +17,17 @@ CString asItIs(CString text) {
     return text;
 }
 
+CString preparedForAccess(const CString& text) {
+    if (!zr::diagnosticsWanted()) return PrepareAccessQueryText(text);
+    return PrepareAccessQueryText(text, [](const CString& line) { zr::diagnose(line.View()); });
+}
+
 void analyse(CZRQueryInfo& query, DBTypes kind) {
     switch (kind) {
+        case DB_MSACCESS:
+            zr::analyseQuery<CZRMSAccessSQL_v3Parcer, MSAccessSQL_v3StateSelectQuery>(query,
+                                                                                      preparedForAccess);
+            break;
         case DB_MSSQL:
         case DB_MSSQL_20:
             zr::analyseQuery<CZRMSSQLParser, MSSQLStateSelectQuery>(query, asItIs);

@@ -4,10 +4,11 @@ namespace zr {
 
 void runPasses(SelectState& state) {
     CZRSQLTree* const selectNode = state.m_selectNode;
-    state.CollectSubQueries(selectNode->GetChild(0));
-    // A nested select in the first clause ends the analysis, which is intended: the query keeps the nested
-    // descriptors only.
-    if (!state.m_states.IsEmpty()) return;
+    if (state.dialect().nestedSelectEndsAnalysis) {
+        state.CollectSubQueries(selectNode->GetChild(0));
+        // Intended: the query keeps the nested descriptors only.
+        if (!state.m_states.IsEmpty()) return;
+    }
     state.CollectAliases(selectNode);
     state.CollectTables();
     state.CollectFields();

@@ -48,6 +48,7 @@ void analyseQuery(CZRQueryInfo& query, Prepare prepare) {
     state.m_query = &query;
     state.setItemLimit(itemLimit(text));
     runPasses(state);
+    state.ProcessTail(root);
 }
 
 }  // namespace zr

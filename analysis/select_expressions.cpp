@@ -11,48 +11,60 @@ void SelectState::ProcessExpression(CZRSQLTree* node, ItemList* list, CZRSQLTree
     for (;;) {
         if (dialect_.leavesAreNoOperands && !node->GetChildCount()) return;
         if (IsOperator(node)) return ProcessOperator(node, list, parent);
-        switch (roleOf(node)) {
-            case Role::SelectQuery:
-                return ProcessSubQuery(node, list);
-            case Role::ColumnSpecification:
-                return ProcessColumn(node, list);
-            case Role::TableSpecification:
-                append(list, tableOperand(node));
-                return;
-            case Role::Cast:
-                return;
-            case Role::NewName:
-                appendText(list, newNameText(node), SIK_NUMBER);
-                return;
-            case Role::JoinPrefix:
-                return ProcessParams(&appendJoinPart(list).m_items, node);
-            case Role::JoinPostfix:
-                return work().forEachChild(*this, &SelectState::joinPostfixStep, node, list, node);
-            case Role::Function:
-            case Role::GroupFunction:
-            case Role::SearchCondition:
-            case Role::ConvertFunction:
-            case Role::UserFunction:
-                return ProcessFunction(node, list);
-            case Role::SqlLiteral:
-            case Role::Style:
-            case Role::DatePart:
-                return ProcessLiteral(node->GetChild(0), list);
-            case Role::DataType:
-                return ProcessLiteral(node, list);
-            case Role::InnerKeyword:
-            case Role::LeftKeyword:
-            case Role::RightKeyword:
-            case Role::CrossKeyword:
-                return ProcessKeyword(node, list);
-            case Role::Identificator:
-                appendText(list, node->GetText(), SIK_VALUE);
-                return;
-            default:
-                if (!node->GetChildCount()) return;
-                parent = node;
-                node = node->GetChild(0);
-        }
+        if (takeExpression(node, list, parent) || !node->GetChildCount()) return;
+        parent = node;
+        node = node->GetChild(0);
+    }
+}
+
+bool SelectState::takeExpression(CZRSQLTree* node, ItemList* list, CZRSQLTree*) {
+    switch (roleOf(node)) {
+        case Role::SelectQuery:
+            ProcessSubQuery(node, list);
+            return true;
+        case Role::ColumnSpecification:
+            ProcessColumn(node, list);
+            return true;
+        case Role::TableSpecification:
+            append(list, tableOperand(node));
+            return true;
+        case Role::Cast:
+            return true;
+        case Role::NewName:
+            appendText(list, newNameText(node), SIK_NUMBER);
+            return true;
+        case Role::JoinPrefix:
+            ProcessParams(&appendJoinPart(list).m_items, node);
+            return true;
+        case Role::JoinPostfix:
+            work().forEachChild(*this, &SelectState::joinPostfixStep, node, list, node);
+            return true;
+        case Role::Function:
+        case Role::GroupFunction:
+        case Role::SearchCondition:
+        case Role::ConvertFunction:
+        case Role::UserFunction:
+            ProcessFunction(node, list);
+            return true;
+        case Role::SqlLiteral:
+        case Role::Style:
+        case Role::DatePart:
+            ProcessLiteral(node->GetChild(0), list);
+            return true;
+        case Role::DataType:
+            ProcessLiteral(node, list);
+            return true;
+        case Role::InnerKeyword:
+        case Role::LeftKeyword:
+        case Role::RightKeyword:
+        case Role::CrossKeyword:
+            ProcessKeyword(node, list);
+            return true;
+        case Role::Identificator:
+            appendText(list, node->GetText(), SIK_VALUE);
+            return true;
+        default:
+            return false;
     }
 }
 
@@ -102,13 +114,15 @@ void SelectState::appendFunction(CZRSQLTree* node, ItemList* list) {
     item.m_isOperator = IsOperator(head);
     if (roleOf(node) == Role::UserFunction) {
         item.m_kind = SIK_USER_FUNCTION;
-        m_query->AddUserFunction(item.m_name, node->GetChildCount() > 1
-                                                  ? static_cast<int>(node->GetChild(1)->GetChildCount())
-                                                  : 0);
+        m_query->AddUserFunction(item.m_name, parameterCount(node));
     } else {
         item.m_kind = SIK_FUNCTION;
     }
     if (CZRSQLTree* const parameters = functionParameters(node)) ProcessParams(&item.m_items, parameters);
+}
+
+int SelectState::parameterCount(CZRSQLTree* node) {
+    return node->GetChildCount() > 1 ? static_cast<int>(node->GetChild(1)->GetChildCount()) : 0;
 }
 
 CString SelectState::functionName(CZRSQLTree* head) const {

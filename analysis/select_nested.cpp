@@ -10,6 +10,7 @@ void SelectState::ProcessSubQuery(CZRSQLTree* node, ItemList* list) {
     item->m_name = u"SUB_QUERY";
     CZRQueryInfo& query = newNestedQuery(item->m_query);
     append(list, std::move(item));
+    CopySources(query);
     walkNested(node, query);
 }
 
@@ -18,6 +19,7 @@ CZRQueryInfo* SelectState::ProcessUnion(CZRSQLTree* node, ItemList* list) {
     item->m_name = u"UNION";
     CZRQueryInfo& query = newNestedQuery(item->m_query);
     append(list, std::move(item));
+    CopySources(query);
     CZRSQLTree* branch = node->GetChild(0);
     if (roleOf(branch) == Role::AllKeyword) {
         // Takes a DISTINCT away from the outer query, which is intended: hosts know ALL by that.
@@ -31,11 +33,10 @@ CZRQueryInfo* SelectState::ProcessUnion(CZRSQLTree* node, ItemList* list) {
 CZRQueryInfo& SelectState::newNestedQuery(CZRQueryInfo*& owner) {
     owner = new CZRQueryInfo;
     owner->DataType = dialect_.nestedDataType;
-    CopySources(*owner);
     return *owner;
 }
 
-void SelectState::walkNested(CZRSQLTree* from, CZRQueryInfo& target) {
+void SelectState::walkNested(CZRSQLTree* from, CZRQueryInfo& target, OuterNames outerNames) {
     while (roleOf(from) != Role::SelectQuery) {
         if (!from->GetChildCount()) return;
         from = from->GetChild(0);
@@ -43,8 +44,7 @@ void SelectState::walkNested(CZRSQLTree* from, CZRQueryInfo& target) {
     std::unique_ptr<SelectState> nested = makeNested(from);
     SelectState& state = *nested;
     state.m_query = &target;
-    // Aliases of a new descriptor are copies of this state's.
-    if (!target.m_aliases.IsEmpty()) state.aliasNames_ = &aliasNames();
+    if (outerNames == OuterNames::Known) state.aliasNames_ = &aliasNames();
     work().openNested(std::move(nested));
     work().once(state, &SelectState::resolveStep, nullptr, nullptr, nullptr);
     work().forEachChild(state, &SelectState::clauseStep, from, nullptr, nullptr);
@@ -57,6 +57,10 @@ void SelectState::CopySources(CZRQueryInfo& target) {
         target.ReplaceAlias(entry.key, alias.get());
         static_cast<void>(alias.release());
     }
+    copyTablesAndFields(target);
+}
+
+void SelectState::copyTablesAndFields(CZRQueryInfo& target) {
     for (const auto& entry : m_query->m_sourceTables) target.m_sourceTables.SetAt(entry.key, entry.value);
     for (const auto& entry : m_query->m_fields) {
         auto field = entry.value ? std::make_unique<CFieldObject>(*entry.value) : nullptr;

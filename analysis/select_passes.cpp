@@ -62,10 +62,11 @@ void SelectState::collectAlias(CZRSQLTree* node) {
     enterAlias(key.MakeLower(), shown);
 }
 
-CZRAliasInfo* SelectState::enterAlias(const CString& key, const CString& shown) {
+CZRAliasInfo* SelectState::enterAlias(const CString& key, const CString& shown,
+                                      std::unique_ptr<SelectItem> expression) {
     if (m_query->m_aliases.Contains(key)) return nullptr;
     auto alias = std::make_unique<CZRAliasInfo>();
-    alias->Expression = new SelectItem;
+    alias->Expression = expression ? expression.release() : new SelectItem;
     alias->SetName(shown);
     alias->SetSrcName(shown);
     aliasNames().add(key);
@@ -113,8 +114,12 @@ void SelectState::CollectFields() {
 }
 
 void SelectState::enterField(std::unique_ptr<CFieldObject> field) {
-    m_query->ReplaceFieldObject(field->m_table + field->m_field, field.get());
+    m_query->ReplaceFieldObject(fieldKey(*field), field.get());
     static_cast<void>(field.release());
+}
+
+CString SelectState::fieldKey(const CFieldObject& field) const {
+    return field.m_table + field.m_field;
 }
 
 std::unique_ptr<CFieldObject> SelectState::MakeFieldObject(CZRSQLTree* node) {

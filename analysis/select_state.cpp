@@ -29,6 +29,8 @@ void SelectState::finish() {
     work().run();
 }
 
+void SelectState::ProcessTail(CZRSQLTree*) {}
+
 void SelectState::countItem() {
     if (walk_->itemsLeft == 0) throw std::length_error("the analysis of a query makes too many items");
     --walk_->itemsLeft;

@@ -29,6 +29,8 @@ struct Dialect {
     bool fillsMissingJoinPrefix = false;
     // A node without children is never an item of an expression.
     bool leavesAreNoOperands = false;
+    // A nested select in the first clause ends the analysis.
+    bool nestedSelectEndsAnalysis = true;
 };
 
 // Reads the tree of one SELECT and writes what it finds into one descriptor: copies of the clauses as lists
@@ -66,6 +68,8 @@ class SelectState {
     virtual void ProcessClause(CZRSQLTree* node);
     // Runs what the steps have left to do.
     void finish();
+    // The children of the tree's root behind the statement, where the root is a list of both.
+    virtual void ProcessTail(CZRSQLTree* root);
 
     virtual void ProcessPredicate(CZRSQLTree* node);
     // The entry for the items of all clauses but FROM.
@@ -89,6 +93,7 @@ class SelectState {
     virtual std::unique_ptr<SelectItem> MakeTableItem(CZRSQLTree* node);
     // Copies aliases, tables and fields to a nested descriptor: it resolves names as its parent does.
     void CopySources(CZRQueryInfo& target);
+    const Dialect& dialect() const { return dialect_; }
 
     bool IsKnownAlias(const CString& name);
     bool IsOperator(CZRSQLTree* node) const { return dialect_.tokens.isOperator(node->GetType()); }
@@ -109,10 +114,14 @@ class SelectState {
     // One node below the select node, in the order of the tree.
     virtual void collectTable(CZRSQLTree* node);
     void enterTable(const CString& name) { m_query->m_sourceTables[name] = name; }
-    // The first alias of a key wins: null when the key stands already.
-    CZRAliasInfo* enterAlias(const CString& key, const CString& shown);
-    // Under the two texts joined; replaces what stands there.
+    // The first alias of a key wins: null when the key stands already. Without an expression it gets an empty
+    // one.
+    CZRAliasInfo* enterAlias(const CString& key, const CString& shown,
+                             std::unique_ptr<SelectItem> expression = nullptr);
+    // Under its key; replaces what stands there.
     void enterField(std::unique_ptr<CFieldObject> field);
+    // The two texts joined.
+    virtual CString fieldKey(const CFieldObject& field) const;
 
     // Whether a name in front of a column, and the name of a table, stands for an alias.
     virtual bool isTableAlias(const CString& name) { return IsKnownAlias(name); }
@@ -144,10 +153,21 @@ class SelectState {
     // The item that stands for a part of a join, named " ".
     virtual SelectItem& appendJoinPart(ItemList* list);
 
-    // A new descriptor that knows what this one knows; the owner's pointer holds it at once.
+    // What ProcessExpression does with a node that is no operator, or false where the node stands for its
+    // first child.
+    virtual bool takeExpression(CZRSQLTree* node, ItemList* list, CZRSQLTree* parent);
+    // The number of parameters that a call of a user function is noted with.
+    virtual int parameterCount(CZRSQLTree* node);
+
+    // A new nested descriptor; the owner's pointer holds it at once.
     CZRQueryInfo& newNestedQuery(CZRQueryInfo*& owner);
+    void copyTablesAndFields(CZRQueryInfo& target);
     // Fills a new nested descriptor from the first select on the chain of first children.
-    void walkNested(CZRSQLTree* from, CZRQueryInfo& target);
+    enum class OuterNames { Known, Unknown };
+    void walkNested(CZRSQLTree* from, CZRQueryInfo& target, OuterNames outerNames = OuterNames::Known);
+
+    // How many items the walk may still make.
+    std::size_t itemsLeft() const { return walk_->itemsLeft; }
 
     // What has to be done behind a piece of work is put on ahead of it.
     WorkStack& work() { return walk_->work; }

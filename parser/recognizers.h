@@ -1,6 +1,7 @@
 #pragma once
 
 #include <antlr3.h>
+#include <zrparsersql/recognizers/MSAccessSQL_v3.h>
 #include <zrparsersql/recognizers/MSSQL.h>
 #include <zrparsersql/recognizers/MySQLSelect.h>
 #include <zrparsersql/recognizers/Oracle.h>
@@ -38,6 +39,7 @@ using OracleRecognizers =
     Recognizers<OracleLexerNewSSD, OracleParserNewSSD, &OracleParser_Ctx_struct::start_rule>;
 using PostgreSqlRecognizers =
     Recognizers<PostgreSQLLexerNewSSD, PostgreSQLParserNewSSD, &PostgreSQLParser_Ctx_struct::start_rule>;
-using MsAccessRecognizers = NoRecognizers;
+using MsAccessRecognizers = Recognizers<MSAccessSQL_v3LexerNewSSD, MSAccessSQL_v3ParserNewSSD,
+                                        &MSAccessSQL_v3Parser_Ctx_struct::start_rule>;
 
 }  // namespace zr

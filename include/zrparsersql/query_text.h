@@ -1,5 +1,7 @@
 #pragma once
 
+#include <functional>
+
 #include "zrparsersql/export.h"
 #include "zrparsersql/wide_string.h"
 
@@ -30,6 +32,14 @@ ZR_API CString Utf8ToWide(const char* bytes);
 // appends nothing. The record's query is a copy of the given one, as it was at the call, with the branch's
 // text.
 ZR_API void SplitUnions(CString text, CZRQueryInfo* query);
+
+// The text of an MS Access query as its parser wants it: a bracketed name of two words with a full stop
+// between them, "[Orders.Total]", becomes two, "[Orders].[Total]", wherever it stands, in strings as well.
+// Words are what \w stands for in the wide expressions of the standard library: letters and digits as the
+// process's global locale has them, and "_". `trace` gets three lines for each such name (the name, its
+// place, the place behind its bracket) and one with the result.
+ZR_API CString PrepareAccessQueryText(const CString& text,
+                                      const std::function<void(const CString& line)>& trace = {});
 
 // Puts the IDs of sources into m_sourceTables, here and in all m_subQueries, as CZRQueryInfo::ResolveSources
 // does, for queries whose sources are all known: the value of an unknown one becomes empty.

@@ -14,6 +14,21 @@ class TestDatabase final : public CZRDatabaseInfo {
     TestDatabase* Clone(int selectedOnly = 0) const override { return new TestDatabase(*this, selectedOnly); }
 };
 
+class TestField final : public CZRFieldInfo {
+ public:
+    explicit TestField(const CString& name) {
+        SetName(name);
+        SetSrcName(name);
+    }
+    TestField* Clone(int = 0) const override { return new TestField(*this); }
+    bool IsDerivedSource() const override { return false; }
+    bool IsBaseTable() const override { return false; }
+    void SetOwner(CZRTableInfo*) override {}
+    CString GetTypeDefinition() const override { return CString(); }
+    CString GetCollation() const override { return CString(); }
+    int IsExcludedFromKey() const override { return 0; }
+};
+
 class TestTable final : public CZRTableInfo {
  public:
     explicit TestTable(const CString& name) {

@@ -1,6 +1,8 @@
 #include "tests/grammar/reading.h"
 
 #include <zrparsersql/input_stream.h>
+#include <zrparsersql/recognizers/MSAccessSQL_v3.h>
+#include <zrparsersql/recognizers/MSAccessSQL_v3_tokens.h>
 #include <zrparsersql/recognizers/MSSQL.h>
 #include <zrparsersql/recognizers/MSSQL_tokens.h>
 #include <zrparsersql/recognizers/MySQLSelect.h>
@@ -216,6 +218,7 @@ constexpr Grammar grammar(std::string_view corpus, const char* (*tokenName)(int)
 }  // namespace
 
 const Grammar kGrammars[] = {
+    ZR_GRAMMAR(MSAccessSQL_v3, "msaccess", all_sql_query),
     ZR_GRAMMAR(MSSQL, "mssql", all_sql_query),
     ZR_GRAMMAR(MySQLSelect, "mysql", all_sql_query),
     ZR_GRAMMAR(Oracle, "oracle", all_sql_query),

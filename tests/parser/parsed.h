@@ -25,3 +25,4 @@ struct Parsed {
 };
 
 using ParsedMssql = Parsed<CZRMSSQLParser>;
+using ParsedMsAccess = Parsed<CZRMSAccessSQL_v3Parcer>;

@@ -146,4 +146,29 @@ TEST(MssqlFacade, FacadesDoNotShareState) {
     EXPECT_NE(treeText(*second.tree), kSelectA);
 }
 
+// The tree of an MS Access text is a list of the query and whatever stands behind it.
+TEST(MsAccessFacade, TheRootViewIsAListThatEndsWithTheEndOfTheText) {
+    const ParsedMsAccess parsed(u"SELECT [a b], 'c' FROM t ORDER BY d tail");
+    EXPECT_EQ(parsed.tree->GetText(), u"nil");
+    EXPECT_EQ(parsed.tree->GetType(), 0u);
+    ASSERT_EQ(parsed.tree->GetChildCount(), 3u);
+    EXPECT_EQ(parsed.tree->GetChild(0)->GetText(), u"SELECT_QUERY");
+    EXPECT_EQ(parsed.tree->GetChild(1)->GetText(), u"tail");
+    EXPECT_EQ(parsed.tree->GetChild(2)->GetText(), u"<EOF>");
+}
+
+TEST(MsAccessFacade, NamesAndStringsComeWithoutTheirDelimiters) {
+    const ParsedMsAccess parsed(u"SELECT [a b], 'c', \"\" FROM t");
+    CZRSQLTree* const list = parsed.tree->GetChild(0)->GetChild(0);
+    EXPECT_EQ(list->GetChild(0)->GetChild(0)->GetChild(0)->GetText(), u"a b");
+    EXPECT_EQ(list->GetChild(1)->GetChild(0)->GetChild(0)->GetText(), u"c");
+    EXPECT_EQ(list->GetChild(2)->GetChild(0)->GetChild(0)->GetText(), u"");
+}
+
+TEST(MsAccessFacade, DoesNothingToTheText) {
+    const ParsedMsAccess parsed(u"SELECT [a.b] FROM t");
+    EXPECT_EQ(parsed.tree->GetChild(0)->GetChild(0)->GetChild(0)->GetChild(0)->GetChild(0)->GetText(),
+              u"a.b");
+}
+
 }  // namespace

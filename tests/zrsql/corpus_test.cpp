@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <filesystem>
 #include <nlohmann/json.hpp>
 
@@ -77,15 +78,25 @@ TEST_P(Corpus, HasOneDescriptorALineThatAgreesWithTheTokens) {
         const json& read = analyses[at]["read"];
         EXPECT_EQ(analyses[at]["id"], queries_[at]["id"]);
         EXPECT_TRUE(analyses[at]["query"].is_object()) << queries_[at]["id"];
-        ASSERT_EQ(read["of"], tokens[at]["tokens"].size()) << queries_[at]["id"];
+        // The text of MS Access is prepared ahead of its analysis, which makes three tokens of some.
+        const std::size_t more = read["of"].get<std::size_t>() - tokens[at]["tokens"].size();
+        ASSERT_TRUE(more == 0 || (GetParam() == "msaccess" && more % 2 == 0)) << queries_[at]["id"];
         EXPECT_EQ(read["stop"].is_null(), read["tokens"] == read["of"]) << queries_[at]["id"];
-        if (!read["stop"].is_null()) {
+        if (!read["stop"].is_null() && more == 0) {
             EXPECT_EQ(read["stop"]["text"], tokens[at]["tokens"][read["tokens"].get<std::size_t>()][2]);
         }
     }
 }
 
-INSTANTIATE_TEST_SUITE_P(Dialects, Corpus, testing::Values("mssql", "mysql", "oracle", "postgresql"),
+TEST_P(Corpus, IsReadToTheEndForTheMostPart) {
+    if (GetParam() != "msaccess") GTEST_SKIP() << "there is no measure for " << GetParam();
+    const auto analyses = answers("analyze");
+    const auto whole = std::count_if(analyses.begin(), analyses.end(),
+                                     [](const json& each) { return each["read"]["stop"].is_null(); });
+    EXPECT_GE(whole, 455);
+}
+
+INSTANTIATE_TEST_SUITE_P(Dialects, Corpus, testing::Values("mssql", "mysql", "oracle", "postgresql", "msaccess"),
                          [](const testing::TestParamInfo<std::string>& file) { return file.param; });
 
 }  // namespace

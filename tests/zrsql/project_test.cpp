@@ -230,22 +230,18 @@ TEST_F(ZrsqlProject, FailuresTellWhatAndWhere) {
     EXPECT_EQ(before, readFile(shop("same.json"))) << "no failure left a trace";
 }
 
-TEST_F(ZrsqlProject, EachDialectExpandsTheStarOrTellsThatItsGrammarIsMissing) {
+TEST_F(ZrsqlProject, EachDialectExpandsTheStar) {
     for (const std::string dialect : {"mssql", "mysql", "oracle", "postgresql", "msaccess"}) {
         const std::string file = path(dialect + ".json");
         output({"new", file, "-d", dialect});
         output({"add-table", file, "t", "a", "b"});
         output({"add-query", file, "q", "SELECT t.* FROM t"});
-        const ProgramResult result = project({"analyze", file});
-        if (result.exitStatus == 0) {
-            EXPECT_THAT(result.output,
-                        AllOf(HasSubstr("  1  a  *  from t.a\n"), HasSubstr("  2  b  *  from t.b\n")))
-                << dialect;
-        } else {
-            EXPECT_EQ(result.exitStatus, 1) << dialect;
-            EXPECT_THAT(result.errors,
-                        HasSubstr("the grammar of " + dialect + " is not part of this build yet"));
-        }
+        // The walk of MS Access has written the star out itself.
+        const bool isWrittenOut = dialect == "msaccess";
+        EXPECT_THAT(output({"analyze", file}),
+                    AllOf(HasSubstr(isWrittenOut ? "  1  a  t.a  from t.a\n" : "  1  a  *  from t.a\n"),
+                          HasSubstr(isWrittenOut ? "  2  b  t.b  from t.b\n" : "  2  b  *  from t.b\n")))
+            << dialect;
     }
 }
 

@@ -56,7 +56,7 @@ TEST_P(UnbuiltDialect, IsToldToBeMissing) {
     EXPECT_THAT(result.errors, HasSubstr("the grammar of " + GetParam() + " is not part of this build yet"));
 }
 
-INSTANTIATE_TEST_SUITE_P(Dialects, UnbuiltDialect, testing::Values("mssqlfrom", "msaccess"));
+INSTANTIATE_TEST_SUITE_P(Dialects, UnbuiltDialect, testing::Values("mssqlfrom"));
 
 TEST(ZrsqlUse, HelpAndVersionAreNoFailure) {
     const auto help = runZrsql({"--help"});

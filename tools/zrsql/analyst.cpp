@@ -46,8 +46,9 @@ void appendRead(std::string& out, const ReadPlace& place) {
     out += '}';
 }
 
-ReadPlace readPlace(const Grammar& grammar, std::u16string_view text) {
-    Recogniser recogniser(grammar, text);
+ReadPlace readPlace(const Dialect& dialect, const CString& given) {
+    const CString text = dialect.prepare ? dialect.prepare(given) : given;
+    Recogniser recogniser(*dialect.grammar, text);
     const ReadResult read = recogniser.readQuery();
     ReadPlace place;
     place.taken = read.taken;
@@ -76,12 +77,12 @@ void Analyst::appendJsonMembers(std::string& out, const CString& text) {
     members.name("UserFunctions");
     appendTextMap(out, database_.UserFunctions);
     members.name("read");
-    appendRead(out, readPlace(*dialect_.grammar, text));
+    appendRead(out, readPlace(dialect_, text));
 }
 
 void Analyst::appendPicture(std::string& out, const CString& text) {
     const auto query = analyse(text);
-    drawPicture(out, text, *query, readPlace(*dialect_.grammar, text));
+    drawPicture(out, text, *query, readPlace(dialect_, text));
 }
 
 }  // namespace zr::tool

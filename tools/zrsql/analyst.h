@@ -44,7 +44,8 @@ class Analyst {
     CZRDatabaseInfo& database_;
 };
 
-ReadPlace readPlace(const Grammar& grammar, std::u16string_view text);
+// Offsets count in the text as it is parsed.
+ReadPlace readPlace(const Dialect& dialect, const CString& given);
 
 // {"tokens":..,"of":..,"stop":..}
 void appendRead(std::string& out, const ReadPlace& place);

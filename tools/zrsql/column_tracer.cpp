@@ -160,7 +160,8 @@ ResultColumn ColumnTracer::columnOf(const SelectItem& item, const Sources& sourc
     ResultColumn column{nameOf(item), isAlias(item) ? item.m_items.GetHead() : &item, {}};
     forEachItem(*column.expression, [&](const SelectItem& part) {
         const ItemClass itemClass = classOf(part);
-        if (itemClass.field && !itemClass.field->m_sourceField.IsEmpty())
+        // A reference to an alias has what it stands for below it.
+        if (itemClass.field && part.m_kind != SIK_FIELD_LIKE && !itemClass.field->m_sourceField.IsEmpty())
             addNew(column.origins, originsOf(*itemClass.field, sources));
         if (itemClass.query)
             for (const ResultColumn& nested : traced_[itemClass.query])

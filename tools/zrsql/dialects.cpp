@@ -1,5 +1,7 @@
 #include "dialects.h"
 
+#include <zrparsersql/recognizers/MSAccessSQL_v3.h>
+#include <zrparsersql/recognizers/MSAccessSQL_v3_tokens.h>
 #include <zrparsersql/recognizers/MSSQL.h>
 #include <zrparsersql/recognizers/MSSQL_tokens.h>
 #include <zrparsersql/recognizers/MySQLSelect.h>
@@ -11,6 +13,8 @@
 
 #include <new>
 #include <type_traits>
+
+#include "zrparsersql/query_text.h"
 
 namespace zr::tool {
 
@@ -56,8 +60,13 @@ constexpr Grammar kMssql = ZR_GRAMMAR(MSSQL, all_sql_query);
 constexpr Grammar kMysql = ZR_GRAMMAR(MySQLSelect, all_sql_query);
 constexpr Grammar kOracle = ZR_GRAMMAR(Oracle, all_sql_query);
 constexpr Grammar kPostgresql = ZR_GRAMMAR(PostgreSQL, all_sql_query);
+constexpr Grammar kMsAccess = ZR_GRAMMAR(MSAccessSQL_v3, all_sql_query);
 
 #undef ZR_GRAMMAR
+
+CString prepareAccess(const CString& text) {
+    return PrepareAccessQueryText(text);
+}
 
 constexpr Dialect kDialects[] = {
     {"mssql", &kMssql, DB_MSSQL},
@@ -65,7 +74,7 @@ constexpr Dialect kDialects[] = {
     {"mysql", &kMysql, DB_MYSQL},
     {"oracle", &kOracle, DB_ORACLE},
     {"postgresql", &kPostgresql, DB_POSTGRESQL},
-    {"msaccess", nullptr, DB_MSACCESS},
+    {"msaccess", &kMsAccess, DB_MSACCESS, prepareAccess},
 };
 
 }  // namespace

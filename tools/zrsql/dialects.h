@@ -5,6 +5,7 @@
 
 #include "recogniser.h"
 #include "zrparsersql/db_types.h"
+#include "zrparsersql/wide_string.h"
 
 namespace zr::tool {
 
@@ -12,6 +13,8 @@ struct Dialect {
     std::string_view name;
     const Grammar* grammar;  // null: not part of this build
     DBTypes kind;            // DB_NONE: there is no analysis
+    // What the analysis does to a text before it is parsed; null: nothing.
+    CString (*prepare)(const CString& text) = nullptr;
 };
 
 // Null for a name that is no dialect's.

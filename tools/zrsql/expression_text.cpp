@@ -47,6 +47,8 @@ struct Form {
 Form operatorForm(const SelectItem& item, std::size_t operands) {
     const Text name(item.m_name.View());
     const Text spaced = u" " + name + u" ";
+    // A join without operands stands for one in parentheses, which the descriptor does not keep.
+    if (isNamed(item, {u"DEF_JOIN"})) return {operands ? Text() : u"(...)", u" ", u" ", {}};
     if (operands == 0) return {name, {}, {}, {}};
     if (isAlias(item)) return {{}, u" AS ", u" AS ", {}};
     if (name == u",") return {{}, u", ", u", ", {}};
@@ -67,6 +69,8 @@ Form formOf(const SelectItem& item, std::size_t operands) {
     if (item.m_isOperator || isNamed(item, {u"NOT IN"})) return operatorForm(item, operands);
     if (isNamed(item, {u"CASE"})) return {name + u" ", u" ", u" ", u" END"};
     if (isNamed(item, {u"WHEN", u"THEN", u"ELSE"})) return {name + u" ", u" ", u" ", {}};
+    // A condition in parentheses may bear their name.
+    if (name == u"(") return {name, u", ", u", ", u")"};
     const bool isFunction = item.m_kind == SIK_FUNCTION || item.m_kind == SIK_USER_FUNCTION;
     if (isFunction || operands)
         return {(isFunction ? name : Text(item.m_text.View())) + u"(", u", ", u", ", u")"};
@@ -80,8 +84,14 @@ struct Piece {
     const SelectItem* item = nullptr;
 };
 
+// In some calls the commas stand among the arguments.
+bool isComma(const SelectItem* item) {
+    return item->m_isOperator && item->m_items.IsEmpty() && item->m_name == u",";
+}
+
 std::vector<Piece> piecesOf(const SelectItem& item, const NameQuery& nameQuery) {
     std::vector<const SelectItem*> operands(item.m_items.begin(), item.m_items.end());
+    std::erase_if(operands, isComma);
     Text directions;
     while (!operands.empty() && isDirection(*operands.back())) {
         directions.insert(0, u" " + Text(operands.back()->m_text.View()));
@@ -104,7 +114,7 @@ std::vector<Piece> piecesOf(const SelectItem& item, const NameQuery& nameQuery) 
 }  // namespace
 
 bool isAlias(const SelectItem& item) {
-    return item.m_isOperator && item.m_items.GetCount() >= 2 && isNamed(item, {u"ALIAS"});
+    return item.m_isOperator && item.m_items.GetCount() >= 2 && isNamed(item, {u"ALIAS", u"AS"});
 }
 
 Text fieldText(const SelectItemField& field) {

@@ -1,11 +1,25 @@
 #include "from_sources.h"
 
+#include <algorithm>
 #include <unordered_map>
 
 #include "descriptor_access.h"
 #include "expression_text.h"
 
 namespace zr::tool {
+
+namespace {
+
+// The item of an alias that stands for a table; null for any other.
+const SelectItem* aliasedTable(const CZRAliasInfo& alias) {
+    if (!alias.Expression || alias.Expression->m_items.IsEmpty()) return nullptr;
+    const SelectItem* const item = alias.Expression->m_items.GetHead();
+    if (!isAlias(*item)) return nullptr;
+    const SelectItemField* const named = classOf(*item->m_items.GetHead()).field;
+    return named && named->m_sourceField.IsEmpty() && !named->m_sourceTable.IsEmpty() ? item : nullptr;
+}
+
+}  // namespace
 
 std::vector<FromSource> fromSources(const CZRQueryInfo& query) {
     std::vector<FromSource> sources;
@@ -27,6 +41,14 @@ std::vector<FromSource> fromSources(const CZRQueryInfo& query) {
         sources.push_back(source);
     };
     for (const SelectItem* item : query.m_fromItems) forEachItem(*item, add);
+    // Some dialects keep no items of a join in parentheses, but know what its aliases stand for.
+    for (const auto* entry : sortedEntries(query.m_aliases)) {
+        const SelectItem* const item = entry->value ? aliasedTable(*entry->value) : nullptr;
+        const bool isNew = std::none_of(sources.begin(), sources.end(), [&](const FromSource& source) {
+            return source.alias.EqualsNoCase(entry->key);
+        });
+        if (item && isNew) forEachItem(*item, add);
+    }
     return sources;
 }
 

@@ -153,7 +153,8 @@ class QueryPicture {
         forEachItem(root, [&](const SelectItem& item) {
             const ItemClass itemClass = classOf(item);
             Text one;
-            if (itemClass.field)
+            // A reference to an alias has what it stands for below it.
+            if (itemClass.field && item.m_kind != SIK_FIELD_LIKE)
                 one = originOfField(*itemClass.field);
             else if (itemClass.query)
                 one = numbering_.nameOf(*itemClass.query);
@@ -163,16 +164,18 @@ class QueryPicture {
     }
 
     Text originOfField(const SelectItemField& field) const {
-        Text source;
-        if (!field.m_tableAlias.IsEmpty())
-            source = names_.meaningOf(field.m_tableAlias);
-        else if (!field.m_sourceTable.IsEmpty())
-            source = Text(field.m_sourceTable.View());
-        else
-            source = onlySourceOf(field.m_sourceField);
+        const Text source = sourceOfField(field);
         if (source.empty()) return source;
         if (isAllColumns(field)) return source + u".*";
         return field.m_sourceField.IsEmpty() ? source : source + u"." + Text(field.m_sourceField.View());
+    }
+
+    Text sourceOfField(const SelectItemField& field) const {
+        if (!field.m_tableAlias.IsEmpty()) return names_.meaningOf(field.m_tableAlias);
+        if (field.m_sourceTable.IsEmpty()) return onlySourceOf(field.m_sourceField);
+        // The name may be that of an alias which was not known yet where it was read.
+        const Text meaning = names_.meaningOf(field.m_sourceTable);
+        return meaning.empty() ? Text(field.m_sourceTable.View()) : meaning;
     }
 
     // The source of a column that is written without one: the only source there is, or the only one of the

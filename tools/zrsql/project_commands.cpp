@@ -134,18 +134,18 @@ void show(const ProjectOptions& options, std::string& out) {
     failUnknown(options, "table or query", options.name);
 }
 
-const Grammar& grammarOf(const host::Database& database, const std::string& file) {
+const Dialect& dialectOf(const host::Database& database, const std::string& file) {
     const Dialect* dialect = findDialect(database.GetDBType());
     if (!dialect || !dialect->grammar)
         throw ProjectFailure(file + ": the grammar of " +
                              (dialect ? std::string(dialect->name) : "its dialect") +
                              " is not part of this build yet");
-    return *dialect->grammar;
+    return *dialect;
 }
 
 void analyze(const ProjectOptions& options, std::string& out) {
     const DatabasePointer database = host::loadProject(options.file);
-    const Grammar& grammar = grammarOf(*database, options.file);
+    const Dialect& dialect = dialectOf(*database, options.file);
     try {
         host::analyseQueries(*database);
     } catch (const host::CyclicQueries& ring) {
@@ -165,9 +165,9 @@ void analyze(const ProjectOptions& options, std::string& out) {
         if (!isFirst) out += options.asJson ? "," : "\n";
         isFirst = false;
         if (options.asJson)
-            appendAnalysisJson(out, *query, tracer, grammar);
+            appendAnalysisJson(out, *query, tracer, dialect);
         else
-            appendAnalysis(out, *query, tracer, grammar);
+            appendAnalysis(out, *query, tracer, dialect);
     }
     if (options.asJson) out += "]}\n";
 }

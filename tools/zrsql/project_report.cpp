@@ -208,7 +208,7 @@ void appendQueryText(std::string& out, const CZRQueryInfo& query) {
 }
 
 void appendAnalysis(std::string& out, const CZRQueryInfo& query, ColumnTracer& tracer,
-                    const Grammar& grammar) {
+                    const Dialect& dialect) {
     Text text = u"Query " + textOf(query.GetSrcName()) + u'\n';
     TextTable columns;
     std::size_t place = 0;
@@ -229,12 +229,12 @@ void appendAnalysis(std::string& out, const CZRQueryInfo& query, ColumnTracer& t
         sources.add({textOf(source->key), meaning == "unknown" ? u"not in the project" : textOf(meaning)});
     }
     appendBlock(text, u"Sources", sources);
-    appendStop(text, readPlace(grammar, query.m_sql));
+    appendStop(text, readPlace(dialect, query.m_sql));
     appendUtf8(out, text);
 }
 
 void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, ColumnTracer& tracer,
-                        const Grammar& grammar) {
+                        const Dialect& dialect) {
     out += '{';
     JsonMembers members(out);
     members.text("name", query.GetSrcName().View());
@@ -252,7 +252,7 @@ void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, ColumnTrace
     }
     out += ']';
     members.name("read");
-    appendRead(out, readPlace(grammar, query.m_sql));
+    appendRead(out, readPlace(dialect, query.m_sql));
     out += '}';
 }
 

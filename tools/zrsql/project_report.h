@@ -4,7 +4,7 @@
 
 #include "column_tracer.h"
 #include "host/project.h"
-#include "recogniser.h"
+#include "dialects.h"
 
 namespace zr::tool {
 
@@ -21,9 +21,9 @@ void appendQueryText(std::string& out, const CZRQueryInfo& query);
 // An analysed query: its result columns with where each comes from, its sources, and how far its text was
 // read.
 void appendAnalysis(std::string& out, const CZRQueryInfo& query, ColumnTracer& tracer,
-                    const Grammar& grammar);
+                    const Dialect& dialect);
 // The same as a JSON object.
 void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, ColumnTracer& tracer,
-                        const Grammar& grammar);
+                        const Dialect& dialect);
 
 }  // namespace zr::tool
