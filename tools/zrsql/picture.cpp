@@ -12,6 +12,7 @@
 #include "from_sources.h"
 #include "text_table.h"
 #include "zrparsersql/database_info.h"
+#include "zrparsersql/nested_queries.h"
 
 namespace zr::tool {
 
@@ -207,11 +208,23 @@ class QueryPicture {
                 resolved = query_.FindSource(entry->key) ? u"known as " + Text(entry->value.View())
                                                          : u"not in the catalogue";
             table.add({Text(entry->key.View()), aliases.empty() ? aliases : u"as " + aliases,
-                       isOwn ? u"" : u"in another query", resolved});
+                       isOwn || !isReadByNested(entry->key) ? u"" : u"in another query", resolved});
         }
         Text sources;
         table.appendTo(sources);
         if (!sources.empty()) out_ += u"\nSources\n" + sources;
+    }
+
+    // Whether the FROM clause of a nested query names it. Some dialects keep no item for a table in
+    // parentheses.
+    bool isReadByNested(const CString& source) const {
+        // Nothing is changed: the function takes what it hands out.
+        for (const CZRQueryInfo* nested : withNestedQueries(const_cast<CZRQueryInfo&>(query_))) {
+            if (nested == &query_) continue;
+            for (const FromSource& from : fromSources(*nested))
+                if (from.table && from.table->m_sourceTable.EqualsNoCase(source)) return true;
+        }
+        return false;
     }
 
     void drawClauses() {
