@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <filesystem>
+#include <map>
 #include <nlohmann/json.hpp>
 
 #include "program.h"
@@ -88,15 +89,18 @@ TEST_P(Corpus, HasOneDescriptorALineThatAgreesWithTheTokens) {
     }
 }
 
-TEST_P(Corpus, IsReadToTheEndForTheMostPart) {
-    if (GetParam() != "msaccess") GTEST_SKIP() << "there is no measure for " << GetParam();
+TEST_P(Corpus, IsReadToItsEndAsOftenAsBefore) {
+    // The grammars are those of older servers; fewer than this were never read.
+    static const std::map<std::string, std::ptrdiff_t> least = {
+        {"mssql", 158}, {"mysql", 203}, {"oracle", 430}, {"postgresql", 244}, {"msaccess", 459}};
     const auto analyses = answers("analyze");
     const auto whole = std::count_if(analyses.begin(), analyses.end(),
                                      [](const json& each) { return each["read"]["stop"].is_null(); });
-    EXPECT_GE(whole, 455);
+    EXPECT_GE(whole, least.at(GetParam()));
 }
 
-INSTANTIATE_TEST_SUITE_P(Dialects, Corpus, testing::Values("mssql", "mysql", "oracle", "postgresql", "msaccess"),
+INSTANTIATE_TEST_SUITE_P(Dialects, Corpus,
+                         testing::Values("mssql", "mysql", "oracle", "postgresql", "msaccess"),
                          [](const testing::TestParamInfo<std::string>& file) { return file.param; });
 
 }  // namespace
