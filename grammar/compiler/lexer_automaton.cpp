@@ -80,11 +80,12 @@ class LexerBuilder {
         const auto found = indexOf_.find(e.rule);
         if (found == indexOf_.end())
             throw GrammarError(grammar_.file, e.line, "lexer rule " + e.rule + " is not defined");
-        if (++depth_ > 50)
-            throw GrammarError(grammar_.file, e.line, "lexer rule " + e.rule + " refers to itself");
         const LexRule& other = grammar_.rules[found->second];
+        if (&other == &rule || std::find(open_.begin(), open_.end(), &other) != open_.end())
+            throw GrammarError(grammar_.file, e.line, "lexer rule " + e.rule + " refers to itself");
+        open_.push_back(&other);
         const int result = alternatives(other, other.alternatives, next);
-        --depth_;
+        open_.pop_back();
         return result;
     }
 
@@ -213,7 +214,7 @@ class LexerBuilder {
     std::map<std::string, std::size_t> indexOf_;
     std::vector<int> representative_;
     LexerProgram program_;
-    int depth_ = 0;
+    std::vector<const LexRule*> open_;  ///< rules that are being put into others
 };
 
 }  // namespace
