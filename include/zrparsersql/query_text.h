@@ -38,8 +38,8 @@ ZR_SHARED_DECLARATION void SplitUnions(CString text, CZRQueryInfo* query);
 // Words are what \w stands for in the wide expressions of the standard library: letters and digits as the
 // process's global locale has them, and "_". `trace` gets three lines for each such name (the name, its
 // place, the place behind its bracket) and one with the result.
-ZR_API CString PrepareAccessQueryText(const CString& text,
-                                      const std::function<void(const CString& line)>& trace = {});
+ZR_SHARED_DECLARATION CString
+PrepareAccessQueryText(const CString& text, const std::function<void(const CString& line)>& trace = {});
 
 // Puts the IDs of sources into m_sourceTables, here and in all m_subQueries, as CZRQueryInfo::ResolveSources
 // does, for queries whose sources are all known: the value of an unknown one becomes empty.
