@@ -1,17 +1,9 @@
 # The libraries that are called. zr::antlr3c, zr::uuid and ICU::* serve the library; the rest serve host, tool, tests.
 
-find_path(ZR_ANTLR3C_INCLUDE_DIR antlr3.h REQUIRED)
-find_library(ZR_ANTLR3C_LIBRARY antlr3c REQUIRED)
-add_library(zr::antlr3c UNKNOWN IMPORTED GLOBAL)
-set_target_properties(zr::antlr3c PROPERTIES IMPORTED_LOCATION "${ZR_ANTLR3C_LIBRARY}"
-                                             INTERFACE_INCLUDE_DIRECTORIES "${ZR_ANTLR3C_INCLUDE_DIR}")
-
-find_path(ZR_UUID_INCLUDE_DIR uuid/uuid.h REQUIRED)
-find_library(ZR_UUID_LIBRARY uuid REQUIRED)
-add_library(zr::uuid UNKNOWN IMPORTED GLOBAL)
-set_target_properties(zr::uuid PROPERTIES IMPORTED_LOCATION "${ZR_UUID_LIBRARY}"
-                                          INTERFACE_INCLUDE_DIRECTORIES "${ZR_UUID_INCLUDE_DIR}")
-
+include(ZRParserSQLDependencies)
+if(ZRParserSQL_MISSING)
+  message(FATAL_ERROR "missing: ${ZRParserSQL_MISSING}")
+endif()
 find_package(ICU REQUIRED COMPONENTS uc i18n)
 find_package(Threads REQUIRED)
 

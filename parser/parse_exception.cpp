@@ -1,17 +1,13 @@
 #include "zrparsersql/parse_exception.h"
 
+#include <cstdint>
 #include <utility>
 
 #include "platform/message_box.h"
 
 namespace {
-constexpr unsigned kErrorBox = 16;  // one button, error icon
+constexpr std::uint32_t kErrorBox = 16;  // one button, error icon
 }  // namespace
-
-CZRException::CZRException() = default;
-CZRException::CZRException(const CZRException&) = default;
-CZRException& CZRException::operator=(const CZRException&) = default;
-CZRException::~CZRException() = default;
 
 // Leaving the numbers unset is intended; zero is as good as any value.
 CZRParseSQLException::CZRParseSQLException() : m_code(0), m_number(0) {}

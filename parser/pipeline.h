@@ -49,12 +49,4 @@ class Pipeline {
     typename Grammar::Parser m_parser = nullptr;
 };
 
-template <>
-class Pipeline<NoRecognizers> {
- public:
-    static std::unique_ptr<Pipeline> run(pANTLR3_INPUT_STREAM) { return nullptr; }
-    pANTLR3_BASE_TREE tree() const { return nullptr; }
-    pANTLR3_COMMON_TOKEN_STREAM tokens() const { return nullptr; }
-};
-
 }  // namespace zr

@@ -14,7 +14,6 @@ namespace zr {
 // The recognisers of one grammar as the pipeline calls them.
 template <auto LexerNewSSD, auto ParserNewSSD, auto StartRule>
 struct Recognizers {
-    static constexpr bool areThere = true;
     using Lexer =
         std::invoke_result_t<decltype(LexerNewSSD), pANTLR3_INPUT_STREAM, pANTLR3_RECOGNIZER_SHARED_STATE>;
     using Parser = std::invoke_result_t<decltype(ParserNewSSD), pANTLR3_COMMON_TOKEN_STREAM,
@@ -23,11 +22,6 @@ struct Recognizers {
     static Lexer newLexer(pANTLR3_INPUT_STREAM input) { return LexerNewSSD(input, nullptr); }
     static Parser newParser(pANTLR3_COMMON_TOKEN_STREAM tokens) { return ParserNewSSD(tokens, nullptr); }
     static ZRRuleReturn run(Parser parser) { return (parser->*StartRule)(parser); }
-};
-
-// Stands for a grammar that is not written yet: its facade parses nothing.
-struct NoRecognizers {
-    static constexpr bool areThere = false;
 };
 
 // The grammar of each facade.

@@ -6,9 +6,6 @@
 #include "parser/recognizers.h"
 #include "parser/tree_view.h"
 
-CZRSQLParser::CZRSQLParser() = default;
-CZRSQLParser::~CZRSQLParser() = default;
-
 class CZROracleParserImp final : public zr::ParserImp<zr::OracleRecognizers, CZROracleTree> {};
 class CZRMySQLParcerImp final : public zr::ParserImp<zr::MySqlRecognizers, CZRMySQLTree> {};
 class CZRPostgreParserImp final : public zr::ParserImp<zr::PostgreSqlRecognizers, CZRPostgreTree> {};

@@ -2,24 +2,26 @@
 
 #include <atomic>
 
+#include "zrparsersql/message_box.h"
+
 #if defined(_WIN32)
 #include <windows.h>
 #endif
 
-namespace zr {
 namespace {
 
 // The one thing a host sets for the whole process: there is one user interface.
-std::atomic<MessageBoxHandler> currentHandler{nullptr};
+std::atomic<ZRMessageBoxFunction> currentFunction{nullptr};
 
 }  // namespace
 
-MessageBoxHandler setMessageBoxHandler(MessageBoxHandler handler) {
-    return currentHandler.exchange(handler);
+ZRMessageBoxFunction zrSetMessageBoxFunction(ZRMessageBoxFunction function) {
+    return currentFunction.exchange(function);
 }
 
-int showMessageBox(void* owner, const char16_t* text, const char16_t* caption, unsigned style) {
-    if (const MessageBoxHandler handler = currentHandler.load()) return handler(owner, text, caption, style);
+int zr::showMessageBox(void* owner, const char16_t* text, const char16_t* caption, std::uint32_t style) {
+    if (const ZRMessageBoxFunction function = currentFunction.load())
+        return function(owner, text, caption, style);
 #if defined(_WIN32)
     return ::MessageBoxW(static_cast<HWND>(owner), reinterpret_cast<const wchar_t*>(text),
                          reinterpret_cast<const wchar_t*>(caption), style);
@@ -27,5 +29,3 @@ int showMessageBox(void* owner, const char16_t* text, const char16_t* caption, u
     return 0;
 #endif
 }
-
-}  // namespace zr

@@ -117,11 +117,12 @@ struct ParserGrammar {
     std::string name;
     std::vector<Rule> rules;
     std::map<std::string, int> indexOf;
-    int start = -1;         ///< the start rule: statement rule, any tokens, end of file
-    int statement = -1;     ///< first rule of the start rule
-    bool keepTail = false;  ///< tail tokens and end of file stay in the tree (nil root)
-    int recoverRule = -1;   ///< mandatory part that an error node may stand in for, or -1
-    int islandRule = -1;    ///< rule that every nested statement goes through, or -1
+    int start = -1;               ///< the start rule: statement rule, any tokens, end of file
+    int statement = -1;           ///< first rule of the start rule
+    bool keepTail = false;        ///< tail tokens and end of file stay in the tree (nil root)
+    int recoverRule = -1;         ///< mandatory part that an error node may stand in for, or -1
+    std::vector<int> entryRules;  ///< rules that hosts call and no other rule does
+    int islandRule = -1;          ///< rule that every nested statement goes through, or -1
     /// See the notation: declining an optional part of `rule` at `token` counts as the loop of `loopRule`
     /// stopping.
     struct Declined {

@@ -24,7 +24,7 @@ class ParserReader {
         std::string rule, token, loopRule, file;
         int line;
     };
-    std::vector<Words> declined;
+    std::vector<Words> declined, entries;
     std::string start, recover, island, islandToken;
     int startLine = 0, recoverLine = 0, islandLine = 0;
 
@@ -58,6 +58,8 @@ class ParserReader {
         } else if (word == "declined") {
             Words words{in_.expectName(), in_.expectName(), in_.expectName(), in_.file(), line};
             declined.push_back(std::move(words));
+        } else if (word == "entry") {
+            entries.push_back({in_.expectName(), "", "", in_.file(), line});
         } else if (word == "island") {
             island = in_.expectName();
             islandToken = in_.next().text;
@@ -209,11 +211,12 @@ ParserGrammar readParser(const std::vector<std::string>& paths, const Vocabulary
         std::string name, token, file;
         int line = 0;
     } start, recover, island;
-    std::vector<ParserReader::Words> declined;
+    std::vector<ParserReader::Words> declined, entries;
     for (const std::string& path : paths) {
         ParserReader reader(Cursor(path, scan(path, readFile(path))), vocabulary, grammar);
         reader.read();
         declined.insert(declined.end(), reader.declined.begin(), reader.declined.end());
+        entries.insert(entries.end(), reader.entries.begin(), reader.entries.end());
         if (!reader.start.empty()) start = {reader.start, "", path, reader.startLine};
         if (!reader.recover.empty()) recover = {reader.recover, "", path, reader.recoverLine};
         if (!reader.island.empty()) island = {reader.island, reader.islandToken, path, reader.islandLine};
@@ -227,6 +230,7 @@ ParserGrammar readParser(const std::vector<std::string>& paths, const Vocabulary
     if (start.name.empty()) throw GrammarError(paths.at(0), 1, "no 'start RULE;'");
     grammar.start = find(start, "start");
     if (!recover.name.empty()) grammar.recoverRule = find(recover, "recover");
+    for (const auto& e : entries) grammar.entryRules.push_back(find({e.rule, "", e.file, e.line}, "entry"));
     for (const auto& d : declined) {
         const auto number = vocabulary.numberOf.find(d.token);
         if (number == vocabulary.numberOf.end())

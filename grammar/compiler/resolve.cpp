@@ -32,7 +32,8 @@ void resolveNames(ParserGrammar& grammar) {
 
 void checkReachable(ParserGrammar& grammar) {
     std::vector<bool> seen(grammar.rules.size(), false);
-    std::vector<int> work{grammar.start};
+    std::vector<int> work = grammar.entryRules;
+    work.push_back(grammar.start);
     while (!work.empty()) {
         const int at = work.back();
         work.pop_back();

@@ -10,7 +10,7 @@ class DescriptorCopier;
 }  // namespace zr
 
 // An alias of a select list: a column that carries the expression it stands for.
-class ZR_API CZRAliasInfo : public CZRSourceFildInfo {
+class ZR_SHARED_DECLARATION CZRAliasInfo : public CZRSourceFildInfo {
  public:
     CString AliasText;                 // no operation writes it, and copies leave it empty
     CString AliasTable;                // name of the table that the alias stands for

@@ -10,7 +10,7 @@
 #include "zrparsersql/wide_string.h"
 
 // Raised where the head, the tail or a position of a container is asked for that is not there.
-class ZR_API CInvalidArgException : public std::exception {
+class ZR_SHARED_DECLARATION CInvalidArgException : public std::exception {
  public:
     const char* what() const noexcept override { return "invalid argument"; }
 };

@@ -27,7 +27,7 @@ class SourceIndex;
 //
 // Owns its tables and queries. Threads: none of it is guarded; a query's analysis writes user functions into
 // it.
-class ZR_API CZRDatabaseInfo : public CZRObjectInfo {
+class ZR_SHARED_DECLARATION CZRDatabaseInfo : public CZRObjectInfo {
  public:
     CString SchemaName;
     int UpdateDepth = 0;  // set while the selection or an option is passed on to the tables

@@ -37,7 +37,7 @@ enum FilterEncoding : int {
 // Setters answer 1, or 0 when memory ran out, which leaves a null value. A null pointer makes a null value of
 // the type given. Reading may fill the cache of the last conversion, so even readers of one value need a
 // guard against each other; distinct values are independent.
-struct ZR_API CZRFilterValue {
+struct ZR_SHARED_DECLARATION CZRFilterValue {
     char* Data = nullptr;             // the text, with a zero behind it; null is SQL's NULL; owned
     std::uint32_t DataLength = 0;     // bytes, without the zero
     int Encoding = FE_ANSI;           // of Data
@@ -98,7 +98,7 @@ struct ZR_API CZRFilterValue {
 //
 // The destructor is not virtual: an owner runs this class's destructor and frees the memory with operator
 // delete, so a subclass may only add members that need no destruction.
-class ZR_API CZRFilterItemInfo {
+class ZR_SHARED_DECLARATION CZRFilterItemInfo {
  public:
     CString FieldID;       // SrcName of a column
     int Condition = 0;     // how the column is compared
@@ -135,7 +135,7 @@ class ZR_API CZRFilterItemInfo {
 
 // The row filter of a table: conditions, or a free SQL text. Subclasses and destruction as for
 // CZRFilterItemInfo.
-class ZR_API CZRFilterInfo {
+class ZR_SHARED_DECLARATION CZRFilterInfo {
  public:
     CList<CZRFilterItemInfo*> Items;  // owned
     CString SQLQuery;

@@ -11,6 +11,6 @@ namespace zr {
 // A query and every descriptor nested in it, at any depth, wherever it hangs: sub-queries, union branches,
 // expressions, records of unions. The query stands first. The pointers hold as long as the query is not
 // changed.
-ZR_API std::vector<CZRQueryInfo*> withNestedQueries(CZRQueryInfo& query);
+ZR_SHARED_DECLARATION std::vector<CZRQueryInfo*> withNestedQueries(CZRQueryInfo& query);
 
 }  // namespace zr

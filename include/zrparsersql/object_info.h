@@ -16,7 +16,7 @@ class CZRStorageNode;
 // A descriptor is owned by the descriptor whose list or map holds it and deleted through the virtual
 // destructor. Threads: none of it is guarded; a model is built and changed on one thread (CZRTableInfo tells
 // its one exception). Failure: nothing here reports an error, apart from GenerateID.
-class ZR_API CZRObjectInfo {
+class ZR_SHARED_DECLARATION CZRObjectInfo {
  public:
     CString ID;                // identity in the model, text of a GUID in braces
     CString SrcName;           // name in the source

@@ -7,13 +7,14 @@
 struct HWND__;
 typedef HWND__* HWND;
 
-// What every exception of the library answers.
+// What every exception of the library answers. Defined here as a whole: a host may have exceptions of its own
+// below it.
 class ZR_API CZRException {
  public:
-    CZRException();
-    CZRException(const CZRException&);
-    CZRException& operator=(const CZRException&);
-    virtual ~CZRException();
+    CZRException() = default;
+    CZRException(const CZRException&) = default;
+    CZRException& operator=(const CZRException&) = default;
+    virtual ~CZRException() = default;
 
     virtual void DoMessageBox(HWND owner) = 0;
     virtual int GetErrNumber() = 0;
@@ -36,7 +37,7 @@ class ZR_API CZRParseSQLException : public CZRException {
     CZRParseSQLException& operator=(const CZRParseSQLException& other);
     ~CZRParseSQLException() override;
 
-    // Shows an error box without text and caption, whatever the object holds.
+    // Shows an error box without text and caption, whatever the object holds; see message_box.h.
     void DoMessageBox(HWND owner) override;
     int GetErrNumber() override;
     int GetErrCode() override;

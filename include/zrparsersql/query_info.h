@@ -17,7 +17,7 @@ class RetiredObjects;
 }  // namespace zr
 
 // One branch of a query text that was cut at its unions.
-struct ZR_API CZRQueryUnionInfo {
+struct ZR_SHARED_DECLARATION CZRQueryUnionInfo {
     CZRQueryInfo* Query = nullptr;  // owned
     int UnionKind = 0;              // 0 UNION, 1 UNION ALL
     CString Text;                   // neither set nor copied
@@ -38,7 +38,7 @@ struct ZR_API CZRQueryUnionInfo {
 // without calling overrides of those operations on the queries in between; queries that read from each other
 // find nothing there. Threads: one at a time; two descriptors of one database count as one object. Failure: a
 // look-up that fails marks the query with SetCorrect(1).
-class ZR_API CZRQueryInfo : public CZRSourceInfo {
+class ZR_SHARED_DECLARATION CZRQueryInfo : public CZRSourceInfo {
  public:
     std::uint16_t QueryFlag = 0;
     CMapStringToOb<CZRAliasInfo> m_aliases;  // by name in lower case (Oracle: name with "_FIELD" or "_TABLE")

@@ -30,7 +30,7 @@ enum SelectItemKind : int {
 // One node of a descriptor's expression tree. Owned by the list, item or descriptor that holds it; nothing in
 // it points into the syntax tree it was made from. Trees may be of any depth: copying and deleting one needs
 // no machine stack for it. Not guarded against use from several threads.
-class ZR_API SelectItem {
+class ZR_SHARED_DECLARATION SelectItem {
  public:
     int m_nested = 0;     // 1 for an operator that stands directly under a nested join
     CString m_name;       // name of a function, text of an operator, or a fixed word
@@ -70,7 +70,7 @@ class ZR_API SelectItem {
 };
 
 // A column.
-class ZR_API SelectItemField : public SelectItem {
+class ZR_SHARED_DECLARATION SelectItemField : public SelectItem {
  public:
     CString m_sourceTable;     // the table as written, when it is not an alias
     CString m_sourceField;     // the column as written
@@ -95,7 +95,7 @@ class ZR_API SelectItemField : public SelectItem {
 };
 
 // A nested query within an expression.
-class ZR_API SelectItemSubQuery : public SelectItem {
+class ZR_SHARED_DECLARATION SelectItemSubQuery : public SelectItem {
  public:
     CZRQueryInfo* m_query = nullptr;  // owned
 
@@ -110,7 +110,7 @@ class ZR_API SelectItemSubQuery : public SelectItem {
 };
 
 // A branch of a union.
-class ZR_API SelectItemUnion : public SelectItem {
+class ZR_SHARED_DECLARATION SelectItemUnion : public SelectItem {
  public:
     CZRQueryInfo* m_query = nullptr;  // owned
 

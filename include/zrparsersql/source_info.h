@@ -6,7 +6,7 @@
 class CZRTableInfo;
 
 // A column of a source.
-class ZR_API CZRSourceFildInfo : public CZRObjectInfo {
+class ZR_SHARED_DECLARATION CZRSourceFildInfo : public CZRObjectInfo {
  public:
     CZRSourceFildInfo() = default;
     CZRSourceFildInfo(const CZRSourceFildInfo&) = default;
@@ -16,7 +16,7 @@ class ZR_API CZRSourceFildInfo : public CZRObjectInfo {
 
 // A source of rows: a table or a query, whatever a FROM clause can name. Whether it is a query is found by a
 // dynamic cast to CZRQueryInfo.
-class ZR_API CZRSourceInfo : public CZRObjectInfo {
+class ZR_SHARED_DECLARATION CZRSourceInfo : public CZRObjectInfo {
  public:
     CZRSourceInfo() = default;
     CZRSourceInfo(const CZRSourceInfo&) = default;
@@ -32,7 +32,7 @@ class ZR_API CZRSourceInfo : public CZRObjectInfo {
 };
 
 // What a model expects of a host's columns. The host's classes are made by its CZRDescriptorFactory.
-class ZR_API CZRFieldInfo : public CZRSourceFildInfo {
+class ZR_SHARED_DECLARATION CZRFieldInfo : public CZRSourceFildInfo {
  public:
     CZRFieldInfo() = default;
     CZRFieldInfo(const CZRFieldInfo&) = default;
@@ -50,14 +50,14 @@ class ZR_API CZRFieldInfo : public CZRSourceFildInfo {
 };
 
 // One column of an index.
-class ZR_API CZRIndexColumn {
+class ZR_SHARED_DECLARATION CZRIndexColumn {
  public:
     virtual ~CZRIndexColumn();
     virtual CString GetColumnID() const = 0;
 };
 
 // What a model expects of a host's indexes.
-class ZR_API CZRIndexInfo : public CZRObjectInfo {
+class ZR_SHARED_DECLARATION CZRIndexInfo : public CZRObjectInfo {
  public:
     CList<CZRIndexColumn*> Columns;  // owned by the host's class
     int ColumnCount = 0;
@@ -75,7 +75,7 @@ class ZR_API CZRIndexInfo : public CZRObjectInfo {
 };
 
 // What a model expects of a host's foreign keys.
-class ZR_API CZRForeignKeyInfo : public CZRObjectInfo {
+class ZR_SHARED_DECLARATION CZRForeignKeyInfo : public CZRObjectInfo {
  public:
     CZRForeignKeyInfo() = default;
     CZRForeignKeyInfo(const CZRForeignKeyInfo&) = default;

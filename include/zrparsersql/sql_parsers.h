@@ -29,10 +29,10 @@
 // other.
 class ZR_API CZRSQLParser {
  public:
-    CZRSQLParser();
+    CZRSQLParser() = default;
     CZRSQLParser(const CZRSQLParser&) = delete;
     CZRSQLParser& operator=(const CZRSQLParser&) = delete;
-    virtual ~CZRSQLParser();
+    virtual ~CZRSQLParser() = default;
 
     virtual void ParseSQL() = 0;
 };

@@ -16,7 +16,7 @@ class CZRTableInfo;
 // Where descriptors save themselves: a tree of named sections with named values, with one section current.
 // Implemented by the host. Every OpenChild of the library is followed by its CloseChild, also when an
 // exception passes through.
-class ZR_API CZRStorageNode {
+class ZR_SHARED_DECLARATION CZRStorageNode {
  public:
     virtual ~CZRStorageNode();
 
@@ -37,7 +37,7 @@ class ZR_API CZRStorageNode {
 };
 
 // Makes the host's descriptors. Each operation gives a new, empty object for the caller to own.
-class ZR_API CZRDescriptorFactory {
+class ZR_SHARED_DECLARATION CZRDescriptorFactory {
  public:
     virtual ~CZRDescriptorFactory();
 

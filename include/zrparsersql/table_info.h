@@ -14,7 +14,7 @@ class CZRDatabaseInfo;
 // Owns its children and its filter. Threads: Processed may be written and read by several threads through
 // SetProcessed, GetProcessed and the two Are...TablesProcessed; everything else belongs to the one thread
 // that configures.
-class ZR_API CZRTableInfo : public CZRSourceInfo {
+class ZR_SHARED_DECLARATION CZRTableInfo : public CZRSourceInfo {
  public:
     int UpdateDepth = 0;                  // above 0 while an option setter is at work
     CZRIndexInfo* UniqueIndex = nullptr;  // result of GetUniqueIndex; not owned

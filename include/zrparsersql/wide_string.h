@@ -53,7 +53,7 @@ class FormatArgument {
 // Threads: distinct objects may be used from distinct threads, even when they share a buffer. One object
 // needs the caller's own guard as soon as a thread changes it. Failure: only an exhausted heap, as
 // std::bad_alloc; positions and lengths out of range are brought into range.
-class ZR_API CString {
+class ZR_SHARED_DECLARATION CString {
  public:
     CString() noexcept = default;
     CString(const CString& other) noexcept : rep_(other.rep_) { retain(rep_); }

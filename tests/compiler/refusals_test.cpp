@@ -112,6 +112,13 @@ TEST(GrammarCompiler, TakesAGoodGrammar) {
     EXPECT_NE(out.content("Toy_tokens.h").find("Toy_QUERY"), std::string::npos);
 }
 
+TEST(GrammarCompiler, KeepsARuleThatOnlyHostsCall) {
+    OutputFolder out("entry");
+    ASSERT_EQ(run(inputsOf("good") + out.arguments()).status, 0);
+    EXPECT_NE(out.content("Toy.h").find("(*alone)(pToyParser ctx);"), std::string::npos)
+        << out.content("Toy.h");
+}
+
 TEST(GrammarCompiler, WritesTheSameFilesEveryTime) {
     OutputFolder first("first"), second("second");
     for (const std::string& inputs :

@@ -30,8 +30,11 @@ std::string restOf(const std::vector<TokenText>& tokens, std::size_t first) {
     std::string out;
     for (std::size_t i = first; i < tokens.size(); ++i) {
         if (i > first) out += ' ';
-        for (const char16_t unit : tokens[i].text)
-            out += unit < 0x80 ? std::string(1, static_cast<char>(unit)) : quoteJson({&unit, 1}).substr(1, 6);
+        for (const char16_t unit : tokens[i].text) {
+            const std::string quoted = quoteJson({&unit, 1});
+            const bool plain = unit >= 0x20 && unit < 0x80;
+            out += plain ? std::string(1, static_cast<char>(unit)) : quoted.substr(1, quoted.size() - 2);
+        }
     }
     return out;
 }

@@ -89,9 +89,13 @@ TEST_P(GrammarProperties, WhatWasReadReadsTheSameByItself) {
 TEST_P(GrammarProperties, BlanksBetweenTokensDontMatter) {
     forEachText(grammar(), [this](const std::u16string& text) {
         const Reading reading = grammar().read(text);
+        std::u16string blanks;  // line ends are tokens of some grammars
+        for (const char16_t unit : {u' ', u'\t', u'\r', u'\n'})
+            if (grammar().lex({&unit, 1}).empty()) blanks += unit;
+        ASSERT_GE(blanks.size(), 2U);
         std::u16string spaced;
         for (const TokenText& token : reading.tokens)
-            spaced += u" \t\r\n" + text.substr(token.from, token.to - token.from) + u'\n';
+            spaced += blanks + text.substr(token.from, token.to - token.from) + blanks.back();
         EXPECT_EQ(grammar().read(spaced).tree.flat(), reading.tree.flat());
     });
 }

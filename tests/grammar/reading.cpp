@@ -5,6 +5,8 @@
 #include <zrparsersql/recognizers/MSAccessSQL_v3_tokens.h>
 #include <zrparsersql/recognizers/MSSQL.h>
 #include <zrparsersql/recognizers/MSSQL_tokens.h>
+#include <zrparsersql/recognizers/MSSQLfrom.h>
+#include <zrparsersql/recognizers/MSSQLfrom_tokens.h>
 #include <zrparsersql/recognizers/MySQLSelect.h>
 #include <zrparsersql/recognizers/MySQLSelect_tokens.h>
 #include <zrparsersql/recognizers/Oracle.h>
@@ -220,6 +222,7 @@ constexpr Grammar grammar(std::string_view corpus, const char* (*tokenName)(int)
 const Grammar kGrammars[] = {
     ZR_GRAMMAR(MSAccessSQL_v3, "msaccess", all_sql_query),
     ZR_GRAMMAR(MSSQL, "mssql", all_sql_query),
+    ZR_GRAMMAR(MSSQLfrom, "mssqlfrom", node_from_list),
     ZR_GRAMMAR(MySQLSelect, "mysql", all_sql_query),
     ZR_GRAMMAR(Oracle, "oracle", all_sql_query),
     ZR_GRAMMAR(PostgreSQL, "postgresql", all_sql_query),

@@ -1,10 +1,9 @@
 #include "zrparsersql/parse_exception.h"
 
 #include <gtest/gtest.h>
+#include <zrparsersql/message_box.h>
 
 #include <string>
-
-#include "platform/message_box.h"
 
 namespace {
 
@@ -55,21 +54,21 @@ TEST(ParseSqlException, IsThrownAndCaughtAsItsBase) {
 struct Box {
     void* owner = nullptr;
     std::u16string text = u"unset", caption = u"unset";
-    unsigned style = 0;
+    std::uint32_t style = 0;
     int shown = 0;
 };
 Box box;
 
 TEST(ParseSqlException, ShowsABlankErrorBoxWhateverItHolds) {
     box = Box();
-    const zr::MessageBoxHandler before = zr::setMessageBoxHandler(
-        [](void* owner, const char16_t* text, const char16_t* caption, unsigned style) {
+    const ZRMessageBoxFunction before = zrSetMessageBoxFunction(
+        [](void* owner, const char16_t* text, const char16_t* caption, std::uint32_t style) {
             box = {owner, text, caption, style, box.shown + 1};
             return 1;
         });
     int window = 0;
     CZRParseSQLException(u"x", 3).DoMessageBox(reinterpret_cast<HWND>(&window));
-    zr::setMessageBoxHandler(before);
+    zrSetMessageBoxFunction(before);
     EXPECT_EQ(box.shown, 1);
     EXPECT_EQ(box.owner, &window);
     EXPECT_EQ(box.text, u"");

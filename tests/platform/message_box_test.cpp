@@ -1,6 +1,7 @@
 #include "platform/message_box.h"
 
 #include <gtest/gtest.h>
+#include <zrparsersql/message_box.h>
 
 #include <string>
 
@@ -10,31 +11,31 @@ struct Shown {
     void* owner;
     std::u16string text;
     std::u16string caption;
-    unsigned style;
+    std::uint32_t style;
 };
 Shown shown;
 
-int remember(void* owner, const char16_t* text, const char16_t* caption, unsigned style) {
+int remember(void* owner, const char16_t* text, const char16_t* caption, std::uint32_t style) {
     shown = {owner, text, caption, style};
     return 7;
 }
 
-TEST(MessageBox, GoesToTheHandler) {
+TEST(MessageBox, GoesToTheFunctionThatIsSet) {
     int window = 0;
-    const zr::MessageBoxHandler before = zr::setMessageBoxHandler(remember);
+    const ZRMessageBoxFunction before = zrSetMessageBoxFunction(remember);
     EXPECT_EQ(zr::showMessageBox(&window, u"text", u"caption", 16), 7);
     EXPECT_EQ(shown.owner, &window);
     EXPECT_EQ(shown.text, u"text");
     EXPECT_EQ(shown.caption, u"caption");
     EXPECT_EQ(shown.style, 16u);
-    EXPECT_EQ(zr::setMessageBoxHandler(before), remember);
+    EXPECT_EQ(zrSetMessageBoxFunction(before), remember);
 }
 
 #if !defined(_WIN32)
-TEST(MessageBox, ShowsNothingWithoutAHandler) {
-    const zr::MessageBoxHandler before = zr::setMessageBoxHandler(nullptr);
+TEST(MessageBox, ShowsNothingWithoutAFunction) {
+    const ZRMessageBoxFunction before = zrSetMessageBoxFunction(nullptr);
     EXPECT_EQ(zr::showMessageBox(nullptr, u"", u"", 16), 0);
-    zr::setMessageBoxHandler(before);
+    zrSetMessageBoxFunction(before);
 }
 #endif
 

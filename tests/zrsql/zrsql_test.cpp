@@ -48,16 +48,6 @@ INSTANTIATE_TEST_SUITE_P(
                     std::vector<std::string>{"tree", "-d", "mssql", "--jsonl", "-", "--jobs", "0"},
                     std::vector<std::string>{"tree", "-d", "mssql", "--jsonl", "-", "--jobs", "many"}));
 
-class UnbuiltDialect : public testing::TestWithParam<std::string> {};
-
-TEST_P(UnbuiltDialect, IsToldToBeMissing) {
-    const auto result = runZrsql({"tree", "-d", GetParam(), kSimple});
-    EXPECT_EQ(result.exitStatus, 2);
-    EXPECT_THAT(result.errors, HasSubstr("the grammar of " + GetParam() + " is not part of this build yet"));
-}
-
-INSTANTIATE_TEST_SUITE_P(Dialects, UnbuiltDialect, testing::Values("mssqlfrom"));
-
 TEST(ZrsqlUse, HelpAndVersionAreNoFailure) {
     const auto help = runZrsql({"--help"});
     EXPECT_EQ(help.exitStatus, 0);

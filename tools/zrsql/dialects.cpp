@@ -4,6 +4,8 @@
 #include <zrparsersql/recognizers/MSAccessSQL_v3_tokens.h>
 #include <zrparsersql/recognizers/MSSQL.h>
 #include <zrparsersql/recognizers/MSSQL_tokens.h>
+#include <zrparsersql/recognizers/MSSQLfrom.h>
+#include <zrparsersql/recognizers/MSSQLfrom_tokens.h>
 #include <zrparsersql/recognizers/MySQLSelect.h>
 #include <zrparsersql/recognizers/MySQLSelect_tokens.h>
 #include <zrparsersql/recognizers/Oracle.h>
@@ -57,6 +59,7 @@ constexpr Grammar grammarOf() {
               &std::remove_pointer_t<p##NAME##Parser>::QUERY_RULE, NAME##_token_name>()
 
 constexpr Grammar kMssql = ZR_GRAMMAR(MSSQL, all_sql_query);
+constexpr Grammar kMssqlfrom = ZR_GRAMMAR(MSSQLfrom, node_from_list);
 constexpr Grammar kMysql = ZR_GRAMMAR(MySQLSelect, all_sql_query);
 constexpr Grammar kOracle = ZR_GRAMMAR(Oracle, all_sql_query);
 constexpr Grammar kPostgresql = ZR_GRAMMAR(PostgreSQL, all_sql_query);
@@ -70,7 +73,7 @@ CString prepareAccess(const CString& text) {
 
 constexpr Dialect kDialects[] = {
     {"mssql", &kMssql, DB_MSSQL},
-    {"mssqlfrom", nullptr, DB_NONE},
+    {"mssqlfrom", &kMssqlfrom, DB_NONE},
     {"mysql", &kMysql, DB_MYSQL},
     {"oracle", &kOracle, DB_ORACLE},
     {"postgresql", &kPostgresql, DB_POSTGRESQL},

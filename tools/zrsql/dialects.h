@@ -11,8 +11,8 @@ namespace zr::tool {
 
 struct Dialect {
     std::string_view name;
-    const Grammar* grammar;  // null: not part of this build
-    DBTypes kind;            // DB_NONE: there is no analysis
+    const Grammar* grammar;
+    DBTypes kind;  // DB_NONE: there is no analysis
     // What the analysis does to a text before it is parsed; null: nothing.
     CString (*prepare)(const CString& text) = nullptr;
 };

@@ -64,7 +64,6 @@ std::string complaintAbout(const Dialect* dialect, const Words& words, Command c
     if (!dialect) return "there is no dialect \"" + words.dialect + "\"; there are " + dialectNames();
     if (command == Command::Analyze && dialect->kind == DB_NONE)
         return words.dialect + " has tokens and a tree only; there is no analysis of it";
-    if (!dialect->grammar) return "the grammar of " + words.dialect + " is not part of this build yet";
     return {};
 }
 

@@ -1,0 +1,43 @@
+#!/usr/bin/env bash
+# Does in an empty folder what the README tells somebody who embeds the installed library: its two files, then each of
+# its blocks of commands, which have to write what it says.
+#
+#     readme.sh README PREFIX WORK_FOLDER
+#
+# CMAKE, CC and CXX name the tools.
+set -euo pipefail
+readme=$1 prefix=$2 work=$3
+rm -rf "$work"
+mkdir -p "$work/bin"
+cd "$work"
+
+# block LANGUAGE N: the Nth block of the README's part about embedding in that language.
+block() {
+    awk -v fence="\`\`\`$1" -v wanted="$2" '
+        /^## / { inside = $0 == "## Embed it" }
+        !inside { next }
+        $0 == fence { taking = ++count == wanted; next }
+        /^```/ { taking = 0 }
+        taking' "$readme"
+}
+block cmake 1 >CMakeLists.txt
+block cpp 1 >host.cpp
+block console 1 | tail -n +2 >expected.txt
+for file in CMakeLists.txt host.cpp expected.txt; do
+    [[ -s $file ]] || { echo "the README shows no $file" >&2; exit 1; }
+done
+
+# The commands name the tools plainly: those of this build answer.
+ln -s "$CMAKE" bin/cmake
+ln -s "$CXX" bin/g++
+export PATH=$work/bin:$PATH CMAKE_PREFIX_PATH=$prefix LD_LIBRARY_PATH
+LD_LIBRARY_PATH=$(dirname "$(find "$prefix" -name libzrparsersql.so.0 -print -quit)")
+PKG_CONFIG_PATH=$(dirname "$(find "$prefix" -name zrparsersql.pc -print -quit)")
+export PKG_CONFIG_PATH
+
+for number in 1 2; do
+    block sh $number >commands.sh
+    [[ -s commands.sh ]] || { echo "the README shows no block of commands $number" >&2; exit 1; }
+    bash -e commands.sh >output.txt
+    tail -n "$(wc -l <expected.txt)" output.txt | diff -u expected.txt -
+done
