@@ -24,14 +24,12 @@ int main() {
         std::printf("source %s: %s\n", source.key.toUtf8().c_str(),
                     table ? "a table of the model" : "unknown");
     }
-    // Column references name the table as the text does where it isn't an alias, and the table behind it
-    // where it is one.
+    // A reference names its table only where the text does so without an alias; a look-up needs no table.
     for (const auto& entry : query.m_fields) {
         const CFieldObject* field = entry.value;
         if (!field) continue;
         const CZRSourceFildInfo* column = query.FindField(field->m_table, field->m_field);
-        std::printf("column %s of %s: %s\n", field->m_field.toUtf8().c_str(), field->m_table.toUtf8().c_str(),
-                    column ? "known" : "unknown");
+        std::printf("column %s: %s\n", field->m_field.toUtf8().c_str(), column ? "known" : "unknown");
     }
     for (const auto& function : database.UserFunctions)
         std::printf("user function %s with %s parameter\n", function.key.toUtf8().c_str(),

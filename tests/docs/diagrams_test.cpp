@@ -1,55 +1,15 @@
-// The pictures of the rules, and the words that docs/dialects.md lists.
+// The pictures of the rules.
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <cstdlib>
-#include <filesystem>
-#include <fstream>
 #include <set>
 
+#include "grammars.h"
 #include "program.h"
 
 namespace zr::test {
 namespace {
-
-struct Grammar {
-    std::string name;
-    std::string files;  // vocabulary, lexer, rules, as arguments
-};
-
-std::vector<Grammar> grammarsIn(const std::string& folder) {
-    std::vector<Grammar> found;
-    for (const auto& entry : std::filesystem::directory_iterator(folder)) {
-        if (entry.path().extension() != ".tokens") continue;
-        const std::string name = entry.path().stem();
-        const std::string base = folder + "/" + name;
-        std::vector<std::string> rules;
-        for (const auto& other : std::filesystem::directory_iterator(folder)) {
-            const std::string file = other.path().filename();
-            if (file.starts_with(name + ".") && file.ends_with(".grammar")) rules.push_back(other.path());
-        }
-        std::sort(rules.begin(), rules.end());
-        std::string files = base + ".tokens " + base + ".lexer";
-        for (const std::string& rule : rules) files += " " + rule;
-        found.push_back({name, files});
-    }
-    return found;
-}
-
-std::vector<Grammar> allGrammars() {
-    std::vector<Grammar> all;
-    for (const auto& entry : std::filesystem::directory_iterator(ZR_SOURCE_DIR "/grammar"))
-        if (entry.is_directory())
-            for (Grammar& grammar : grammarsIn(entry.path())) all.push_back(std::move(grammar));
-    return all;
-}
-
-std::string made(const std::string& what, const Grammar& grammar) {
-    const ProgramResult result = runShell("build/release/bin/zrdiagrams " + what + " " + grammar.files);
-    EXPECT_EQ(result.exitStatus, 0) << result.errors;
-    return result.output;
-}
 
 // What stands between `before` and the next `behind`, at every place.
 std::vector<std::string> allBetween(const std::string& text, const std::string& before,
@@ -132,25 +92,6 @@ TEST(Diagrams, ARefusedGrammarMakesNoPicture) {
     EXPECT_EQ(result.exitStatus, 1);
     EXPECT_EQ(result.output, "");
     EXPECT_NE(result.errors.find("error"), std::string::npos);
-}
-
-// docs/dialects.md holds the word list of a grammar behind the line "<!-- words of NAME -->", up to
-// "<!-- end -->". ZR_BLESS=1 writes them anew.
-TEST(DialectsDocument, ListsTheWordsOfTheGrammars) {
-    const std::string file = ZR_SOURCE_DIR "/docs/dialects.md";
-    const std::string document = readFile(file);
-    std::string fresh = document;
-    for (const Grammar& grammar : allGrammars()) {
-        const std::string mark = "<!-- words of " + grammar.name + " -->\n";
-        const std::size_t place = fresh.find(mark);
-        ASSERT_NE(place, std::string::npos) << grammar.name;
-        const std::size_t from = place + mark.size();
-        const std::size_t end = fresh.find("<!-- end -->", from);
-        ASSERT_NE(end, std::string::npos) << grammar.name;
-        fresh.replace(from, end - from, made("words", grammar));
-    }
-    if (std::getenv("ZR_BLESS")) std::ofstream(file, std::ios::binary) << fresh;
-    EXPECT_EQ(readFile(file), fresh);
 }
 
 }  // namespace
