@@ -54,7 +54,7 @@ TEST_P(Document, ShowsWhatItsCommandsWrite) {
 
 INSTANTIATE_TEST_SUITE_P(Files, Document,
                          testing::Values("README.md", "docs/zrsql.md", "docs/projects.md",
-                                         "docs/from-tree-to-descriptor.md"));
+                                         "docs/from-tree-to-descriptor.md", "docs/oddities.md"));
 
 TEST(Readme, ShowsTheExampleThatIsBuilt) {
     const std::string readme = readFile(ZR_SOURCE_DIR "/README.md");
