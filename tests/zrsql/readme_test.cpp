@@ -52,7 +52,7 @@ TEST_P(Document, ShowsWhatItsCommandsWrite) {
     std::filesystem::remove_all(folder);
 }
 
-INSTANTIATE_TEST_SUITE_P(Files, Document, testing::Values("README.md", "docs/zrsql.md", "docs/projects.md"));
+INSTANTIATE_TEST_SUITE_P(Files, Document, testing::Values("README.md", "docs/zrsql.md", "docs/projects.md", "docs/lineage.md"));
 
 TEST(Readme, ShowsTheExampleThatIsBuilt) {
     const std::string readme = readFile(ZR_SOURCE_DIR "/README.md");

@@ -134,12 +134,6 @@ void show(const ProjectOptions& options, std::string& out) {
     failUnknown(options, "table or query", options.name);
 }
 
-const Dialect& dialectOf(const host::Database& database, const std::string& file) {
-    const Dialect* dialect = findDialect(database.GetDBType());
-    if (!dialect) throw ProjectFailure(file + ": no dialect belongs to its kind of database");
-    return *dialect;
-}
-
 void analyze(const ProjectOptions& options, std::string& out) {
     const DatabasePointer database = host::loadProject(options.file);
     const Dialect& dialect = dialectOf(*database, options.file);
@@ -155,7 +149,7 @@ void analyze(const ProjectOptions& options, std::string& out) {
     }
     if (options.names.empty()) shown.assign(database->Queries.begin(), database->Queries.end());
 
-    ColumnTracer tracer(*database);
+    host::ColumnTracer tracer(*database);
     if (options.asJson) out += "{\"queries\":[";
     bool isFirst = true;
     for (const CZRQueryInfo* query : shown) {
@@ -170,6 +164,12 @@ void analyze(const ProjectOptions& options, std::string& out) {
 }
 
 }  // namespace
+
+const Dialect& dialectOf(const host::Database& database, const std::string& file) {
+    const Dialect* dialect = findDialect(database.GetDBType());
+    if (!dialect) throw ProjectFailure(file + ": no dialect belongs to its kind of database");
+    return *dialect;
+}
 
 void runProject(const ProjectOptions& options, std::string& out) {
     switch (options.command) {
