@@ -1,9 +1,11 @@
 #include "project_commands.h"
 
+#include <cstdio>
 #include <filesystem>
 
 #include "host/analysis_order.h"
 #include "host/catalog.h"
+#include "host/catalog_reader.h"
 #include "host/kinds.h"
 #include "input.h"
 #include "project_report.h"
@@ -75,6 +77,21 @@ void makeProject(const ProjectOptions& options) {
     database.SchemaName = CString(options.schema.c_str());
     if (!options.catalog.empty()) takeCatalog(database, options.catalog);
     host::saveProject(database, options.file, options.form);
+}
+
+void importCatalogue(const ProjectOptions& options, std::string& out) {
+    requireFree(options.file, options.force);
+    host::CatalogRows rows;
+    for (const std::string& file : options.catalogues) host::readerFor(file)->read(rows);
+    const DatabasePointer database =
+        host::makeDatabase(rows, options.dialect->kind, CString::fromUtf8(options.schema));
+    for (const std::string& note : rows.notes) std::fprintf(stderr, "zrsql: %s\n", note.c_str());
+    if (database->Tables.IsEmpty() && database->Queries.IsEmpty())
+        throw ProjectFailure(options.catalogues.front() + ": there is no table or view in it");
+    host::saveProject(*database, options.file, options.form);
+    out += std::to_string(database->Tables.GetCount()) + " tables and " +
+           std::to_string(database->Queries.GetCount()) + " queries; " + std::to_string(rows.notes.size()) +
+           " left out\n";
 }
 
 void addTable(const ProjectOptions& options) {
@@ -175,6 +192,8 @@ void runProject(const ProjectOptions& options, std::string& out) {
     switch (options.command) {
         case ProjectCommand::New:
             return makeProject(options);
+        case ProjectCommand::Import:
+            return importCatalogue(options, out);
         case ProjectCommand::AddTable:
             return addTable(options);
         case ProjectCommand::AddQuery:
