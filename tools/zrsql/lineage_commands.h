@@ -6,8 +6,8 @@
 
 namespace zr::tool {
 
-// Does what "zrsql lineage" or "zrsql impact" says and appends what it has to tell. Raises ProjectFailure
-// (project_commands.h) or an error of the host's project (host/project.h).
+// Does what "zrsql lineage", "zrsql impact" or "zrsql report" says and appends what it has to tell. Raises
+// ProjectFailure (project_commands.h) or an error of the host's project (host/project.h).
 void runLineage(const LineageOptions& options, std::string& out);
 
 }  // namespace zr::tool

@@ -37,6 +37,12 @@ void LineageWords::addTo(CLI::App& app) {
         "Example:\n  zrsql impact shop.json orders.total\n\n"
         "Told are result columns that are made of it, columns that are read in other clauses, queries that\n"
         "read from a query told, keys, and queries that may depend on it because not all of them is known.");
+
+    CLI::App* report =
+        add(app, "report", "Write a page about a project for a browser: one HTML file, no network", {});
+    report->add_option("-o,--output", options_.output, "The file to write; - is standard output")
+        ->type_name("FILE");
+    report->footer("Example:\n  zrsql report shop.json -o report.html\n\nA file that is there is replaced.");
 }
 
 std::optional<LineageOptions> LineageWords::read() const {

@@ -10,7 +10,7 @@ class App;
 
 namespace zr::tool {
 
-enum class LineageCommand { Lineage, Impact };
+enum class LineageCommand { Lineage, Impact, Report };
 enum class LineageFormat { Pretty, Json, Dot, Csv };
 
 struct LineageOptions {
@@ -19,10 +19,11 @@ struct LineageOptions {
     LineageFormat format = LineageFormat::Pretty;
     std::vector<std::string> queries;  // lineage: empty for all
     std::string target;                // impact
+    std::string output = "-";          // report: - is standard output
 };
 
-// The words of the command line behind "lineage" and "impact". They are stored where the object is, which is
-// to stay there until the line was parsed.
+// The words of the command line behind "lineage", "impact" and "report". They are stored where the object is,
+// which is to stay there until the line was parsed.
 class LineageWords {
  public:
     void addTo(CLI::App& app);
