@@ -83,7 +83,10 @@ addEventListener('hashchange', openTarget);
 const objects = [...document.querySelectorAll('details.object')];
 const texts = new Map();
 const textOf = object => {
-  if (!texts.has(object)) texts.set(object, object.textContent.toLowerCase());
+  if (!texts.has(object)) {
+    const parts = [...object.children].filter(part => !part.classList.contains('tree'));
+    texts.set(object, parts.map(part => part.textContent).join(' ').toLowerCase());
+  }
   return texts.get(object);
 };
 const search = byId('search');
@@ -176,10 +179,13 @@ graph.addEventListener('wheel', event => {
   zoom(event.deltaY > 0 ? 1.2 : 0.83, (event.clientX - box.left) / box.width, (event.clientY - box.top) / box.height);
 }, {passive: false});
 let drag = null;
-graph.addEventListener('pointerdown', event => { drag = [event.clientX, event.clientY]; });
+let way = 0;  // that was dragged; a click behind a drag goes nowhere
+graph.addEventListener('pointerdown', event => { drag = [event.clientX, event.clientY]; way = 0; });
+graph.addEventListener('click', event => { if (way > 6) event.preventDefault(); });
 addEventListener('pointermove', event => {
   if (!drag) return;
   const box = graph.getBoundingClientRect();
+  way += Math.abs(event.clientX - drag[0]) + Math.abs(event.clientY - drag[1]);
   move((drag[0] - event.clientX) / box.width, (drag[1] - event.clientY) / box.height);
   drag = [event.clientX, event.clientY];
 });

@@ -71,7 +71,7 @@ class Page {
     }
 
     void appendCount(std::size_t count, const char* what) {
-        out_ += "<li><b>" + std::to_string(count) + "</b>" + what + "</li>\n";
+        out_ += "<li><b>" + std::to_string(count) + "</b> " + what + "</li>\n";
     }
 
     void appendOverview() {
