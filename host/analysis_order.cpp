@@ -45,21 +45,18 @@ class ReadingOrder {
 
     const Queries& readBy(CZRQueryInfo* query) const { return readBy_.at(query); }
 
-    // A ring of queries, each reading from the next and the last from the first; empty when there is none.
-    Queries findRing(const Database& database) {
-        for (CZRQueryInfo* query : database.Queries) {
-            Queries ring = findRingFrom(query);
-            if (!ring.empty()) return ring;
-        }
-        return {};
+    std::vector<Ring> findRings(const Database& database) {
+        std::vector<Ring> rings;
+        for (CZRQueryInfo* query : database.Queries) findRingsFrom(query, rings);
+        return rings;
     }
 
  private:
     enum class Mark { New, OnPath, Done };
 
     // Depth first, with the path on a stack of its own.
-    Queries findRingFrom(CZRQueryInfo* start) {
-        if (marks_[start] != Mark::New) return {};
+    void findRingsFrom(CZRQueryInfo* start, std::vector<Ring>& rings) {
+        if (marks_[start] != Mark::New) return;
         Queries path{start};
         std::vector<std::size_t> next{0};
         marks_[start] = Mark::OnPath;
@@ -73,32 +70,25 @@ class ReadingOrder {
             }
             CZRQueryInfo* read = readFrom[next.back()++];
             if (marks_[read] == Mark::OnPath)
-                return Queries(std::find(path.begin(), path.end(), read), path.end());
-            if (marks_[read] == Mark::Done) continue;
+                rings.emplace_back(std::find(path.begin(), path.end(), read), path.end());
+            if (marks_[read] != Mark::New) continue;
             marks_[read] = Mark::OnPath;
             path.push_back(read);
             next.push_back(0);
         }
-        return {};
     }
 
     std::unordered_map<CZRQueryInfo*, Queries> readBy_;
     std::unordered_map<CZRQueryInfo*, Mark> marks_;
 };
 
-std::string ringText(const Queries& ring) {
+std::string ringText(const Ring& ring) {
     std::string text;
     for (const CZRQueryInfo* query : ring) text += query->GetSrcName().toUtf8() + " reads from ";
     return text + ring.front()->GetSrcName().toUtf8();
 }
 
-}  // namespace
-
-void analyseQueries(Database& database) {
-    ReadingOrder order(database);
-    if (const Queries ring = order.findRing(database); !ring.empty())
-        throw CyclicQueries("queries read from each other in a ring: " + ringText(ring));
-
+void analyseInOrder(Database& database, const ReadingOrder& order) {
     // The database sorts by what the descriptors tell of their sources.
     for (CZRQueryInfo* query : database.Queries) {
         query->m_sourceTables.RemoveAll();
@@ -109,6 +99,22 @@ void analyseQueries(Database& database) {
     for (CZRQueryInfo* query : database.Queries) query->m_sourceTables.RemoveAll();
 
     for (CZRQueryInfo* query : database.Queries) BuildQueryInfo(query, database.GetDBType());
+}
+
+}  // namespace
+
+void analyseQueries(Database& database) {
+    ReadingOrder order(database);
+    if (const std::vector<Ring> rings = order.findRings(database); !rings.empty())
+        throw CyclicQueries("queries read from each other in a ring: " + ringText(rings.front()));
+    analyseInOrder(database, order);
+}
+
+std::vector<Ring> analyseQueriesInRings(Database& database) {
+    ReadingOrder order(database);
+    std::vector<Ring> rings = order.findRings(database);
+    analyseInOrder(database, order);
+    return rings;
 }
 
 }  // namespace zr::host

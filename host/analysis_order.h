@@ -1,6 +1,7 @@
 #pragma once
 
 #include <stdexcept>
+#include <vector>
 
 #include "host/database.h"
 
@@ -15,5 +16,12 @@ class CyclicQueries : public std::runtime_error {
 // Analyses the queries of a database, each behind those that it reads from, and leaves them in that order.
 // Raises CyclicQueries, with no query analysed, when there is no such order.
 void analyseQueries(Database& database);
+
+// Queries of which each reads from the next, and the last from the first.
+using Ring = std::vector<const CZRQueryInfo*>;
+
+// The same for a database that may have such rings: queries in one stand in some order. Gives the rings, at
+// least one for each set of queries that all read from each other; empty when there is none.
+std::vector<Ring> analyseQueriesInRings(Database& database);
 
 }  // namespace zr::host

@@ -53,7 +53,7 @@ TEST_P(Document, ShowsWhatItsCommandsWrite) {
 }
 
 INSTANTIATE_TEST_SUITE_P(Files, Document,
-                         testing::Values("README.md", "docs/zrsql.md", "docs/projects.md",
+                         testing::Values("README.md", "docs/zrsql.md", "docs/projects.md", "docs/lineage.md",
                                          "docs/from-tree-to-descriptor.md", "docs/oddities.md"));
 
 TEST(Readme, ShowsTheExampleThatIsBuilt) {

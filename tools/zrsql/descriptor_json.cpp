@@ -3,7 +3,7 @@
 #include <iterator>
 #include <vector>
 
-#include "descriptor_access.h"
+#include "host/descriptor_access.h"
 #include "json_text.h"
 
 namespace zr::tool {
@@ -76,7 +76,7 @@ class DescriptorWriter {
         Pieces pieces;
         pieces.text += '{';
         JsonMembers members(pieces.text);
-        const ItemClass itemClass = classOf(item);
+        const host::ItemClass itemClass = host::classOf(item);
         members.ascii("class", itemClass.name);
         members.number("m_kind", item.m_kind);
         members.text("m_name", item.m_name);
@@ -151,7 +151,7 @@ class DescriptorWriter {
     static void writeMap(std::string& out, const Map& map, WriteValue writeValue) {
         out += '{';
         JsonMembers members(out);
-        for (const auto* entry : sortedEntries(map)) {
+        for (const auto* entry : host::sortedEntries(map)) {
             members.name(entry->key.View());
             writeValue(entry->value);
         }
@@ -200,7 +200,7 @@ void appendQuery(std::string& out, const CZRQueryInfo& query) {
 void appendTextMap(std::string& out, const CMapStringToString& map) {
     out += '{';
     JsonMembers members(out);
-    for (const auto* entry : sortedEntries(map)) members.text(entry->key.View(), entry->value);
+    for (const auto* entry : host::sortedEntries(map)) members.text(entry->key.View(), entry->value);
     out += '}';
 }
 

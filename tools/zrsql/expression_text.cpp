@@ -6,7 +6,7 @@
 #include <utility>
 #include <vector>
 
-#include "descriptor_access.h"
+#include "host/descriptor_access.h"
 
 namespace zr::tool {
 
@@ -50,7 +50,7 @@ Form operatorForm(const SelectItem& item, std::size_t operands) {
     // A join without operands stands for one in parentheses, which the descriptor does not keep.
     if (isNamed(item, {u"DEF_JOIN"})) return {operands ? Text() : u"(...)", u" ", u" ", {}};
     if (operands == 0) return {name, {}, {}, {}};
-    if (isAlias(item)) return {{}, u" AS ", u" AS ", {}};
+    if (host::isAlias(item)) return {{}, u" AS ", u" AS ", {}};
     if (name == u",") return {{}, u", ", u", ", {}};
     // The blank is the name of an operator that groups a side of a join.
     if (name == u" ") return {{}, u" ", u" ", {}};
@@ -58,7 +58,7 @@ Form operatorForm(const SelectItem& item, std::size_t operands) {
     if (isNamed(item, {u"BETWEEN"})) return {{}, spaced, u" AND ", {}};
     if (operands == 1) return {name + u" ", {}, {}, {}};
     // A list of values, unless a nested query stands there, which comes with parentheses of its own.
-    if (operands > 2 || (isNamed(item, {u"IN", u"NOT IN"}) && !classOf(*item.m_items.GetTail()).query))
+    if (operands > 2 || (isNamed(item, {u"IN", u"NOT IN"}) && !host::classOf(*item.m_items.GetTail()).query))
         return {{}, spaced + u"(", u", ", u")"};
     return {{}, spaced, {}, {}};
 }
@@ -97,7 +97,7 @@ std::vector<Piece> piecesOf(const SelectItem& item, const NameQuery& nameQuery) 
         directions.insert(0, u" " + Text(operands.back()->m_text.View()));
         operands.pop_back();
     }
-    const ItemClass itemClass = classOf(item);
+    const host::ItemClass itemClass = host::classOf(item);
     if (itemClass.field) return {{fieldText(*itemClass.field) + directions}};
     if (itemClass.query) return {{nameQuery(*itemClass.query) + directions}};
 
@@ -112,10 +112,6 @@ std::vector<Piece> piecesOf(const SelectItem& item, const NameQuery& nameQuery) 
 }
 
 }  // namespace
-
-bool isAlias(const SelectItem& item) {
-    return item.m_isOperator && item.m_items.GetCount() >= 2 && isNamed(item, {u"ALIAS", u"AS"});
-}
 
 Text fieldText(const SelectItemField& field) {
     Text text;

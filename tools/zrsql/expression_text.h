@@ -16,7 +16,4 @@ std::u16string expressionText(const SelectItem& item, const NameQuery& nameQuery
 // The qualified name of a column, or of a table where no column is told.
 std::u16string fieldText(const SelectItemField& field);
 
-// True for the operator that gives its first operand the name of its last one.
-bool isAlias(const SelectItem& item);
-
 }  // namespace zr::tool

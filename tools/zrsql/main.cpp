@@ -12,6 +12,7 @@
 #include "input.h"
 #include "json_line.h"
 #include "json_text.h"
+#include "lineage_commands.h"
 #include "options.h"
 #include "project_commands.h"
 #include "token_format.h"
@@ -122,9 +123,12 @@ void runLines(const Options& options, const CZRDatabaseInfo& prototype) {
 }
 
 void run(const Options& options) {
-    if (options.project) {
+    if (options.project || options.lineage) {
         std::string told;
-        runProject(*options.project, told);
+        if (options.project)
+            runProject(*options.project, told);
+        else
+            runLineage(*options.lineage, told);
         std::fwrite(told.data(), 1, told.size(), stdout);
         return;
     }

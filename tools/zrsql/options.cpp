@@ -86,12 +86,15 @@ std::optional<Options> readOptions(int argc, char** argv, int& exitStatus) {
 
     ProjectWords projectWords;
     projectWords.addTo(app);
+    LineageWords lineageWords;
+    lineageWords.addTo(app);
 
     Options options;
     try {
         app.parse(argc, argv);
         options.project = projectWords.read();
-        if (options.project) return options;
+        options.lineage = lineageWords.read();
+        if (options.project || options.lineage) return options;
     } catch (const CLI::Success& asked) {  // help or version
         exitStatus = app.exit(asked);
         return std::nullopt;

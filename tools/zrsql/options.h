@@ -5,6 +5,7 @@
 #include <string_view>
 
 #include "dialects.h"
+#include "lineage_options.h"
 #include "project_options.h"
 #include "tree_format.h"
 
@@ -23,6 +24,7 @@ struct Options {
     std::string catalog;     // empty: none
     unsigned jobs = 1;
     std::optional<ProjectOptions> project;  // given: nothing of the above counts
+    std::optional<LineageOptions> lineage;  // as well
 };
 
 // Reads the command line. Where there is nothing to run (help was asked for, or the use is wrong), writes to

@@ -7,9 +7,9 @@
 #include <set>
 #include <vector>
 
-#include "descriptor_access.h"
 #include "expression_text.h"
-#include "from_sources.h"
+#include "host/descriptor_access.h"
+#include "host/from_sources.h"
 #include "text_table.h"
 #include "zrparsersql/database_info.h"
 #include "zrparsersql/nested_queries.h"
@@ -55,7 +55,7 @@ class Numbering {
 class FromNames {
  public:
     FromNames(const CZRQueryInfo& query, Numbering& numbering) {
-        for (const FromSource& source : fromSources(query)) add(source, numbering);
+        for (const host::FromSource& source : host::fromSources(query)) add(source, numbering);
     }
 
     // Names of the sources, each once, in order.
@@ -78,7 +78,7 @@ class FromNames {
     }
 
  private:
-    void add(const FromSource& source, Numbering& numbering) {
+    void add(const host::FromSource& source, Numbering& numbering) {
         const Text name =
             source.query ? numbering.nameOf(*source.query) : Text(source.table->m_sourceTable.View());
         if (!source.alias.IsEmpty()) {
@@ -133,8 +133,8 @@ class QueryPicture {
     }
 
     static Text columnName(const SelectItem& item) {
-        if (isAlias(item)) return Text(item.m_items.GetTail()->m_text.View());
-        if (const SelectItemField* field = classOf(item).field) {
+        if (host::isAlias(item)) return Text(item.m_items.GetTail()->m_text.View());
+        if (const SelectItemField* field = host::classOf(item).field) {
             if (isAllColumns(*field)) return u"*";
             return Text(field->m_sourceField.IsEmpty() ? field->m_text.View() : field->m_sourceField.View());
         }
@@ -142,8 +142,8 @@ class QueryPicture {
     }
 
     Text columnExpression(const SelectItem& item) {
-        if (isAlias(item)) return expression(*item.m_items.GetHead());
-        const SelectItemField* const field = classOf(item).field;
+        if (host::isAlias(item)) return expression(*item.m_items.GetHead());
+        const SelectItemField* const field = host::classOf(item).field;
         return field && isAllColumns(*field) ? fieldText(*field) + u".*" : expression(item);
     }
 
@@ -151,8 +151,8 @@ class QueryPicture {
     Text originOf(const SelectItem& root) {
         Text origin;
         std::set<Text> seen;
-        forEachItem(root, [&](const SelectItem& item) {
-            const ItemClass itemClass = classOf(item);
+        host::forEachItem(root, [&](const SelectItem& item) {
+            const host::ItemClass itemClass = host::classOf(item);
             Text one;
             // A reference to an alias has what it stands for below it.
             if (itemClass.field && item.m_kind != SIK_FIELD_LIKE)
@@ -198,7 +198,7 @@ class QueryPicture {
         const bool hasCatalog = query_.m_database && !(query_.m_database->Tables.IsEmpty() &&
                                                        query_.m_database->Queries.IsEmpty());
         TextTable table;
-        for (const auto* entry : sortedEntries(query_.m_sourceTables)) {
+        for (const auto* entry : host::sortedEntries(query_.m_sourceTables)) {
             const bool isOwn = names_.hasSource(entry->key);
             // A nested query's descriptor lists what the outer ones read as well.
             if (!isOwn && isNested_) continue;
@@ -221,7 +221,7 @@ class QueryPicture {
         // Nothing is changed: the function takes what it hands out.
         for (const CZRQueryInfo* nested : withNestedQueries(const_cast<CZRQueryInfo&>(query_))) {
             if (nested == &query_) continue;
-            for (const FromSource& from : fromSources(*nested))
+            for (const host::FromSource& from : host::fromSources(*nested))
                 if (from.table && from.table->m_sourceTable.EqualsNoCase(source)) return true;
         }
         return false;

@@ -1,9 +1,11 @@
 #include "project_commands.h"
 
+#include <cstdio>
 #include <filesystem>
 
 #include "host/analysis_order.h"
 #include "host/catalog.h"
+#include "host/catalog_reader.h"
 #include "host/kinds.h"
 #include "input.h"
 #include "project_report.h"
@@ -77,6 +79,21 @@ void makeProject(const ProjectOptions& options) {
     host::saveProject(database, options.file, options.form);
 }
 
+void importCatalogue(const ProjectOptions& options, std::string& out) {
+    requireFree(options.file, options.force);
+    host::CatalogRows rows;
+    for (const std::string& file : options.catalogues) host::readerFor(file)->read(rows);
+    const DatabasePointer database =
+        host::makeDatabase(rows, options.dialect->kind, CString::fromUtf8(options.schema));
+    for (const std::string& note : rows.notes) std::fprintf(stderr, "zrsql: %s\n", note.c_str());
+    if (database->Tables.IsEmpty() && database->Queries.IsEmpty())
+        throw ProjectFailure(options.catalogues.front() + ": there is no table or view in it");
+    host::saveProject(*database, options.file, options.form);
+    out += std::to_string(database->Tables.GetCount()) + " tables and " +
+           std::to_string(database->Queries.GetCount()) + " queries; " + std::to_string(rows.notes.size()) +
+           " left out\n";
+}
+
 void addTable(const ProjectOptions& options) {
     const DatabasePointer database = host::loadProject(options.file);
     const CString name = nameOf(options.name);
@@ -134,12 +151,6 @@ void show(const ProjectOptions& options, std::string& out) {
     failUnknown(options, "table or query", options.name);
 }
 
-const Dialect& dialectOf(const host::Database& database, const std::string& file) {
-    const Dialect* dialect = findDialect(database.GetDBType());
-    if (!dialect) throw ProjectFailure(file + ": no dialect belongs to its kind of database");
-    return *dialect;
-}
-
 void analyze(const ProjectOptions& options, std::string& out) {
     const DatabasePointer database = host::loadProject(options.file);
     const Dialect& dialect = dialectOf(*database, options.file);
@@ -155,7 +166,7 @@ void analyze(const ProjectOptions& options, std::string& out) {
     }
     if (options.names.empty()) shown.assign(database->Queries.begin(), database->Queries.end());
 
-    ColumnTracer tracer(*database);
+    host::ColumnTracer tracer(*database);
     if (options.asJson) out += "{\"queries\":[";
     bool isFirst = true;
     for (const CZRQueryInfo* query : shown) {
@@ -171,10 +182,18 @@ void analyze(const ProjectOptions& options, std::string& out) {
 
 }  // namespace
 
+const Dialect& dialectOf(const host::Database& database, const std::string& file) {
+    const Dialect* dialect = findDialect(database.GetDBType());
+    if (!dialect) throw ProjectFailure(file + ": no dialect belongs to its kind of database");
+    return *dialect;
+}
+
 void runProject(const ProjectOptions& options, std::string& out) {
     switch (options.command) {
         case ProjectCommand::New:
             return makeProject(options);
+        case ProjectCommand::Import:
+            return importCatalogue(options, out);
         case ProjectCommand::AddTable:
             return addTable(options);
         case ProjectCommand::AddQuery:

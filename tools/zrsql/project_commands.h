@@ -16,4 +16,7 @@ class ProjectFailure : public std::runtime_error {
 // ProjectFailure, WrongUse, InputError (input.h) or an error of the host's project (host/project.h).
 void runProject(const ProjectOptions& options, std::string& out);
 
+// The dialect of a project that was read from a file. Raises ProjectFailure when there is none.
+const Dialect& dialectOf(const host::Database& database, const std::string& file);
+
 }  // namespace zr::tool

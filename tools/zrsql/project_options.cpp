@@ -50,6 +50,28 @@ void ProjectWords::addTo(CLI::App& app) {
         "Example:\n  zrsql project new shop.json -d mssql --schema dbo\n\n"
         "Ends with status 1, and makes nothing, when the file is there or can't be written.");
 
+    CLI::App* imported = project_->add_subcommand(
+        "import", "Make a project of what a database tells of itself: tables, keys and views");
+    imported
+        ->add_option("CATALOGUE", catalogue_,
+                     "An SQLite database, or a CSV or JSON dump of INFORMATION_SCHEMA or Oracle's ALL_ views")
+        ->required();
+    imported->add_option("PROJECT", options_.file, "The project to make, a JSON or SQLite file")->required();
+    commands_.emplace_back(imported, ProjectCommand::Import);
+    imported->add_option("-d,--dialect", dialect_, "Dialect of its queries: " + dialectNames(true))
+        ->required()
+        ->type_name("DIALECT");
+    imported
+        ->add_option("--also", options_.catalogues,
+                     "Another dump of the same database, such as its views or keys; may stand many times")
+        ->type_name("FILE")
+        ->allow_extra_args(false);
+    imported->add_option("--schema", options_.schema, "Take this schema or owner only")->type_name("NAME");
+    addForm(*imported);
+    imported->footer(
+        "Example:\n  zrsql project import columns.csv shop.json -d mssql --also views.csv --schema dbo\n\n"
+        "What can't be taken in is told on standard error, a line each, and the rest goes on.");
+
     CLI::App* table = add("add-table", "Add a table", ProjectCommand::AddTable);
     table->add_option("NAME", options_.name, "Name of the table")->required();
     table->add_option("COLUMN", options_.columns,
@@ -118,7 +140,9 @@ std::optional<ProjectOptions> ProjectWords::read() const {
         used = app;
         options.command = command;
     }
-    if (options.command == ProjectCommand::New) {
+    if (options.command == ProjectCommand::Import)
+        options.catalogues.insert(options.catalogues.begin(), catalogue_);
+    if (options.command == ProjectCommand::New || options.command == ProjectCommand::Import) {
         options.dialect = findDialect(dialect_);
         if (!options.dialect || options.dialect->kind == DB_NONE)
             throw WrongUse("there is no project in the dialect \"" + dialect_ + "\"; there are " +

@@ -19,15 +19,16 @@ class WrongUse : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
-enum class ProjectCommand { New, AddTable, AddQuery, List, Show, Convert, Analyze };
+enum class ProjectCommand { New, AddTable, AddQuery, List, Show, Convert, Analyze, Import };
 
 struct ProjectOptions {
     ProjectCommand command = ProjectCommand::List;
     std::string file;
     std::string target;                   // convert
+    std::vector<std::string> catalogues;  // import: files to read
     host::StorageForm form{};             // new, convert
-    bool force = false;                   // new, convert: replace a file that is there
-    const Dialect* dialect{};             // new
+    bool force = false;                   // new, convert, import: replace a file that is there
+    const Dialect* dialect{};             // new, import
     std::string schema;                   // new
     std::string catalog;                  // new: tables to begin with
     std::string name;                     // add-table, add-query, show
@@ -57,6 +58,7 @@ class ProjectWords {
     std::vector<std::pair<CLI::App*, ProjectCommand>> commands_;
     ProjectOptions options_;
     std::string dialect_;
+    std::string catalogue_;
     std::string form_;
     std::string text_;
     std::string format_;

@@ -1,11 +1,11 @@
 #include "project_report.h"
 
 #include "analyst.h"
-#include "descriptor_access.h"
 #include "dialects.h"
-#include "expression_text.h"
+#include "host/descriptor_access.h"
 #include "host/filters.h"
 #include "json_text.h"
+#include "lineage_format.h"
 #include "picture.h"
 #include "text_table.h"
 
@@ -75,17 +75,8 @@ void addForeignKey(TextTable& lines, const CZRForeignKeyInfo& key) {
                known->GetReferencedTableID().IsEmpty() ? u"not in the project" : u""});
 }
 
-Text originText(const ColumnOrigin& origin) {
-    return (origin.source.IsEmpty() ? Text(u"?") : textOf(origin.source)) + u"." + textOf(origin.column);
-}
-
-Text expressionOf(const ResultColumn& column) {
-    if (!column.expression) return u"*";
-    return expressionText(*column.expression, [](const CZRQueryInfo&) { return Text(u"(query)"); });
-}
-
 // What a source of the query is in the project.
-std::string_view wordFor(const ColumnTracer::Meaning& meaning) {
+std::string_view wordFor(const host::ColumnTracer::Meaning& meaning) {
     if (meaning.table) return "table";
     return meaning.query ? "query" : "unknown";
 }
@@ -94,9 +85,9 @@ bool endsInFirstClause(const CZRQueryInfo& query) {
     return query.m_selectItems.IsEmpty() && !query.m_subQueries.IsEmpty();
 }
 
-void appendOrigins(std::string& out, const std::vector<ColumnOrigin>& origins) {
+void appendOrigins(std::string& out, const std::vector<host::ColumnOrigin>& origins) {
     out += '[';
-    for (const ColumnOrigin& origin : origins) {
+    for (const host::ColumnOrigin& origin : origins) {
         if (out.back() == '}') out += ',';
         out += '{';
         JsonMembers members(out);
@@ -107,16 +98,16 @@ void appendOrigins(std::string& out, const std::vector<ColumnOrigin>& origins) {
             appendJsonString(out, origin.source.View());
         members.text("column", origin.column.View());
         members.name("known");
-        out += origin.isKnown ? "true" : "false";
+        out += origin.isKnown() ? "true" : "false";
         out += '}';
     }
     out += ']';
 }
 
-void appendColumns(std::string& out, const ColumnTracer::Columns& columns) {
+void appendColumns(std::string& out, const host::ColumnTracer::Columns& columns) {
     out += '[';
     bool isFirst = true;
-    for (const ResultColumn& column : columns) {
+    for (const host::ResultColumn& column : columns) {
         out += isFirst ? "{" : ",{";
         isFirst = false;
         JsonMembers members(out);
@@ -207,14 +198,14 @@ void appendQueryText(std::string& out, const CZRQueryInfo& query) {
     appendUtf8(out, text);
 }
 
-void appendAnalysis(std::string& out, const CZRQueryInfo& query, ColumnTracer& tracer,
+void appendAnalysis(std::string& out, const CZRQueryInfo& query, host::ColumnTracer& tracer,
                     const Dialect& dialect) {
     Text text = u"Query " + textOf(query.GetSrcName()) + u'\n';
     TextTable columns;
     std::size_t place = 0;
-    for (const ResultColumn& column : tracer.columnsOf(query)) {
+    for (const host::ResultColumn& column : tracer.columnsOf(query)) {
         Text origins;
-        for (const ColumnOrigin& origin : column.origins) join(origins, originText(origin));
+        for (const host::ColumnOrigin& origin : column.origins) join(origins, originName(origin));
         columns.add({number(++place), textOf(column.name), expressionOf(column),
                      origins.empty() ? origins : u"from " + origins});
     }
@@ -224,7 +215,7 @@ void appendAnalysis(std::string& out, const CZRQueryInfo& query, ColumnTracer& t
                          : u"none"});
     appendBlock(text, u"Columns", columns);
     TextTable sources;
-    for (const auto* source : sortedEntries(query.m_sourceTables)) {
+    for (const auto* source : host::sortedEntries(query.m_sourceTables)) {
         const std::string_view meaning = wordFor(tracer.meaningOf(query, source->key));
         sources.add({textOf(source->key), meaning == "unknown" ? u"not in the project" : textOf(meaning)});
     }
@@ -233,7 +224,7 @@ void appendAnalysis(std::string& out, const CZRQueryInfo& query, ColumnTracer& t
     appendUtf8(out, text);
 }
 
-void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, ColumnTracer& tracer,
+void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, host::ColumnTracer& tracer,
                         const Dialect& dialect) {
     out += '{';
     JsonMembers members(out);
@@ -242,7 +233,7 @@ void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, ColumnTrace
     appendColumns(out, tracer.columnsOf(query));
     members.name("sources");
     out += '[';
-    for (const auto* source : sortedEntries(query.m_sourceTables)) {
+    for (const auto* source : host::sortedEntries(query.m_sourceTables)) {
         if (out.back() == '}') out += ',';
         out += '{';
         JsonMembers entry(out);

@@ -2,9 +2,9 @@
 
 #include <string>
 
-#include "column_tracer.h"
-#include "host/project.h"
 #include "dialects.h"
+#include "host/column_tracer.h"
+#include "host/project.h"
 
 namespace zr::tool {
 
@@ -20,10 +20,10 @@ void appendQueryText(std::string& out, const CZRQueryInfo& query);
 
 // An analysed query: its result columns with where each comes from, its sources, and how far its text was
 // read.
-void appendAnalysis(std::string& out, const CZRQueryInfo& query, ColumnTracer& tracer,
+void appendAnalysis(std::string& out, const CZRQueryInfo& query, host::ColumnTracer& tracer,
                     const Dialect& dialect);
 // The same as a JSON object.
-void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, ColumnTracer& tracer,
+void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, host::ColumnTracer& tracer,
                         const Dialect& dialect);
 
 }  // namespace zr::tool

@@ -1,12 +1,11 @@
-#include "from_sources.h"
+#include "host/from_sources.h"
 
 #include <algorithm>
 #include <unordered_map>
 
-#include "descriptor_access.h"
-#include "expression_text.h"
+#include "host/descriptor_access.h"
 
-namespace zr::tool {
+namespace zr::host {
 
 namespace {
 
@@ -52,4 +51,4 @@ std::vector<FromSource> fromSources(const CZRQueryInfo& query) {
     return sources;
 }
 
-}  // namespace zr::tool
+}  // namespace zr::host

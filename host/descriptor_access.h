@@ -6,7 +6,7 @@
 
 #include "zrparsersql/query_info.h"
 
-namespace zr::tool {
+namespace zr::host {
 
 // What an item is, and the part of it that only its class has.
 struct ItemClass {
@@ -35,4 +35,23 @@ auto sortedEntries(const Map& map) {
     return entries;
 }
 
-}  // namespace zr::tool
+// True for the operator that gives its first operand the name of its last one.
+inline bool isAlias(const SelectItem& item) {
+    return item.m_isOperator && item.m_items.GetCount() >= 2 &&
+           (item.m_name.EqualsNoCase(u"ALIAS") || item.m_name.EqualsNoCase(u"AS"));
+}
+
+// Calls visit for an item and everything below it, nested queries left out, in order.
+template <class Visit>
+void forEachItem(const SelectItem& root, Visit visit) {
+    std::vector<const SelectItem*> todo = {&root};
+    while (!todo.empty()) {
+        const SelectItem* item = todo.back();
+        todo.pop_back();
+        visit(*item);
+        std::vector<const SelectItem*> below(item->m_items.begin(), item->m_items.end());
+        todo.insert(todo.end(), below.rbegin(), below.rend());
+    }
+}
+
+}  // namespace zr::host

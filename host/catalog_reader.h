@@ -1,0 +1,73 @@
+#pragma once
+
+#include <memory>
+#include <optional>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "host/database.h"
+
+// Reading what a database tells of itself: tables, columns with types, keys and the texts of views.
+namespace zr::host {
+
+// A catalogue that can't be read at all; the message begins with the file's name.
+class CatalogReadError : public std::runtime_error {
+ public:
+    using std::runtime_error::runtime_error;
+};
+
+// What a catalogue holds, a row an object, in the order in which it is told. Names are as the source has
+// them.
+struct CatalogRows {
+    struct Column {
+        CString schema;
+        CString table;
+        CString name;
+        CString type;  // may bring its size along: varchar(50)
+        int length = -1;
+        int scale = 0;
+        int place = 0;  // in the table; 0: in the order of the rows
+    };
+    struct Key {
+        enum class Kind { Primary, Unique, Foreign };
+        CString schema;
+        CString table;
+        CString name;
+        Kind kind = Kind::Primary;
+        CString column;
+        int place = 0;
+        CString referencedTable;
+        CString referencedColumn;
+    };
+    struct View {
+        CString schema;
+        CString name;
+        std::optional<CString> text;  // with or without CREATE VIEW
+    };
+    std::vector<Column> columns;
+    std::vector<Key> keys;
+    std::vector<View> views;
+    std::vector<std::string> notes;  // what was left out, and why: a line each
+};
+
+// One kind of source.
+class CatalogReader {
+ public:
+    virtual ~CatalogReader() = default;
+    // Appends all that the source tells. Raises CatalogReadError.
+    virtual void read(CatalogRows& rows) = 0;
+};
+
+// The reader for a file, by its content: an SQLite database; a dump of INFORMATION_SCHEMA or of Oracle's ALL_
+// views as CSV or JSON. Raises CatalogReadError when it can't be opened.
+std::unique_ptr<CatalogReader> readerFor(const std::string& path);
+
+// Makes the tables and queries of the rows; a name that is a view's is no table. With a schema, rows of
+// others are passed over. What can't be taken in is noted, and the rest goes on.
+std::unique_ptr<Database> makeDatabase(CatalogRows& rows, DBTypes kind, const CString& schema);
+
+// The query of a text that may begin with CREATE VIEW ... AS.
+CString queryOfView(const CString& text);
+
+}  // namespace zr::host
