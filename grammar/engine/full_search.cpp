@@ -16,10 +16,6 @@ bool isSingle(std::uint32_t mask) {
     return (mask & (mask - 1)) == 0;
 }
 
-bool isZeroWidth(Op op) {
-    return op == Op::Root || op == Op::ScopeBegin || op == Op::ScopeEnd;
-}
-
 }  // namespace
 
 FullSearch::FullSearch(const ParserTable& table, TextIndex& text, const Options& options,
@@ -89,10 +85,6 @@ bool FullSearch::entersOnce(std::uint32_t entry, const Item& item) {
     return true;
 }
 
-std::uint16_t FullSearch::skip(std::uint16_t node) const {
-    return isZeroWidth(table_.nodes[node].op) ? table_.nodes[node].run : node;
-}
-
 std::uint16_t FullSearch::target(const NodeRow& choice, std::uint32_t branch) const {
     return table_.targets[table_.choices[choice.arg].firstTarget + branch];
 }
@@ -139,7 +131,7 @@ std::uint32_t FullSearch::branchMask(std::uint32_t entry, const Item& item) cons
 
 FullSearch::Item FullSearch::afterBranch(const Item& item, std::uint32_t branch) const {
     const NodeRow& node = table_.nodes[item.node];
-    Item next{item.place, skip(target(node, branch))};
+    Item next{item.place, searchedFrom(table_, target(node, branch))};
     next.place.stopped =
         text_.stoppedAfter(node, branch, item.place.low, item.place.high, item.place.stopped);
     return next;
@@ -191,7 +183,7 @@ FullSearch::Rest FullSearch::restBehind(const NodeRow& call) {
         if (node.context != kNone16) rest = Rest::Other;
         // A call is only in the way of an end when its rule may be empty.
         for (std::uint32_t i = 0; i < table_.choices[node.arg].count; ++i) {
-            const std::uint16_t next = skip(target(node, i));
+            const std::uint16_t next = searchedFrom(table_, target(node, i));
             const NodeRow& row = table_.nodes[next];
             if (row.op != Op::Call || (table_.rules[row.arg].nullable && !(row.flags & kNonEmpty)))
                 work.push_back(next);
@@ -229,7 +221,8 @@ FullSearch::Outcome FullSearch::findEnds(std::uint32_t root) {
                           static_cast<std::uint32_t>(slices_.size()),
                           static_cast<std::uint32_t>(arrivals_.size()), false});
         const std::uint32_t position = entries_[entry].position;
-        items_.push_back({{position, position, 0}, skip(table_.rules[entries_[entry].rule].entry)});
+        items_.push_back(
+            {{position, position, 0}, searchedFrom(table_, table_.rules[entries_[entry].rule].entry)});
     };
     start(root);
     while (!works_.empty()) {
@@ -428,7 +421,7 @@ void FullSearch::startWalk(std::uint32_t entry, Slice wanted) {
     const std::uint16_t first = table_.rules[e.rule].entry;
     const Place place{e.position, e.position, 0};
     const std::uint32_t state = addState(first, place, kNone, kNone, kNone);
-    walks_.push_back({entry, part, wanted, {place, skip(first)}, state, memos_++});
+    walks_.push_back({entry, part, wanted, {place, searchedFrom(table_, first)}, state, memos_++});
 }
 
 std::uint32_t FullSearch::addState(std::uint16_t node, const Place& place, std::uint32_t before,

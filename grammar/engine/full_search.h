@@ -118,7 +118,6 @@ class FullSearch {
     std::uint32_t entryFor(std::uint16_t rule, std::uint32_t position);
     std::uint32_t entryAt(std::uint16_t rule, std::uint32_t position) const;
     bool entersOnce(std::uint32_t entry, const Item& item);
-    std::uint16_t skip(std::uint16_t node) const;
     std::uint16_t target(const NodeRow& choice, std::uint32_t branch) const;
     bool take(const NodeRow& node, Place& place) const;
     std::uint32_t branchMask(std::uint32_t entry, const Item& item) const;

@@ -22,10 +22,6 @@ std::uint64_t visitHash(std::uint32_t entry, std::uint16_t node, std::uint32_t l
     return h ^ (h >> 29);
 }
 
-bool isZeroWidth(Op op) {
-    return op == Op::Root || op == Op::ScopeBegin || op == Op::ScopeEnd;
-}
-
 }  // namespace
 
 Recogniser::Recogniser(const ParserTable& table, const std::vector<std::uint16_t>& types,
@@ -299,7 +295,7 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                               {kNone, low, high, state, kNone, kNone, mask, at, stopped});
                 state = addState(target, low, high, state, kNone, kNone);
                 stopped = text_.stoppedAfter(node, branch, low, high, stopped);
-                at = isZeroWidth(table_->nodes[target].op) ? table_->nodes[target].run : target;
+                at = searchedFrom(*table_, target);
                 continue;
             }
             case Op::Call: {
@@ -345,8 +341,7 @@ Recogniser::Outcome Recogniser::resume(std::uint32_t entryIndex, std::uint32_t& 
         const std::uint16_t first = table_->rules[entry.rule].entry;
         const std::uint32_t position = entry.position;
         const std::uint32_t state = addState(first, position, position, kNone, kNone, kNone);
-        const NodeRow& node = table_->nodes[first];
-        if (forward(entryIndex, isZeroWidth(node.op) ? node.run : first, position, position, state, 0))
+        if (forward(entryIndex, searchedFrom(*table_, first), position, position, state, 0))
             return Outcome::Yielded;
     }
     for (;;) {
@@ -366,8 +361,7 @@ Recogniser::Outcome Recogniser::resume(std::uint32_t entryIndex, std::uint32_t& 
             const Frame taken = frame;
             if (taken.mask == 0) popFrame(entry);
             const std::uint32_t state = addState(target, taken.low, taken.high, taken.state, kNone, kNone);
-            const NodeRow& next = table_->nodes[target];
-            if (forward(entryIndex, isZeroWidth(next.op) ? next.run : target, taken.low, taken.high, state,
+            if (forward(entryIndex, searchedFrom(*table_, target), taken.low, taken.high, state,
                         text_.stoppedAfter(node, branch, taken.low, taken.high, taken.stopped)))
                 return Outcome::Yielded;
             continue;

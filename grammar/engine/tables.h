@@ -143,6 +143,13 @@ struct ParserTable {
     std::uint32_t contextCount;
 };
 
+/// The first node at or behind one that a search stops at: those that only shape the tree are passed over.
+inline std::uint16_t searchedFrom(const ParserTable& table, std::uint16_t node) {
+    const NodeRow& row = table.nodes[node];
+    const bool shapes = row.op == Op::Root || row.op == Op::ScopeBegin || row.op == Op::ScopeEnd;
+    return shapes ? row.run : node;
+}
+
 struct GrammarTable {
     const char* name;
     const char* lexerFile;

@@ -12,6 +12,8 @@
 #include <string>
 #include <string_view>
 
+#include "tests/grammar/contexts.h"
+
 namespace {
 
 // Numbers that stored projects and tree walkers know, some of each kind of entry; the corpus pins the rest of
@@ -41,30 +43,7 @@ TEST(MsAccessVocabulary, NamesLiteralsAsTheyAreWritten) {
     EXPECT_STREQ(MSAccessSQL_v3_token_name(428), "'yyyy'");
 }
 
-class Contexts {
- public:
-    explicit Contexts(std::u16string_view text)
-        : input(zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size()))),
-          lexer(MSAccessSQL_v3LexerNewSSD(input, nullptr)),
-          tokens(antlr3CommonTokenStreamSourceNew(1025, lexer->pLexer->rec->state->tokSource)),
-          parser(MSAccessSQL_v3ParserNewSSD(tokens, nullptr)) {}
-    Contexts(const Contexts&) = delete;
-    Contexts& operator=(const Contexts&) = delete;
-    ~Contexts() {
-        parser->free(parser);
-        tokens->free(tokens);
-        lexer->free(lexer);
-        input->close(input);
-    }
-
-    ANTLR3_UINT32 lexerErrors() const { return lexer->pLexer->rec->state->errorCount; }
-    ANTLR3_UINT32 parserErrors() const { return parser->pParser->rec->state->errorCount; }
-
-    pANTLR3_INPUT_STREAM input;
-    pMSAccessSQL_v3Lexer lexer;
-    pANTLR3_COMMON_TOKEN_STREAM tokens;
-    pMSAccessSQL_v3Parser parser;
-};
+using Contexts = zr::test::ContextsOf<MSAccessSQL_v3LexerNewSSD, MSAccessSQL_v3ParserNewSSD>;
 
 pANTLR3_BASE_TREE childOf(pANTLR3_BASE_TREE tree, ANTLR3_UINT32 index) {
     return static_cast<pANTLR3_BASE_TREE>(tree->getChild(tree, index));

@@ -12,6 +12,8 @@
 #include <string>
 #include <string_view>
 
+#include "tests/grammar/contexts.h"
+
 namespace {
 
 // Numbers that stored projects and tree walkers know, one of each part of the vocabulary; the corpus pins the
@@ -38,31 +40,7 @@ TEST(MssqlVocabulary, NamesLiteralsAsTheyAreWritten) {
     EXPECT_STREQ(MSSQL_token_name(343), "'@'");
 }
 
-class Contexts {
- public:
-    explicit Contexts(std::u16string_view text)
-        : input(zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size()))),
-          lexer(MSSQLLexerNewSSD(input, nullptr)),
-          tokens(antlr3CommonTokenStreamSourceNew(1025, lexer->pLexer->rec->state->tokSource)),
-          parser(MSSQLParserNewSSD(tokens, nullptr)) {}
-    Contexts(const Contexts&) = delete;
-    Contexts& operator=(const Contexts&) = delete;
-    ~Contexts() {
-        parser->free(parser);
-        tokens->free(tokens);
-        lexer->free(lexer);
-        input->close(input);
-    }
-
-    ANTLR3_MARKER position() const { return tokens->tstream->istream->index(tokens->tstream->istream); }
-    ANTLR3_UINT32 parserErrors() const { return parser->pParser->rec->state->errorCount; }
-    ANTLR3_UINT32 lexerErrors() const { return lexer->pLexer->rec->state->errorCount; }
-
-    pANTLR3_INPUT_STREAM input;
-    pMSSQLLexer lexer;
-    pANTLR3_COMMON_TOKEN_STREAM tokens;
-    pMSSQLParser parser;
-};
+using Contexts = zr::test::ContextsOf<MSSQLLexerNewSSD, MSSQLParserNewSSD>;
 
 TEST(MssqlContexts, ARuleInTheMiddleCanBeRunByItself) {
     Contexts c(u"a + b * 2 , c");

@@ -14,6 +14,8 @@
 #include <string_view>
 #include <vector>
 
+#include "tests/grammar/contexts.h"
+
 namespace {
 
 // Numbers that the hosts' tree walkers know; the corpus pins the rest of those that a token or a tree can
@@ -45,16 +47,17 @@ TEST(MssqlfromVocabulary, NamesLiteralsAsTheyAreWritten) {
     X(node_from_list)                                                                                       \
     X(from_list)                                                                                            \
     X(from_body)                                                                                            \
-    X(node_joined_table) X(joined_table) X(node_join_prefix) X(node_test_prefix) X(join_prefix_items)       \
-        X(join_type) X(join_hint) X(node_join_postfix) X(join_postfix) X(test) X(node_and_condition)        \
-            X(and_condition) X(node_old_big_postfix) X(old_big_postfix) X(old_big_postfix_source)           \
-                X(join_source) X(node_nested_join) X(nestedJoin) X(node_table_specification)                \
-                    X(table_specification) X(node_column_specification) X(column_specification)             \
-                        X(node_column_name) X(column_name) X(node_db_name) X(db_name) X(node_table_name)    \
-                            X(table_name) X(delimited_name) X(node_t_n) X(t_n) X(node_new_name) X(new_name) \
-                                X(node_search_condition) X(search_condition) X(comparison)                  \
-                                    X(comparison_operand) X(expression) X(term) X(concat_term) X(primary)   \
-                                        X(node_number) X(number)
+    X(node_joined_table)                                                                                    \
+    X(joined_table)                                                                                         \
+    X(node_join_prefix) X(node_test_prefix) X(join_prefix_items) X(join_type) X(join_hint)                  \
+        X(node_join_postfix) X(join_postfix) X(test) X(node_and_condition) X(and_condition)                 \
+            X(node_old_big_postfix) X(old_big_postfix) X(old_big_postfix_source) X(join_source)             \
+                X(node_nested_join) X(nestedJoin) X(node_table_specification) X(table_specification)        \
+                    X(node_column_specification) X(column_specification) X(node_column_name) X(column_name) \
+                        X(node_db_name) X(db_name) X(node_table_name) X(table_name) X(delimited_name)       \
+                            X(node_t_n) X(t_n) X(node_new_name) X(new_name) X(node_search_condition)        \
+                                X(search_condition) X(comparison) X(comparison_operand) X(expression)       \
+                                    X(term) X(concat_term) X(primary) X(node_number) X(number)
 
 TEST(MssqlfromContexts, RulesStandInTheirOrder) {
 #define ZR_OFFSET(RULE) offsetof(MSSQLfromParser, RULE),
@@ -66,31 +69,7 @@ TEST(MssqlfromContexts, RulesStandInTheirOrder) {
     EXPECT_EQ(offsetof(MSSQLfromParser, getGrammarFileName), sizeof(pANTLR3_PARSER) + 47 * sizeof(void*));
 }
 
-class Contexts {
- public:
-    explicit Contexts(std::u16string_view text)
-        : input(zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size()))),
-          lexer(MSSQLfromLexerNew(input)),
-          tokens(antlr3CommonTokenStreamSourceNew(1025, lexer->pLexer->rec->state->tokSource)),
-          parser(MSSQLfromParserNew(tokens)) {}
-    Contexts(const Contexts&) = delete;
-    Contexts& operator=(const Contexts&) = delete;
-    ~Contexts() {
-        parser->free(parser);
-        tokens->free(tokens);
-        lexer->free(lexer);
-        input->close(input);
-    }
-
-    ANTLR3_MARKER position() const { return tokens->tstream->istream->index(tokens->tstream->istream); }
-    ANTLR3_UINT32 parserErrors() const { return parser->pParser->rec->state->errorCount; }
-    ANTLR3_UINT32 lexerErrors() const { return lexer->pLexer->rec->state->errorCount; }
-
-    pANTLR3_INPUT_STREAM input;
-    pMSSQLfromLexer lexer;
-    pANTLR3_COMMON_TOKEN_STREAM tokens;
-    pMSSQLfromParser parser;
-};
+using Contexts = zr::test::ContextsOf<MSSQLfromLexerNew, MSSQLfromParserNew>;
 
 TEST(MssqlfromContexts, TellTheNameOfTheirGrammar) {
     Contexts c(u"");

@@ -12,6 +12,8 @@
 #include <string>
 #include <string_view>
 
+#include "tests/grammar/contexts.h"
+
 namespace {
 
 // Numbers that stored projects and tree walkers know, some of each kind of entry; the corpus pins the rest of
@@ -41,30 +43,7 @@ TEST(OracleVocabulary, NamesLiteralsAsTheyAreWritten) {
     EXPECT_STREQ(Oracle_token_name(355), "'yyyy'");
 }
 
-class Contexts {
- public:
-    explicit Contexts(std::u16string_view text)
-        : input(zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size()))),
-          lexer(OracleLexerNewSSD(input, nullptr)),
-          tokens(antlr3CommonTokenStreamSourceNew(1025, lexer->pLexer->rec->state->tokSource)),
-          parser(OracleParserNewSSD(tokens, nullptr)) {}
-    Contexts(const Contexts&) = delete;
-    Contexts& operator=(const Contexts&) = delete;
-    ~Contexts() {
-        parser->free(parser);
-        tokens->free(tokens);
-        lexer->free(lexer);
-        input->close(input);
-    }
-
-    ANTLR3_UINT32 lexerErrors() const { return lexer->pLexer->rec->state->errorCount; }
-    ANTLR3_UINT32 parserErrors() const { return parser->pParser->rec->state->errorCount; }
-
-    pANTLR3_INPUT_STREAM input;
-    pOracleLexer lexer;
-    pANTLR3_COMMON_TOKEN_STREAM tokens;
-    pOracleParser parser;
-};
+using Contexts = zr::test::ContextsOf<OracleLexerNewSSD, OracleParserNewSSD>;
 
 TEST(OracleContexts, WhiteSpaceIsAHiddenTokenAndNoError) {
     Contexts c(u"SELECT a\r\n\tFROM t;");

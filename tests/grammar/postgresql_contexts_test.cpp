@@ -14,6 +14,8 @@
 #include <utility>
 #include <vector>
 
+#include "tests/grammar/contexts.h"
+
 namespace {
 
 // Numbers that stored projects and tree walkers know, one of each part of the vocabulary; the corpus pins the
@@ -40,30 +42,7 @@ TEST(PostgresqlVocabulary, NamesLiteralsAsTheyAreWritten) {
     EXPECT_STREQ(PostgreSQL_token_name(448), "'@'");
 }
 
-class Contexts {
- public:
-    explicit Contexts(std::u16string_view text)
-        : input(zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size()))),
-          lexer(PostgreSQLLexerNewSSD(input, nullptr)),
-          tokens(antlr3CommonTokenStreamSourceNew(1025, lexer->pLexer->rec->state->tokSource)),
-          parser(PostgreSQLParserNewSSD(tokens, nullptr)) {}
-    Contexts(const Contexts&) = delete;
-    Contexts& operator=(const Contexts&) = delete;
-    ~Contexts() {
-        parser->free(parser);
-        tokens->free(tokens);
-        lexer->free(lexer);
-        input->close(input);
-    }
-
-    pANTLR3_BASE_TREE start() { return parser->start_rule(parser).tree; }
-    ANTLR3_UINT32 parserErrors() const { return parser->pParser->rec->state->errorCount; }
-
-    pANTLR3_INPUT_STREAM input;
-    pPostgreSQLLexer lexer;
-    pANTLR3_COMMON_TOKEN_STREAM tokens;
-    pPostgreSQLParser parser;
-};
+using Contexts = zr::test::ContextsOf<PostgreSQLLexerNewSSD, PostgreSQLParserNewSSD>;
 
 std::vector<std::uint32_t> childTypes(pANTLR3_BASE_TREE tree) {
     std::vector<std::uint32_t> types;
