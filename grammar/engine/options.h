@@ -22,4 +22,7 @@ struct Options {
     std::uint32_t maxTokens = 20000000;
 };
 
+/// What a thread keeps at most of the memory of its last search, and of its last tree, for the next one.
+constexpr std::size_t kSpareBytes = std::size_t{32} << 20;
+
 }  // namespace zr::engine

@@ -11,9 +11,6 @@ namespace {
 /// Up to this many merge states an entry is searched through plainly; beyond, it moves to the shared table.
 constexpr std::uint32_t kFewVisits = 6;
 
-/// What a thread keeps at most between two searches.
-constexpr std::size_t kSpareBytes = std::size_t{32} << 20;
-
 std::uint64_t visitHash(std::uint32_t entry, std::uint16_t node, std::uint32_t low, std::uint32_t high) {
     std::uint64_t h = (static_cast<std::uint64_t>(entry) << 16) ^ node;
     h = h * 0x9E3779B97F4A7C15u ^ low;

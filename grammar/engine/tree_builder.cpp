@@ -3,12 +3,6 @@
 #include <algorithm>
 
 namespace zr::engine {
-namespace {
-
-/// What a thread keeps at most between two trees.
-constexpr std::size_t kSpareBytes = std::size_t{32} << 20;
-
-}  // namespace
 
 TreeBuilder::TreeBuilder(const GrammarTable& grammar, const Recogniser& recogniser,
                          const std::vector<pANTLR3_COMMON_TOKEN>& tokens, pANTLR3_BASE_TREE_ADAPTOR adaptor)
