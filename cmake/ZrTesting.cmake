@@ -18,3 +18,10 @@ function(zr_add_test name)
   gtest_discover_tests(${name} TEST_PREFIX "${name}." DISCOVERY_TIMEOUT 60
                        PROPERTIES TIMEOUT ${arg_TIMEOUT} LABELS "${arg_LABELS}")
 endfunction()
+
+# zr_rediscover_with(NAME pattern...): the program has a case for each of these files, so its list of tests is made again
+# when one comes or changes.
+function(zr_rediscover_with name)
+  file(GLOB files CONFIGURE_DEPENDS ${ARGN})
+  set_property(TARGET ${name} APPEND PROPERTY LINK_DEPENDS ${files})
+endfunction()
