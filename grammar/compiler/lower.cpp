@@ -21,6 +21,7 @@ class Lowering {
         program_.entry.assign(grammar_.rules.size(), -1);
         for (std::size_t i = 0; i < grammar_.rules.size(); ++i) {
             const int end = add(Node(Op::End));
+            node(end).arg = static_cast<int>(i);
             if (static_cast<int>(i) == grammar_.start) {
                 // The engine runs the start rule itself: its statement as far as it goes, then the tail.
                 program_.entry[i] = end;

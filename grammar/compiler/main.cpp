@@ -54,6 +54,7 @@ int main(int argc, char** argv) {
             if (const auto found = vocabulary.numberOf.find(name); found != vocabulary.numberOf.end())
                 program.opener = found->second;
         analyse(program, grammar, facts, vocabulary.maxNumber);
+        numberNodes(program, facts, grammar.recoverRule);
         if (verbose)
             std::cerr << grammar.name << ": " << grammar.rules.size() << " rules, " << program.nodes.size()
                       << " nodes, " << program.classes << " token classes, " << program.guards.size()

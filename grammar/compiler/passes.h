@@ -42,6 +42,10 @@ void applyCloser(Program& program, int closer);
 /// FIRST sets, merge points, guards, token classes: everything the tables hold that follows from the nodes.
 void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts, int maxToken);
 
+/// Puts the nodes that a search stops at first, each behind those that can come after it without a token in
+/// between; those that only shape the tree follow. What nothing leads to goes.
+void numberNodes(Program& program, const Facts& facts, int recoverRule);
+
 /// Lexer: one automaton for the longest match over all rules, and one program a rule for single-rule calls.
 LexerProgram buildLexer(const LexerGrammar& grammar);
 

@@ -21,7 +21,7 @@ enum class Op : std::uint8_t {
     Root,        ///< the tree so far becomes the children of an imaginary node `arg`
     ScopeBegin,  ///< an inlined rule starts: marks inside work on its own tree
     ScopeEnd,    ///< and ends: its tree goes to the outer one by the mark of its ScopeBegin
-    End          ///< the rule is done
+    End          ///< rule `arg` is done
 };
 
 struct Node {
@@ -72,6 +72,7 @@ struct CallContext {
 
 struct Program {
     std::vector<Node> nodes;
+    int stops = 0;           ///< nodes that a search stops at: they stand first, see numberNodes()
     std::vector<int> entry;  ///< by rule: first node
     std::vector<std::set<int>> sets;
     std::vector<Guard> guards;

@@ -5,186 +5,119 @@
 
 #include "grammar/engine/derivation.h"
 #include "grammar/engine/options.h"
+#include "grammar/engine/reach.h"
 #include "grammar/engine/tables.h"
 #include "grammar/engine/text_index.h"
 
 /// The search that never turns back, for texts on which the lazy one (recogniser.h) asks for too much.
 ///
-/// It first finds, for every (rule, position) that it comes to, the set of all ends, whatever their order;
-/// then it walks down once from the whole, and at every choice takes the first branch that still leads to an
-/// end that is wanted there. So a text with many readings costs what its sets of ends cost and not what
-/// trying them in order would. On text with few readings it does more than needed, which is why it doesn't
-/// come first.
+/// It goes through the text once from its end to its beginning and finds, for every node that Reach leaves
+/// (reach.h) and every position, the set of all ends that the node's rule can come to from there. What lies
+/// behind a node is the same for every rule that passes it, so sets are shared and a text with many readings
+/// costs what its sets cost and not what trying the readings in order would. Then it walks down once from
+/// the whole, and at every choice takes the first branch that still leads to an end that is wanted there.
 namespace zr::engine {
 
 class FullSearch {
  public:
     static constexpr std::uint32_t kNone = 0xFFFFFFFF;
 
-    /// Where a part that can't be read may stand for anything, see Recogniser::recover().
-    struct Recovery {
-        bool on = false;
-        std::uint32_t start = 0;      ///< where the statement starts
-        std::uint32_t place = kNone;  ///< where the recover rule may stand for anything
-    };
-
     enum class Outcome { Found, NotFound, TooDeep, OverBudget };
 
     /// The table and the index must outlive this object.
-    FullSearch(const ParserTable& table, TextIndex& text, const Options& options, const Recovery& recovery);
+    FullSearch(const ParserTable& table, TextIndex& text, const Options& options,
+               const Reach::Recovery& recovery)
+        : table_(table), text_(text), options_(options), recovery_(recovery), reach_(table, text, recovery) {}
 
-    /// Reads `rule` from `position` as far as any derivation reaches.
-    Outcome run(std::uint16_t rule, std::uint32_t position);
+    /// Reads `rule` from `position` as far as any derivation reaches that ends at `bound` at most. The index
+    /// is left cut somewhere behind that place.
+    Outcome run(std::uint16_t rule, std::uint32_t position, std::uint32_t bound);
 
     /// The derivation that was found, and where it ends.
     Derivation& derivation() { return derivation_; }
     std::uint32_t reached() const { return reached_; }
     std::uint64_t steps() const { return steps_; }
-    /// The last place where the statement asked for the recover rule, or kNone.
-    std::uint32_t askedAt() const { return askedAt_; }
 
  private:
-    /// A place that a search has come to: an interval, since closers are settled later, and the tail loops
-    /// that stopped there although a round could start.
-    struct Place {
-        std::uint32_t low, high;
-        std::uint8_t stopped;
-        bool operator==(const Place&) const = default;
-        bool operator<(const Place& other) const {
-            if (high != other.high) return high < other.high;
-            if (low != other.low) return low < other.low;
-            return stopped < other.stopped;
-        }
+    /// Positions as bits, words counted from the first one of the search. A set is never changed, so nodes
+    /// share it.
+    struct Set {
+        std::uint32_t firstWord, count;
+        std::size_t offset;  ///< in words_
     };
+    using SetId = std::uint32_t;
+    static constexpr SetId kEmpty = 0;
 
-    struct Item {
-        Place place;
-        std::uint16_t node;
-    };
-
-    /// Places in ascending order, each once. Entries that share all ends share the memory.
-    struct Slice {
-        std::uint32_t first = 0, count = 0;
-        bool operator==(const Slice&) const = default;
-    };
-
-    struct Entry {
-        std::uint32_t position;
-        std::uint32_t nextHere;
-        Slice ends;
-        std::uint16_t rule;
-        bool done = false, mayRecover = false, recovered = false;
-    };
-
-    /// An entry whose ends are being found: what it has put on the three stacks starts at these places.
-    struct Work {
-        std::uint32_t entry;
-        std::uint32_t items, ends, slices, arrivals;
-        bool waiting;  ///< for the ends of the call on top of the items
-    };
-
-    /// The plain places at which one entry has come to one node: calls that have many ends each lead to the
-    /// same ones over and over.
-    struct Arrivals {
-        std::uint16_t node;
-        std::uint32_t from;  ///< position of the first bits
-        std::vector<std::uint64_t> bits;
-    };
-
-    /// A point where several ways go on from, in the search for one that leads to a wanted end.
-    struct Trial {
-        Item item;
-        std::uint32_t branch;
-    };
-
-    /// An entry whose path is being written down.
-    struct Walk {
-        std::uint32_t entry;
-        std::uint32_t part;
-        Slice wanted;  ///< in wanted_
-        Item at;
-        std::uint32_t state;
-        std::uint32_t memo;  ///< number of this walk in the memo
-    };
-
-    /// How the rest of a rule behind a call can end without a token more.
-    enum class Rest : std::uint8_t {
-        Unknown,
-        Open,   ///< not at all
-        Plain,  ///< and the place stays what it is
-        Other   ///< past optional closers or tail loops
-    };
-
-    std::uint32_t entryFor(std::uint16_t rule, std::uint32_t position);
-    std::uint32_t entryAt(std::uint16_t rule, std::uint32_t position) const;
-    bool entersOnce(std::uint32_t entry, const Item& item);
-    std::uint16_t target(const NodeRow& choice, std::uint32_t branch) const;
-    bool take(const NodeRow& node, Place& place) const;
-    std::uint32_t branchMask(std::uint32_t entry, const Item& item) const;
-    Item afterBranch(const Item& item, std::uint32_t branch) const;
-    bool mayCall(std::uint32_t entry, Item& item);
-    bool goesOn(std::uint32_t entry, const NodeRow& call, const Place& place) const;
-    Rest restBehind(const NodeRow& call);
-    bool comesBack(const Item& call, const Entry& called, const Place& end, Item& next) const;
-    Place endOf(std::uint32_t entry, Place place);
-    bool isStart(std::uint32_t entry) const {
-        return recovery_.on && entries_[entry].position == recovery_.start;
+    bool findSets(std::uint32_t position, std::uint32_t end);
+    SetId setFor(std::uint16_t node, std::uint32_t position);
+    bool isSkipped(const NodeRow& call, std::uint32_t position) const;
+    SetId setBehind(const NodeRow& call, std::uint32_t position);
+    SetId setAt(std::uint16_t node, std::uint32_t position) const;
+    SetId endsOf(std::uint16_t rule, std::uint32_t position) const {
+        return setAt(searchedFrom(table_, table_.rules[rule].entry), position);
     }
+    void join(SetId set);
+    void joinWord(std::uint32_t word, std::uint64_t bits);
+    SetId joined(SetId like);
+    SetId single(std::uint32_t position);
+    bool isSingle(SetId set, std::uint32_t position) const;
+    bool contains(SetId set, std::uint32_t position) const;
+    bool containsAll(SetId whole, SetId part) const;
+    bool meet(SetId one, SetId other) const;
+    std::uint32_t last(SetId set) const;
 
-    Outcome findEnds(std::uint32_t root);
-    bool follow(std::uint32_t entry, Item item, bool returned, std::uint32_t& child);
-    void spread(std::uint32_t entry, const Item& call, const Entry& called);
-    Arrivals& arrivalsAt(std::uint16_t node, std::uint32_t from);
-    void finishEntry(const Work& work);
-    void gather(const Work& work);
-    void recover(Entry& entry);
+    /// For a node that stands behind a Call: where its rule can end at once and nowhere else, and where it
+    /// can go on to other places. Most rules mostly end behind a call, so ends pass on by the word.
+    struct Behind {
+        std::uint64_t* onlyHere;
+        std::uint64_t* elsewhere;
+    };
+    Behind behind(std::uint16_t node);
+    /// The last ends of a call in front of such a node, and what was found behind them.
+    struct Known {
+        SetId ends = kEmpty, behind = kEmpty;
+    };
 
-    void writeDown(std::uint32_t root);
-    void startWalk(std::uint32_t entry, Slice wanted);
-    bool walkOn(std::size_t index);
-    void comeBack(Walk& walk, std::uint32_t part, const Place& end, std::uint32_t state);
-    std::uint32_t addState(std::uint16_t node, const Place& place, std::uint32_t before, std::uint32_t part,
-                           std::uint32_t end);
-    bool isWanted(const Walk& walk, const Place& place);
-    std::uint32_t branchCount(const Item& item) const;
-    bool branch(const Walk& walk, const Item& item, std::uint32_t index, Item& next);
-    bool leadsOn(const Walk& walk, const Item& item);
+    /// A rule whose path is being written down.
+    struct Walk {
+        std::uint32_t part;
+        SetId wanted;
+        std::uint16_t node;
+        std::uint32_t position;
+        std::uint32_t state;
+    };
+
+    Outcome writeDown(std::uint16_t rule, std::uint32_t position);
+    void comeBack(Walk& walk, std::uint32_t part, std::uint32_t end, std::uint32_t state);
+    void startWalk(std::uint16_t rule, std::uint32_t position, SetId wanted);
+    bool walkOn(Walk& walk);
+    SetId wantedBy(const Walk& walk, const NodeRow& call);
+    std::uint32_t addState(std::uint16_t node, std::uint32_t position, std::uint32_t before,
+                           std::uint32_t part, std::uint32_t end);
 
     const ParserTable& table_;
     TextIndex& text_;
     const Options& options_;
-    const Recovery recovery_;
+    const Reach::Recovery recovery_;
+    Reach reach_;
 
-    std::vector<Entry> entries_;
-    std::vector<std::uint32_t> entriesAt_;
-    std::vector<Place> pool_;  ///< ends of all entries
-    std::vector<Work> works_;
-    std::vector<Item> items_;
-    std::vector<Place> ends_;
-    std::vector<Slice> slices_;
-    std::vector<Arrivals> arrivals_;
-    std::vector<std::uint64_t> marks_;
-    std::vector<Rest> rests_;  ///< by node behind a call
-    std::uint64_t steps_ = 0;
-    std::uint32_t reached_ = 0;
-    std::uint32_t askedAt_ = kNone;
-
-    /// Open addressing: by (entry or walk, item); whether it was entered or, in walks, whether it leads on.
-    struct Memo {
-        enum Value : std::uint8_t { No, Yes, Unknown };
-        std::uint32_t owner;
-        Item item;
-        Value value;
-    };
-    Memo& memo(std::uint32_t owner, const Item& item);
-    std::vector<Memo> memo_;
-    std::size_t memoUsed_ = 0;
+    std::uint32_t from_ = 0, end_ = 0;
+    std::size_t setWords_ = 0;  ///< words of a set that holds all positions
+    std::vector<Set> sets_;
+    std::vector<std::uint64_t> words_;
+    std::vector<SetId> byVertex_;             ///< of the nodes that were kept, position by position
+    std::vector<std::uint32_t> vertexFrom_;   ///< by position
+    std::vector<std::uint8_t> vertexBefore_;  ///< by position and word of its row: nodes in the words before
+    std::vector<std::uint32_t> columnOf_;     ///< by node: its place among those that stand behind a Call
+    std::vector<std::uint64_t> columns_;
+    std::vector<Known> knownBehind_;             ///< by column
+    std::vector<std::uint64_t> joint_;           ///< the set being made
+    std::uint32_t jointFrom_ = 0, jointTo_ = 0;  ///< words of it that are in use
 
     std::vector<Walk> walks_;
-    std::vector<Place> wanted_;
-    std::vector<Trial> trials_;
-    std::uint32_t memos_ = 0;
     Derivation derivation_;
+    std::uint64_t steps_ = 0;
+    std::uint32_t reached_ = 0;
 };
 
 }  // namespace zr::engine

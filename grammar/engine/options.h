@@ -11,9 +11,9 @@ struct Options {
     /// Rules at work inside each other. A parenthesis costs about four, a sub-query about ten.
     std::uint32_t maxDepth = 200000;
     /// Steps of the search that tries one reading behind the other: a fixed part and a part for each token.
-    /// Nearly all text that is read to its end needs less than a tenth of it.
-    std::uint64_t baseSteps = 4000;
-    std::uint64_t stepsPerToken = 64;
+    /// Most text needs less than half of it; past it the other search is the cheaper one.
+    std::uint64_t baseSteps = 400;
+    std::uint64_t stepsPerToken = 20;
     /// Steps of the search that takes over then. Past them the furthest reading of a last, narrow search
     /// stands, and a notice goes to the diagnostics.
     std::uint64_t fullBaseSteps = 2000000;

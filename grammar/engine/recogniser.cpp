@@ -303,6 +303,11 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                     // The parentheses that are left over are among what recovery skips.
                     low = high;
                 }
+                if (recoverable) {
+                    if (recoverAskedAt_ == kNone || low > recoverAskedAt_) recoverAskedAt_ = low;
+                    // Where the place is only looked for, nobody needs to know what comes behind it.
+                    if (recoverPlace_ == kNone) return false;
+                }
                 if (!recoverable && !text_.inSet(table_->firstSetBase + node.arg, text_.classAt(low)) &&
                     (!rule.nullable || (node.flags & kNonEmpty)))
                     return false;
@@ -312,10 +317,7 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
                 if (!recoverable && !text_.guarded(node, low)) return false;
                 const std::uint32_t child =
                     entryFor(node.arg, low, contextOf(node.context, entries_[entryIndex].context));
-                if (recoverable) {
-                    if (recoverAskedAt_ == kNone || low > recoverAskedAt_) recoverAskedAt_ = low;
-                    entries_[child].mayRecover = low == recoverPlace_;
-                }
+                if (recoverable) entries_[child].mayRecover = low == recoverPlace_;
                 pushFrame(entries_[entryIndex], {kNone, low, high, state, child, kNone, 0, at, stopped});
                 return false;
             }
@@ -413,11 +415,8 @@ void Recogniser::reset() {
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
     recovering_ = true;
     recoverStart_ = position;
-    if (search(rule, position).overBudget) {
-        FullSearch full(*table_, text_, *options_, {true, position, kNone});
-        full.run(rule, position);
-        recoverAskedAt_ = full.askedAt();
-    }
+    search(rule, position);
+    if (recoverAskedAt_ == kNone) return {};
     reset();
     recoverPlace_ = recoverAskedAt_;
     return run(rule, position);
@@ -429,20 +428,26 @@ Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t positio
 Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
     Result result = search(rule, position);
     if (result.overLimit || (result.found && result.high == text_.count())) return result;
+    std::uint32_t bound = text_.count();
     if (!result.overBudget) {
         if (furthest_ <= position) return result;
         const std::uint64_t spent = steps_;
+        bound = furthest_;
         text_.cutAt(furthest_);
         reset();
         result = search(rule, position);
         steps_ += spent;
     }
-    return result.overBudget ? fullSearch(rule, position) : result;
+    if (!result.overBudget) return result;
+    return fullSearch(rule, position, bound);
 }
 
-Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t position) {
-    FullSearch full(*table_, text_, *options_, {recovering_, recoverStart_, recoverPlace_});
-    const FullSearch::Outcome outcome = full.run(rule, position);
+Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t position, std::uint32_t bound) {
+    Reach::Recovery recovery;
+    if (recovering_ && recoverPlace_ != kNone)
+        recovery = {recoverPlace_, skippedTo(*table_, text_, recoverPlace_)};
+    FullSearch full(*table_, text_, *options_, recovery);
+    const FullSearch::Outcome outcome = full.run(rule, position, bound);
     steps_ += full.steps();
     if (outcome == FullSearch::Outcome::OverBudget) return narrowSearch(rule, position);
     Result result;
@@ -488,7 +493,8 @@ Recogniser::Result Recogniser::search(std::uint16_t rule, std::uint32_t position
     contextCache_.assign(table_->contextCount, kNone16);
     result.entry = entryFor(rule, position, 0);
     chain_.assign(1, result.entry);
-    const std::uint64_t budget = endsEach_ != 0
+    const bool seeksPlace = recovering_ && recoverPlace_ == kNone;
+    const std::uint64_t budget = endsEach_ != 0 || seeksPlace
                                      ? options_->fullBaseSteps + options_->fullStepsPerToken * text_.count()
                                      : options_->baseSteps + options_->stepsPerToken * text_.count();
     while (!chain_.empty()) {

@@ -116,7 +116,7 @@ class Recogniser {
     std::uint16_t contextOf(std::uint16_t call, std::uint16_t outer);
     bool isOpenEnd(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped);
     bool isCovered(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped);
-    Result fullSearch(std::uint16_t rule, std::uint32_t position);
+    Result fullSearch(std::uint16_t rule, std::uint32_t position, std::uint32_t bound);
     Result narrowSearch(std::uint16_t rule, std::uint32_t position);
     Result search(std::uint16_t rule, std::uint32_t position);
     void pushFrame(Entry& entry, Frame frame);

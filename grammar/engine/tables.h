@@ -7,7 +7,7 @@
 /// engine never runs tables of another layout.
 namespace zr::engine {
 
-constexpr std::uint32_t kTableVersion = 5;
+constexpr std::uint32_t kTableVersion = 6;
 
 constexpr std::uint16_t kNone16 = 0xFFFF;
 
@@ -75,7 +75,7 @@ struct NodeRow {
     Op op;
     Mark mark;
     std::uint8_t flags;  ///< NodeFlags
-    std::uint16_t arg;   ///< token number, set, rule, choice
+    std::uint16_t arg;   ///< token number, set, rule (of a Call or an End), choice
     std::uint16_t next;  ///< next node of the path
     std::uint16_t run;   ///< next node that the recogniser stops at
     std::uint16_t
@@ -141,6 +141,12 @@ struct ParserTable {
     const std::uint16_t* contextSets;
     const std::uint8_t* contextFlags;
     std::uint32_t contextCount;
+    /// Nodes that a search stops at. They stand first, each behind those that can come after it without a
+    /// token in between.
+    std::uint32_t stops;
+    /// The Calls of rule r are calls[callsFrom[r]] up to calls[callsFrom[r + 1]].
+    const std::uint16_t* calls;
+    const std::uint32_t* callsFrom;
 };
 
 /// The first node at or behind one that a search stops at: those that only shape the tree are passed over.
@@ -148,6 +154,11 @@ inline std::uint16_t searchedFrom(const ParserTable& table, std::uint16_t node) 
     const NodeRow& row = table.nodes[node];
     const bool shapes = row.op == Op::Root || row.op == Op::ScopeBegin || row.op == Op::ScopeEnd;
     return shapes ? row.run : node;
+}
+
+/// Where a branch of a Choice goes on.
+inline std::uint16_t branchTarget(const ParserTable& table, const NodeRow& choice, std::uint32_t branch) {
+    return searchedFrom(table, table.targets[table.choices[choice.arg].firstTarget + branch]);
 }
 
 struct GrammarTable {
