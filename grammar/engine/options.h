@@ -10,6 +10,9 @@ namespace zr::engine {
 struct Options {
     /// Rules at work inside each other. A parenthesis costs about four, a sub-query about ten.
     std::uint32_t maxDepth = 200000;
+    /// Rules called and ways that failed, in the search that remembers nothing, since it last got further;
+    /// 0 leaves that search out.
+    std::uint32_t quickSteps = 64;
     /// Steps of the search that tries one reading behind the other: a fixed part and a part for each token.
     /// Most text needs less than half of it; past it the other search is the cheaper one.
     std::uint64_t baseSteps = 400;

@@ -25,7 +25,6 @@ Recogniser::Recogniser(const ParserTable& table, const std::vector<std::uint16_t
                        const Options& options)
     : table_(&table), options_(&options), text_(table, types) {
     exchange(spare());
-    entriesAt_.assign(text_.count() + 1, kNone);
 }
 
 struct Recogniser::Spare {
@@ -35,11 +34,17 @@ struct Recogniser::Spare {
     std::vector<Frame> frames;
     std::vector<Visit> visits;
     std::vector<std::uint32_t> entriesAt;
+    Derivation derivation;
+    QuickSearch::Work quick;
 
     std::size_t bytes() const {
         return entries.capacity() * sizeof(Entry) + ends.capacity() * sizeof(End) +
                states.capacity() * sizeof(State) + frames.capacity() * sizeof(Frame) +
-               visits.capacity() * sizeof(Visit) + entriesAt.capacity() * sizeof(std::uint32_t);
+               visits.capacity() * sizeof(Visit) + entriesAt.capacity() * sizeof(std::uint32_t) +
+               derivation.parts.capacity() * sizeof(Derivation::Part) +
+               derivation.ends.capacity() * sizeof(End) + derivation.states.capacity() * sizeof(State) +
+               quick.calls.capacity() * sizeof(QuickSearch::Call) +
+               quick.points.capacity() * sizeof(QuickSearch::Point);
     }
 };
 
@@ -54,6 +59,8 @@ void Recogniser::exchange(Spare& with) {
     states_.swap(with.states);
     frames_.swap(with.frames);
     visits_.swap(with.visits);
+    std::swap(derivation_, with.derivation);
+    std::swap(quick_, with.quick);
     entriesAt_.swap(with.entriesAt);
 }
 
@@ -415,6 +422,7 @@ void Recogniser::reset() {
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
     recovering_ = true;
     recoverStart_ = position;
+    reset();
     search(rule, position);
     if (recoverAskedAt_ == kNone) return {};
     reset();
@@ -422,11 +430,30 @@ Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t positio
     return run(rule, position);
 }
 
+/// Most text is read by the quick search; the lazy one takes over where that turns back too often.
+Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
+    if (recovering_ || options_->quickSteps == 0) return lazySearch(rule, position);
+    QuickSearch quick(*table_, text_, *options_, derivation_, quick_);
+    hasDerivation_ = quick.run(rule, position);
+    steps_ = quick.steps();
+    if (!hasDerivation_) return lazySearch(rule, position);
+    Result result;
+    result.found = true;
+    result.entry = 0;
+    result.endState = derivation_.endState;
+    result.low = quick.low();
+    result.high = text_.count();
+    return result;
+}
+
 /// A first search looks for a reading of the whole text, which leaves much out, and notes how far readings
 /// get. Where there is none, the text is taken to end at the furthest of these places. Where that asks for
 /// too many steps, the search that never turns back takes over.
-Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
+Recogniser::Result Recogniser::lazySearch(std::uint16_t rule, std::uint32_t position) {
+    const std::uint64_t quickly = steps_;
+    reset();
     Result result = search(rule, position);
+    steps_ += quickly;
     if (result.overLimit || (result.found && result.high == text_.count())) return result;
     std::uint32_t bound = text_.count();
     if (!result.overBudget) {
@@ -444,8 +471,14 @@ Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
 
 Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t position, std::uint32_t bound) {
     Reach::Recovery recovery;
-    if (recovering_ && recoverPlace_ != kNone)
+    if (recovering_ && recoverPlace_ != kNone) {
+        // Where the rule reads anything by itself, it stands for that and nothing is skipped.
+        FullSearch itself(*table_, text_, *options_, {});
+        if (itself.run(table_->recoverRule, recoverPlace_, text_.count()) == FullSearch::Outcome::Found)
+            return {};
+        text_.cutAt(text_.fullCount());
         recovery = {recoverPlace_, skippedTo(*table_, text_, recoverPlace_)};
+    }
     FullSearch full(*table_, text_, *options_, recovery);
     const FullSearch::Outcome outcome = full.run(rule, position, bound);
     steps_ += full.steps();
@@ -456,19 +489,11 @@ Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t posi
     const std::uint64_t spent = steps_;
     reset();
     steps_ = spent;
-    Derivation& derivation = full.derivation();
-    states_ = std::move(derivation.states);
-    ends_ = std::move(derivation.ends);
-    for (const Derivation::Part& part : derivation.parts) {
-        Entry entry;
-        entry.position = part.position;
-        entry.rule = part.rule;
-        entry.recovered = part.recovered;
-        entries_.push_back(entry);
-    }
+    derivation_ = std::move(full.derivation());
+    hasDerivation_ = true;
     result.found = true;
     result.entry = 0;
-    result.endState = derivation.endState;
+    result.endState = derivation_.endState;
     result.low = result.high = full.reached();
     return result;
 }

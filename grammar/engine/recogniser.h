@@ -6,6 +6,7 @@
 
 #include "grammar/engine/derivation.h"
 #include "grammar/engine/options.h"
+#include "grammar/engine/quick_search.h"
 #include "grammar/engine/tables.h"
 #include "grammar/engine/text_index.h"
 
@@ -51,12 +52,22 @@ class Recogniser {
     Result recover(std::uint16_t rule, std::uint32_t position);
 
     // What the tree builder reads.
-    const State& state(std::uint32_t index) const { return states_[index]; }
-    std::uint16_t ruleOf(std::uint32_t entry) const { return entries_[entry].rule; }
-    std::uint32_t startOf(std::uint32_t entry) const { return entries_[entry].position; }
-    const End& end(std::uint32_t index) const { return ends_[index]; }
+    const State& state(std::uint32_t index) const {
+        return hasDerivation_ ? derivation_.states[index] : states_[index];
+    }
+    std::uint16_t ruleOf(std::uint32_t entry) const {
+        return hasDerivation_ ? derivation_.parts[entry].rule : entries_[entry].rule;
+    }
+    std::uint32_t startOf(std::uint32_t entry) const {
+        return hasDerivation_ ? derivation_.parts[entry].position : entries_[entry].position;
+    }
+    const End& end(std::uint32_t index) const {
+        return hasDerivation_ ? derivation_.ends[index] : ends_[index];
+    }
     /// Whether the entry stands for tokens that were skipped where its rule didn't parse.
-    bool isRecovered(std::uint32_t entry) const { return entries_[entry].recovered; }
+    bool isRecovered(std::uint32_t entry) const {
+        return hasDerivation_ ? derivation_.parts[entry].recovered : entries_[entry].recovered;
+    }
 
     /// Work done so far, in search steps; a benchmark figure.
     std::uint64_t steps() const { return steps_; }
@@ -116,6 +127,7 @@ class Recogniser {
     std::uint16_t contextOf(std::uint16_t call, std::uint16_t outer);
     bool isOpenEnd(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped);
     bool isCovered(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped);
+    Result lazySearch(std::uint16_t rule, std::uint32_t position);
     Result fullSearch(std::uint16_t rule, std::uint32_t position, std::uint32_t bound);
     Result narrowSearch(std::uint16_t rule, std::uint32_t position);
     Result search(std::uint16_t rule, std::uint32_t position);
@@ -157,6 +169,9 @@ class Recogniser {
     std::uint8_t endsEach_ = 0;   ///< ends that an entry may have, 0 for any number
     std::vector<Context> contexts_;
     std::vector<std::uint16_t> contextCache_;  ///< by context and call context
+    Derivation derivation_;                    ///< of the searches that write one down
+    QuickSearch::Work quick_;
+    bool hasDerivation_ = false;
     bool recovering_ = false;
     std::uint32_t recoverStart_ = 0;        ///< where the statement starts
     std::uint32_t recoverPlace_ = kNone;    ///< the one place where the recover rule may stand for anything

@@ -56,38 +56,6 @@ void TextIndex::indexGuard(std::uint16_t number) {
         nextOpener_[i] = inSet(table_->openerSet, classes_[i]) ? i : nextOpener_[i + 1];
 }
 
-bool TextIndex::guarded(const NodeRow& call, std::uint32_t position) {
-    if (call.required != 0 && lastOf_[call.required] <= position) return false;
-    if (call.guard == kNone16 || position >= count_) return true;
-    if (candidates_[call.guard].empty()) indexGuard(call.guard);
-    const std::uint32_t candidate = candidates_[call.guard][position + 1];
-    if (candidate == kNone) return false;
-    const std::uint32_t barrier = barriers_[call.guard][position];
-    return candidate <= barrier || nextOpener_[position] <= barrier + 1;
-}
-
-bool TextIndex::settle(std::uint32_t& low, std::uint32_t& high) const {
-    if (low == high) return true;
-    if (high != runEnd(low)) return false;
-    low = high;
-    return true;
-}
-
-std::uint32_t TextIndex::viable(const NodeRow& choice, std::uint32_t low, std::uint32_t high) const {
-    const std::uint32_t* masks = table_->choiceMask + static_cast<std::size_t>(choice.arg) * table_->classes;
-    if (low == high) return masks[classes_[low]];
-    std::uint32_t mask = masks[table_->classOf[table_->closer]];
-    if (high == runEnd(low)) mask |= masks[classes_[high]];
-    return mask;
-}
-
-std::uint8_t TextIndex::stoppedAfter(const NodeRow& choice, std::uint32_t branch, std::uint32_t low,
-                                     std::uint32_t high, std::uint8_t stopped) const {
-    if (choice.context == kNone16 || branch == 0 || high != runEnd(low)) return stopped;
-    if (!inSet(choice.guard, classes_[high])) return stopped;
-    return static_cast<std::uint8_t>(stopped | (1u << choice.context));
-}
-
 std::uint32_t TextIndex::closersOwedAt(std::uint32_t position) {
     if (table_->owing == kNone16) return kNone;
     if (owedAt_.empty()) {

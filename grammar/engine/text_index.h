@@ -44,19 +44,43 @@ class TextIndex {
     }
     /// Whether the text still holds what a Call and the part behind it can't do without. A cheap "no" here
     /// saves the search of an alternative that was never going to work, such as an alias behind every column.
-    bool guarded(const NodeRow& call, std::uint32_t position);
+    bool guarded(const NodeRow& call, std::uint32_t position) {
+        if (call.required != 0 && lastOf_[call.required] <= position) return false;
+        if (call.guard == kNone16 || position >= count_) return true;
+        if (candidates_[call.guard].empty()) indexGuard(call.guard);
+        const std::uint32_t candidate = candidates_[call.guard][position + 1];
+        if (candidate == kNone) return false;
+        const std::uint32_t barrier = barriers_[call.guard][position];
+        return candidate <= barrier || nextOpener_[position] <= barrier + 1;
+    }
     // A place in the text is an interval: inside a run of closers every position from `low` to `high` can be
     // it.
 
     /// A token that isn't the closer can only be taken where the run of closers is over, so an undecided
     /// place becomes that position, if it is among the possible ones.
-    bool settle(std::uint32_t& low, std::uint32_t& high) const;
+    bool settle(std::uint32_t& low, std::uint32_t& high) const {
+        if (low == high) return true;
+        if (high != runEnd(low)) return false;
+        low = high;
+        return true;
+    }
     /// The branches of a Choice that can go on at a place, as bits.
-    std::uint32_t viable(const NodeRow& choice, std::uint32_t low, std::uint32_t high) const;
+    std::uint32_t viable(const NodeRow& choice, std::uint32_t low, std::uint32_t high) const {
+        const std::uint32_t* masks =
+            table_->choiceMask + static_cast<std::size_t>(choice.arg) * table_->classes;
+        if (low == high) return masks[classes_[low]];
+        std::uint32_t mask = masks[table_->classOf[table_->closer]];
+        if (high == runEnd(low)) mask |= masks[classes_[high]];
+        return mask;
+    }
     /// What a branch does to the record of tail loops that stopped: leaving one although a round could start
     /// is noted.
     std::uint8_t stoppedAfter(const NodeRow& choice, std::uint32_t branch, std::uint32_t low,
-                              std::uint32_t high, std::uint8_t stopped) const;
+                              std::uint32_t high, std::uint8_t stopped) const {
+        if (choice.context == kNone16 || branch == 0 || high != runEnd(low)) return stopped;
+        if (!inSet(choice.guard, classes_[high])) return stopped;
+        return static_cast<std::uint8_t>(stopped | (1u << choice.context));
+    }
 
     /// How many closers rules that started ahead of a position must take behind it, at most: one for each
     /// opening parenthesis. kNone when the grammar doesn't tell.
