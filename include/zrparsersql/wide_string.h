@@ -1,5 +1,9 @@
 #pragma once
 
+#if defined(_MSVC_LANG) ? _MSVC_LANG < 202002L : __cplusplus < 202002L
+#error "The headers of ZRParserSQL are C++20: compile with -std=c++20 or newer"
+#endif
+
 #include <atomic>
 #include <cstddef>
 #include <cstdint>
