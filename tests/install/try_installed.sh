@@ -1,10 +1,11 @@
 #!/usr/bin/env bash
-# Builds with each compiler, by CMake and by pkg-config, the programs that the development package brings along, and
-# compares what they write; does what the README tells; asks the program and its man page.
+# Compiles with each compiler every header by itself; builds, by CMake and by pkg-config, the programs that the
+# development package brings along, and compares what they write; does what the README tells; asks the program and its
+# man page.
 #
 #     try_installed.sh PREFIX FOLDER
 #
-# FOLDER has the README and readme.sh, and is where everything is made.
+# FOLDER has the README, headers.sh and readme.sh, and is where everything is made.
 set -euo pipefail
 prefix=$1 folder=$2
 examples=$prefix/share/doc/libzrparsersql-dev/examples/embed
@@ -41,6 +42,9 @@ for pair in "${pairs[@]}"; do
     work=$folder/$CXX
     rm -rf "$work"
     mkdir -p "$work"
+
+    echo "$CXX: $(bash "$folder/headers.sh" c++20 "$CXX" "$prefix/include") compile by themselves as C++20"
+    echo "$CC: $(bash "$folder/headers.sh" c11 "$CC" "$prefix/include") compile by themselves as C11"
 
     quietly "$work/configure.log" cmake -S "$examples" -B "$work/cmake" -DCMAKE_CXX_FLAGS="${flags[*]}" -DCMAKE_C_FLAGS="${flags[*]}"
     quietly "$work/build.log" cmake --build "$work/cmake" --parallel 2

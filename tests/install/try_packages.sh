@@ -26,7 +26,7 @@ lay() {
     mkdir -p "$1/packages"
     cp "$packages"/*.deb "$1/packages"
     cp "$readme" "$1/README.md"
-    cp "$here/readme.sh" "$here/try_installed.sh" "$1"
+    cp "$here/headers.sh" "$here/readme.sh" "$here/try_installed.sh" "$1"
 }
 
 if [[ $(id -u) != 0 ]] || ! command -v debootstrap >/dev/null; then
