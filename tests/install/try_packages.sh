@@ -15,11 +15,13 @@ mirror=${MIRROR:-http://deb.debian.org/debian}
 suite=bookworm
 root=$work/root
 
-# Never deletes into a file system of the outer machine.
-unmount() { ! mountpoint -q "$root/proc" || umount "$root/proc"; }
-trap unmount EXIT
-unmount
-rm -rf "$root"
+# What a fresh Debian wants mounted is mounted for this process and its children alone: gone with them, however they end.
+# Nothing is then left through which the next run could delete into a file system of the machine.
+if [[ $(id -u) == 0 && -z ${ZR_OWN_MOUNTS:-} ]] && command -v debootstrap >/dev/null; then
+    ZR_OWN_MOUNTS=1 exec unshare --mount --propagation private bash "${BASH_SOURCE[0]}" "$packages" "$readme" "$work"
+fi
+grep -q " $root/" /proc/mounts && { echo "something is mounted below $root" >&2; exit 1; }
+rm -rf --one-file-system "$root"
 
 # lay FOLDER: what the trial reads, beside the packages.
 lay() {
@@ -41,7 +43,7 @@ fi
 echo "making a fresh Debian in $root"
 debootstrap --variant=minbase "$suite" "$root" "$mirror" >"$work/debootstrap.log" 2>&1 ||
     { tail -n 20 "$work/debootstrap.log" >&2; exit 1; }
-mount -t proc proc "$root/proc"
+mountpoint -q "$root/proc" || mount -t proc proc "$root/proc"
 lay "$root/root/trial"
 
 in_root() { chroot "$root" env -i HOME=/root LC_ALL=C.UTF-8 PATH=/usr/sbin:/usr/bin:/sbin:/bin DEBIAN_FRONTEND=noninteractive "$@"; }
