@@ -1,5 +1,5 @@
-/// Nanoseconds, allocations and bytes a token by stage over files of queries, DIALECT.jsonl with a member "sql"
-/// on each line: the median over the queries that are read to their end, and over the others.
+/// Nanoseconds, allocations and bytes a token by stage over files of queries, DIALECT.jsonl with a member
+/// "sql" on each line: the median over the queries that are read to their end, and over the others.
 ///
 ///     corpus_bench [--rounds N] [--dialect NAME] FOLDER
 ///     corpus_bench --once ROUNDS --dialect NAME --stage NAME FOLDER      for a profiler: one stage, no clock

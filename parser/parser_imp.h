@@ -29,7 +29,9 @@ class ParserImp : public CZRSQLParser {
         }
     }
 
-    virtual void GetSQLTree(CZRSQLTree** out) { *out = newView(parses_.empty() ? nullptr : parses_.back().get()); }
+    virtual void GetSQLTree(CZRSQLTree** out) {
+        *out = newView(parses_.empty() ? nullptr : parses_.back().get());
+    }
 
  protected:
     static CZRSQLTree* newView(const engine::SyntaxTree* tree) {

@@ -15,9 +15,8 @@ namespace {
 void displayRecognitionError(pANTLR3_BASE_RECOGNIZER recogniser, pANTLR3_UINT8*) {
     if (!zr::diagnosticsWanted() || recogniser->state->exception == nullptr) return;
     const pANTLR3_EXCEPTION e = recogniser->state->exception;
-    const auto* token = recogniser->type == ANTLR3_TYPE_PARSER
-                            ? static_cast<pANTLR3_COMMON_TOKEN>(e->token)
-                            : nullptr;
+    const auto* token =
+        recogniser->type == ANTLR3_TYPE_PARSER ? static_cast<pANTLR3_COMMON_TOKEN>(e->token) : nullptr;
     if (token != nullptr && token->type == ANTLR3_TOKEN_EOF)
         return reportUnreadableEnd(static_cast<std::uint32_t>(e->line));
     std::u16string_view units;

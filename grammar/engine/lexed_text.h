@@ -38,9 +38,7 @@ class LexedText {
     const std::vector<std::uint16_t>& types() const { return types_; }
     std::uint32_t seenCount() const { return static_cast<std::uint32_t>(types_.size()); }
     /// Which of all tokens the one at a parser's position is.
-    std::uint32_t indexOf(std::uint32_t position) const {
-        return hasHidden_ ? seen_[position] : position;
-    }
+    std::uint32_t indexOf(std::uint32_t position) const { return hasHidden_ ? seen_[position] : position; }
     /// Gives back the memory of what only a parser asks.
     void dropTypes() { types_ = {}; }
 
