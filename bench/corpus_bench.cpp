@@ -1,8 +1,11 @@
 /// Nanoseconds, allocations and bytes a token by stage over files of queries, DIALECT.jsonl with a member
 /// "sql" on each line: the median over the queries that are read to their end, and over the others.
 ///
-///     corpus_bench [--rounds N] [--dialect NAME] FOLDER
-///     corpus_bench --once ROUNDS --dialect NAME --stage NAME FOLDER      for a profiler: one stage, no clock
+///     corpus_bench [--rounds N] [--dialect NAME] [FOLDER]
+///     corpus_bench --once --dialect NAME --stage NAME [FOLDER]     for a profiler: one stage, no clock
+///
+/// Without a folder the fixed queries of bench/fixed are taken. What goes by "tree" has lexing and
+/// recognising in it, "facade" has "tree" in it, and "analyse" all.
 
 #include <time.h>
 #include <zrparsersql/analysis.h>
@@ -21,6 +24,12 @@
 #include <thread>
 #include <vector>
 
+#include "analysis/driver.h"
+#include "analysis/msaccess_state.h"
+#include "analysis/mssql_state.h"
+#include "analysis/mysql_state.h"
+#include "analysis/oracle_state.h"
+#include "analysis/postgresql_state.h"
 #include "bench/counting_heap.h"
 #include "grammar/engine/lexed_text.h"
 #include "grammar/engine/rule_reading.h"
@@ -52,19 +61,50 @@ void useFacade(CString& text) {
     delete tree;
 }
 
+/// Everything behind the parse: the views, the passes over them, and the descriptor's end.
+template <class Facade, class State>
+std::function<void()> walkOf(CString& text) {
+    const auto facade = std::make_shared<Facade>();
+    facade->SetSQL(text);
+    facade->ParseSQL();
+    return [facade, &text] {
+        CZRQueryInfo query;
+        CZRSQLTree* root = nullptr;
+        facade->GetSQLTree(&root);
+        const std::unique_ptr<CZRSQLTree> tree(root);
+        CZRSQLTree* const selectNode = zr::findSelectNode(root, State::isSelectNode);
+        if (!selectNode) return;
+        State state(selectNode);
+        state.m_query = &query;
+        state.setItemLimit(zr::itemLimit(text));
+        try {
+            zr::runPasses(state);
+            state.ProcessTail(root);
+        } catch (...) {
+            // As in BuildQueryInfo, the query keeps what it has.
+        }
+    };
+}
+
 struct Dialect {
     const char* name;
     const GrammarTable& grammar;
     DBTypes kind;
     void (*facade)(CString& text);
+    std::function<void()> (*walk)(CString& text);
 };
 
 const Dialect kDialects[] = {
-    {"mssql", zr::grammars::MSSQL, DB_MSSQL, &useFacade<CZRMSSQLParser>},
-    {"mysql", zr::grammars::MySQLSelect, DB_MYSQL, &useFacade<CZRMySQLParcer>},
-    {"oracle", zr::grammars::Oracle, DB_ORACLE, &useFacade<CZROracleParser>},
-    {"postgresql", zr::grammars::PostgreSQL, DB_POSTGRESQL, &useFacade<CZRPostgreParser>},
-    {"msaccess", zr::grammars::MSAccessSQL_v3, DB_MSACCESS, &useFacade<CZRMSAccessSQL_v3Parcer>},
+    {"mssql", zr::grammars::MSSQL, DB_MSSQL, &useFacade<CZRMSSQLParser>,
+     &walkOf<CZRMSSQLParser, MSSQLStateSelectQuery>},
+    {"mysql", zr::grammars::MySQLSelect, DB_MYSQL, &useFacade<CZRMySQLParcer>,
+     &walkOf<CZRMySQLParcer, MySQLStateSelectQuery>},
+    {"oracle", zr::grammars::Oracle, DB_ORACLE, &useFacade<CZROracleParser>,
+     &walkOf<CZROracleParser, OracleStateSelectQuery>},
+    {"postgresql", zr::grammars::PostgreSQL, DB_POSTGRESQL, &useFacade<CZRPostgreParser>,
+     &walkOf<CZRPostgreParser, PostgreStateSelectQuery>},
+    {"msaccess", zr::grammars::MSAccessSQL_v3, DB_MSACCESS, &useFacade<CZRMSAccessSQL_v3Parcer>,
+     &walkOf<CZRMSAccessSQL_v3Parcer, MSAccessSQL_v3StateSelectQuery>},
 };
 
 std::vector<Query> readQueries(const Dialect& dialect, const std::string& folder) {
@@ -110,21 +150,13 @@ const std::vector<Stage>& stages() {
          }},
         {"facade",
          [](const Dialect& d, Query& q) -> std::function<void()> { return [&d, &q] { d.facade(q.text); }; }},
+        {"walk", [](const Dialect& d, Query& q) -> std::function<void()> { return d.walk(q.text); }},
         {"analyse",
          [](const Dialect& d, Query& q) -> std::function<void()> {
              return [&d, &q] {
                  CZRQueryInfo query;
                  query.SetSQL(q.text);
                  BuildQueryInfo(&query, d.kind);
-             };
-         }},
-        {"end",
-         [](const Dialect& d, Query& q) -> std::function<void()> {
-             return [&d, &q] {
-                 // What the host does anyway: the end of a descriptor.
-                 CZRQueryInfo query;
-                 query.SetSQL(q.text);
-                 static_cast<void>(d);
              };
          }},
     };
@@ -182,6 +214,7 @@ void measure(const Dialect& dialect, std::vector<Query>& queries, int rounds) {
                 all += time;
                 tokens += count;
             }
+            if (ns.empty()) continue;
             std::printf("%-11s %-6s %5zu  %-10s %8.0f %8.0f %8.2f %8.0f\n", dialect.name,
                         isReadToEnd ? "whole" : "part", ns.size(), stage.name, median(ns),
                         tokens > 0 ? all * 1e9 / tokens : 0.0, median(allocations), median(peaks));
@@ -192,19 +225,20 @@ void measure(const Dialect& dialect, std::vector<Query>& queries, int rounds) {
 }  // namespace
 
 /// What a profiler is told to look at: valgrind --toggle-collect='measuredRun*'.
-__attribute__((noinline)) void measuredRun(const std::function<void()>& run, int times) {
-    for (int i = 0; i < times; ++i) run();
+__attribute__((noinline)) void measuredRun(const std::function<void()>& run) {
+    run();
 }
 
 int main(int argc, char** argv) {
-    int rounds = 20, once = 0;
-    std::string only, stageName, folder;
+    int rounds = 20;
+    bool once = false;
+    std::string only, stageName, folder = ZR_FIXED_QUERIES;
     for (int i = 1; i < argc; ++i) {
         const std::string word = argv[i];
         if (word == "--rounds" && i + 1 < argc)
             rounds = std::atoi(argv[++i]);
-        else if (word == "--once" && i + 1 < argc)
-            once = std::atoi(argv[++i]);
+        else if (word == "--once")
+            once = true;
         else if (word == "--dialect" && i + 1 < argc)
             only = argv[++i];
         else if (word == "--stage" && i + 1 < argc)
@@ -212,13 +246,13 @@ int main(int argc, char** argv) {
         else
             folder = word;
     }
-    if (once == 0)
+    if (!once)
         std::printf("%-11s %-6s %5s  %-10s %8s %8s %8s %8s\n", "dialect", "read", "n", "stage", "ns/token",
                     "(whole)", "allocs", "peak B");
     for (const Dialect& dialect : kDialects) {
         if (!only.empty() && only != dialect.name) continue;
         std::vector<Query> queries = readQueries(dialect, folder);
-        if (once == 0) {
+        if (!once) {
             measure(dialect, queries, rounds);
             continue;
         }
@@ -228,7 +262,8 @@ int main(int argc, char** argv) {
             for (Query& query : queries) {
                 if (!query.isReadToEnd) continue;
                 const auto run = stage.prepare(dialect, query);
-                measuredRun(run, once);
+                run();  // what a thread keeps for its next text is there
+                measuredRun(run);
                 tokens += query.tokens;
             }
         }

@@ -18,9 +18,9 @@ using engine::SyntaxTree;
 // Numbers of tokens; a place ahead of the first one is one as well.
 using TokenIndex = std::int64_t;
 
-// The node behind a view of a tree, and null for any other view.
+// A view over a node of the engine's, and null for any other view.
 const TreeView* nodeBehind(CZRSQLTree& view) {
-    const auto* behind = dynamic_cast<const TreeView*>(&view);
+    const TreeView* behind = TreeView::of(view);
     return behind && behind->node() != TreeView::kNoNode ? behind : nullptr;
 }
 
@@ -148,8 +148,8 @@ CString quotedText(CZRSQLTree& string) {
 CString concatenatedText(CZRSQLTree& node) {
     CString text;
     if (const TreeView* view = nodeBehind(node)) {
-        forEachChild(*view->store().tree(), view->node(),
-                     [&](SyntaxNode child) { text += plainText(view->store(), child); });
+        const SyntaxTree& tree = *view->store().tree();
+        forEachChild(tree, view->node(), [&](SyntaxNode child) { text += plainText(view->store(), child); });
         return text;
     }
     const unsigned int count = node.GetChildCount();

@@ -70,6 +70,9 @@ class TreeView : public CZRSQLTree {
     CString GetText() override;
     unsigned int GetType() override;
 
+    // The view as one of these, or null where it is none.
+    static const TreeView* of(const CZRSQLTree& view);
+
     static constexpr engine::SyntaxNode kNoNode = 0xFFFFFFFF;
 
     engine::SyntaxNode node() const { return node_; }

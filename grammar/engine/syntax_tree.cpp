@@ -16,7 +16,7 @@ class SyntaxTreeGrowth {
         nodes_.clear();
     }
     ~SyntaxTreeGrowth() {
-        if (nodes_.capacity() > spare().capacity() && nodes_.capacity() * sizeof(Grown) <= kSpareBytes)
+        if (nodes_.capacity() > spare().capacity() && nodes_.capacity() * sizeof(Grown) <= kSpareBytes / 2)
             nodes_.swap(spare());
     }
     SyntaxTreeGrowth(const SyntaxTreeGrowth&) = delete;

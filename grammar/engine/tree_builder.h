@@ -31,7 +31,7 @@ class TreeBuilder {
         work_.swap(spare());
     }
     ~TreeBuilder() {
-        if (work_.bytes() <= spare().bytes() || work_.bytes() > kSpareBytes) return;
+        if (work_.bytes() <= spare().bytes() || work_.bytes() > kSpareBytes / 2) return;
         work_.clear();
         work_.swap(spare());
     }
@@ -147,10 +147,11 @@ void TreeBuilder<Tree>::open(std::uint32_t entry, std::uint32_t endState, std::u
 template <class Tree>
 void TreeBuilder<Tree>::walk() {
     Frame& frame = work_.frames.back();
+    const NodeRow* const nodes = table_.nodes;
     std::uint16_t at = frame.node;
     std::uint32_t position = frame.at;
     for (;;) {
-        const NodeRow& node = table_.nodes[at];
+        const NodeRow& node = nodes[at];
         switch (node.op) {
             case Op::Choice:
                 at = recogniser_.state(takeState()).node;
@@ -272,12 +273,13 @@ void TreeBuilder<Tree>::closeScope(std::uint32_t at) {
     work_.scopes.pop_back();
     std::vector<Node>& values = work_.values;
     std::uint32_t end = valueCount();
-    if (scope.rooted) {
+    if (scope.rooted && end > scope.base + 1) {
         adoptAll(values[scope.base], scope.base + 1, end);
         end = scope.base + 1;
         values.resize(end);
     }
     if (end == scope.base + 1 && at > scope.start) tree_.bound(values.back(), scope.start, at);
+    if (scope.mark == Mark::None) return;
     if (scope.mark == Mark::Drop) {
         --dropped_;
     } else if (scope.mark == Mark::Root && end > scope.base) {

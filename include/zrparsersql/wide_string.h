@@ -226,6 +226,8 @@ class ZR_SHARED_DECLARATION CString {
     }
 
     friend CString operator+(const CString& left, const CString& right) {
+        if (left.IsEmpty()) return right;
+        if (right.IsEmpty()) return left;
         return concatenate(left.View(), right.View());
     }
     friend CString operator+(const CString& left, std::u16string_view right) {

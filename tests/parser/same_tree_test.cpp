@@ -213,6 +213,20 @@ TEST_P(SameTree, OnTextsThatNoGrammarKnows) {
     EXPECT_GT(counts.errors, 3);
 }
 
+TEST_P(SameTree, MoreTokensThanAllowedAreAnErrorNode) {
+    const std::u16string_view text = u"SELECT a FROM t";
+    engine::Options options;
+    options.maxTokens = engine::LexedText(*grammar().tables().lexer, text).seenCount();
+    const SyntaxTree within(grammar().tables(), text, options);
+    --options.maxTokens;
+    const SyntaxTree beyond(grammar().tables(), text, options);
+    EXPECT_STREQ(beyond.name(SyntaxTree::root()), "Tree Error Node");
+    EXPECT_EQ(beyond.type(SyntaxTree::root()), 0u);
+    EXPECT_EQ(beyond.nodeCount(), 1u);
+    const SyntaxTree unbounded(grammar().tables(), text);
+    EXPECT_EQ(within.nodeCount(), unbounded.nodeCount());
+}
+
 INSTANTIATE_TEST_SUITE_P(Grammars, SameTree, testing::ValuesIn(kRoads),
                          [](const auto& road) { return std::string(road.param.corpus); });
 
