@@ -4,10 +4,9 @@
 
 namespace zr {
 
-std::byte* ViewStore::placeOf(engine::SyntaxNode node) {
+void ViewStore::makePlaces() {
     // Memory that no view comes to stays untouched.
     if (!views_) views_.reset(new std::byte[tree_->nodeCount() * sizeof(TreeView)]);
-    return views_.get() + node * sizeof(TreeView);
 }
 
 CString ViewStore::textOf(engine::SyntaxNode node) {

@@ -22,8 +22,10 @@ class ViewStore {
 
     // Null where there is no tree.
     const engine::SyntaxTree* tree() const { return tree_; }
+    // Makes places for the views of all nodes, unless they are there.
+    void makePlaces();
     // Where the view of a node has its place, as long as the store. Nodes in a row have theirs in a row.
-    std::byte* placeOf(engine::SyntaxNode node);
+    std::byte* placeOf(engine::SyntaxNode node) const;
     // Place for the view of a child that is not there.
     std::unique_ptr<CZRSQLTree>& beyond(const TreeView& parent, unsigned int index) {
         return beyond_[{&parent, index}];
@@ -98,6 +100,7 @@ class ViewOf : public TreeView {
  private:
     void makeViews(engine::SyntaxNode first, unsigned int count) override {
         static_assert(sizeof(Self) == sizeof(TreeView) && alignof(Self) <= alignof(std::max_align_t));
+        store().makePlaces();
         std::byte* place = store().placeOf(first);
         for (unsigned int i = 0; i < count; ++i, place += sizeof(Self)) new (place) Self(first + i, store());
     }
@@ -105,6 +108,10 @@ class ViewOf : public TreeView {
         return std::unique_ptr<CZRSQLTree>(new Self(kNoNode, store()));
     }
 };
+
+inline std::byte* ViewStore::placeOf(engine::SyntaxNode node) const {
+    return views_.get() + node * sizeof(TreeView);
+}
 
 }  // namespace zr
 
