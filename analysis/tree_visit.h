@@ -16,7 +16,9 @@ void visitBelow(CZRSQLTree* root, Visit visit) {
         unsigned int next;
         unsigned int count;
     };
-    std::vector<Place> path{{root, 0, root->GetChildCount()}};
+    std::vector<Place> path;
+    path.reserve(32);  // deeper than most trees
+    path.push_back({root, 0, root->GetChildCount()});
     while (!path.empty()) {
         Place& place = path.back();
         if (place.next == place.count) {

@@ -6,7 +6,9 @@
 
 namespace zr {
 
-WorkStack::WorkStack() = default;
+WorkStack::WorkStack() {
+    frames_.reserve(16);  // deeper than most queries
+}
 WorkStack::~WorkStack() {
     while (!frames_.empty()) pop();
 }

@@ -5,6 +5,7 @@
 
 #include <filesystem>
 
+#include "bench/counting_heap.h"
 #include "bench/large_project.h"
 #include "host/project.h"
 
@@ -29,12 +30,22 @@ void tellSize(benchmark::State& state, StorageForm form) {
     state.counters["MB"] = static_cast<double>(std::filesystem::file_size(pathOf(form))) / 1e6;
 }
 
+/// What one run asks of the heap; SQLite's own memory is not among it.
+template <class Run>
+void tellHeap(benchmark::State& state, Run run) {
+    const zr::bench::HeapCount count;
+    run();
+    state.counters["allocs"] = static_cast<double>(count.use().allocations);
+    state.counters["peak MB"] = static_cast<double>(count.use().peakBytes) / 1e6;
+}
+
 void saveNew(benchmark::State& state, StorageForm form) {
     for (auto _ : state) {
         std::filesystem::remove(pathOf(form));
         zr::host::saveProject(project(), pathOf(form), form);
     }
     tellSize(state, form);
+    tellHeap(state, [form] { zr::host::saveProject(project(), pathOf(form), form); });
 }
 
 void saveOver(benchmark::State& state, StorageForm form) {
@@ -45,6 +56,7 @@ void saveOver(benchmark::State& state, StorageForm form) {
 void load(benchmark::State& state, StorageForm form) {
     zr::host::saveProject(project(), pathOf(form), form);
     for (auto _ : state) benchmark::DoNotOptimize(zr::host::loadProject(pathOf(form)));
+    tellHeap(state, [form] { benchmark::DoNotOptimize(zr::host::loadProject(pathOf(form))); });
 }
 
 void analyseAll(Database& database) {
@@ -62,6 +74,9 @@ void measure(benchmark::State& state, Prepare prepare, Step step) {
         state.ResumeTiming();
         step(*database);
     }
+    database = zr::bench::makeProject(kLargeProject);
+    prepare(*database);
+    tellHeap(state, [&] { step(*database); });
 }
 
 void analyse(benchmark::State& state) {

@@ -1,5 +1,6 @@
-/// Microseconds a query and nanoseconds a token by stage: lex, lex + recognise + tree, and BuildQueryInfo
-/// whole; and how the time of each shape of text grows when the text doubles.
+/// Microseconds a query and nanoseconds a token by stage: lex, a facade's whole road, the same through
+/// contexts of the runtime, and BuildQueryInfo; and how the time of each shape of text grows when the text
+/// doubles.
 
 #include <benchmark/benchmark.h>
 #include <time.h>
@@ -8,12 +9,15 @@
 #include <zrparsersql/input_stream.h>
 #include <zrparsersql/query_info.h>
 #include <zrparsersql/recognizers/MSSQL.h>
+#include <zrparsersql/sql_parsers.h>
 
 #include <algorithm>
 #include <cstdio>
 #include <string>
 
 #include "bench/queries.h"
+#include "grammar/engine/lexed_text.h"
+#include "parser/grammars.h"
 
 namespace {
 
@@ -21,45 +25,42 @@ std::u16string wide(const std::string& text) {
     return {text.begin(), text.end()};
 }
 
-struct Pipeline {
-    pANTLR3_INPUT_STREAM input;
-    pMSSQLLexer lexer;
-    pANTLR3_COMMON_TOKEN_STREAM tokens;
-
-    explicit Pipeline(const std::u16string& text)
-        : input(zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size()))),
-          lexer(MSSQLLexerNew(input)),
-          tokens(antlr3CommonTokenStreamSourceNew(1025, lexer->pLexer->rec->state->tokSource)) {}
-    Pipeline(const Pipeline&) = delete;
-    Pipeline& operator=(const Pipeline&) = delete;
-    ~Pipeline() {
-        tokens->free(tokens);
-        lexer->free(lexer);
-        input->close(input);
-    }
-    std::size_t lex() {
-        tokens->tstream->_LT(tokens->tstream, 1);
-        return tokens->tokens->count;
-    }
-};
-
-std::size_t lexOnly(const std::u16string& text) {
-    return Pipeline(text).lex();
+std::size_t lex(const std::u16string& text) {
+    return zr::engine::LexedText(*zr::grammars::MSSQL.lexer, text).seenCount();
 }
 
+/// The facade's road.
 std::size_t parse(const std::u16string& text) {
-    Pipeline pipeline(text);
-    const pMSSQLParser parser = MSSQLParserNew(pipeline.tokens);
+    CString sql(text);
+    CZRMSSQLParser facade;
+    facade.SetSQL(sql);
+    facade.ParseSQL();
+    CZRSQLTree* tree = nullptr;
+    facade.GetSQLTree(&tree);
+    delete tree;
+    return 0;
+}
+
+/// The road of whoever holds contexts: tokens and nodes of the runtime.
+std::size_t parseWithContexts(const std::u16string& text) {
+    const pANTLR3_INPUT_STREAM input =
+        zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size()));
+    const pMSSQLLexer lexer = MSSQLLexerNew(input);
+    const pANTLR3_COMMON_TOKEN_STREAM tokens =
+        antlr3CommonTokenStreamSourceNew(1025, lexer->pLexer->rec->state->tokSource);
+    const pMSSQLParser parser = MSSQLParserNew(tokens);
     benchmark::DoNotOptimize(parser->start_rule(parser).tree);
-    const std::size_t count = pipeline.tokens->tokens->count;
     parser->free(parser);
-    return count;
+    tokens->free(tokens);
+    lexer->free(lexer);
+    input->close(input);
+    return 0;
 }
 
 std::size_t analyse(const std::u16string& text) {
     CZRQueryInfo query;
     query.SetSQL(CString(text.data(), static_cast<int>(text.size())));
-    BuildQueryInfo(&query, static_cast<DBTypes>(8));
+    BuildQueryInfo(&query, DB_MSSQL);
     benchmark::DoNotOptimize(query.m_selectItems.GetCount());
     return 0;
 }
@@ -67,7 +68,7 @@ std::size_t analyse(const std::u16string& text) {
 template <typename Run>
 void run(benchmark::State& state, const std::string& query, Run stage) {
     const std::u16string text = wide(query);
-    const std::size_t tokens = parse(text);
+    const std::size_t tokens = lex(text);
     for (auto _ : state) benchmark::DoNotOptimize(stage(text));
     state.counters["tokens"] = static_cast<double>(tokens);
     state.counters["ns/token"] =
@@ -95,7 +96,7 @@ void printGrowth() {
     std::printf("%-28s %6s %8s %10s %7s %10s %7s\n", "", "", "at 2n", "/token", "2n/n", "/token", "2n/n");
     for (const auto& family : zr::bench::families()) {
         const std::u16string one = wide(family.text(family.n)), two = wide(family.text(2 * family.n));
-        const std::size_t tokens = parse(two);
+        const std::size_t tokens = lex(two);
         const double p1 = seconds(&parse, one), p2 = seconds(&parse, two);
         const double a1 = seconds(&analyse, one), a2 = seconds(&analyse, two);
         std::printf("%-28s %6d %8zu %10.0f %7.2f %10.0f %7.2f\n", family.name, family.n, tokens,
@@ -109,9 +110,11 @@ void registerAll() {
         const std::string query = zr::bench::plainQuery(blocks);
         const std::string suffix = "/plain_" + std::to_string(blocks);
         benchmark::RegisterBenchmark(("lex" + suffix).c_str(),
-                                     [query](benchmark::State& s) { run(s, query, lexOnly); });
+                                     [query](benchmark::State& s) { run(s, query, lex); });
         benchmark::RegisterBenchmark(("parse" + suffix).c_str(),
                                      [query](benchmark::State& s) { run(s, query, parse); });
+        benchmark::RegisterBenchmark(("contexts" + suffix).c_str(),
+                                     [query](benchmark::State& s) { run(s, query, parseWithContexts); });
         benchmark::RegisterBenchmark(("analyse" + suffix).c_str(),
                                      [query](benchmark::State& s) { run(s, query, analyse); });
     }

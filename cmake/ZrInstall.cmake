@@ -39,3 +39,16 @@ if(ZR_BUILD_TOOLS)
   endif()
   install(TARGETS zrsql RUNTIME DESTINATION "${CMAKE_INSTALL_BINDIR}" COMPONENT tools)
 endif()
+
+# What a developer reads and starts from, in the folders in which the documents link to each other. The pictures of the
+# rules are there when they were drawn: the target zr_diagrams.
+set(zr_guides "${CMAKE_INSTALL_DATAROOTDIR}/doc/libzrparsersql-dev")
+install(FILES "${PROJECT_SOURCE_DIR}/README.md" DESTINATION "${zr_guides}" COMPONENT development)
+install(DIRECTORY "${PROJECT_SOURCE_DIR}/docs" DESTINATION "${zr_guides}" COMPONENT development FILES_MATCHING
+        PATTERN "*.md" PATTERN diagrams EXCLUDE PATTERN man EXCLUDE PATTERN completion EXCLUDE)
+install(DIRECTORY "${PROJECT_SOURCE_DIR}/examples" DESTINATION "${zr_guides}" COMPONENT development
+        PATTERN CMakeLists.txt EXCLUDE)
+install(FILES "${PROJECT_SOURCE_DIR}/examples/embed/CMakeLists.txt" DESTINATION "${zr_guides}/examples/embed"
+        COMPONENT development)
+install(DIRECTORY "${PROJECT_BINARY_DIR}/docs/diagrams" DESTINATION "${zr_guides}/docs" COMPONENT development OPTIONAL
+        FILES_MATCHING PATTERN "*.svg")

@@ -5,9 +5,26 @@ set(CPACK_GENERATOR DEB)
 set(CPACK_PACKAGE_NAME zrparsersql)
 set(CPACK_PACKAGE_VERSION ${PROJECT_VERSION})
 set(CPACK_PACKAGING_INSTALL_PREFIX /usr)
-# Who builds packages for others says who answers for them.
-set(ZR_MAINTAINER "ZRParserSQL authors <zrparsersql@example.org>" CACHE STRING "Maintainer of the Debian packages")
-set(CPACK_PACKAGE_CONTACT "${ZR_MAINTAINER}")
+# Who builds packages answers for them: as Debian's own tools are told, or as git knows them, or as this machine does.
+set(ZR_PACKAGE_MAINTAINER "" CACHE STRING "Maintainer of the Debian packages, as NAME <ADDRESS>")
+set(zr_maintainer "${ZR_PACKAGE_MAINTAINER}")
+if(NOT zr_maintainer AND DEFINED ENV{DEBFULLNAME} AND DEFINED ENV{DEBEMAIL})
+  set(zr_maintainer "$ENV{DEBFULLNAME} <$ENV{DEBEMAIL}>")
+endif()
+if(NOT zr_maintainer)
+  execute_process(COMMAND git -C "${PROJECT_SOURCE_DIR}" config user.name OUTPUT_VARIABLE zr_name
+                  OUTPUT_STRIP_TRAILING_WHITESPACE ERROR_QUIET)
+  execute_process(COMMAND git -C "${PROJECT_SOURCE_DIR}" config user.email OUTPUT_VARIABLE zr_address
+                  OUTPUT_STRIP_TRAILING_WHITESPACE ERROR_QUIET)
+  if(zr_name AND zr_address)
+    set(zr_maintainer "${zr_name} <${zr_address}>")
+  endif()
+endif()
+if(NOT zr_maintainer)
+  cmake_host_system_information(RESULT zr_machine QUERY FQDN)
+  set(zr_maintainer "ZRParserSQL builder <root@${zr_machine}>")
+endif()
+set(CPACK_PACKAGE_CONTACT "${zr_maintainer}")
 set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "") # each package has its own
 set(CPACK_STRIP_FILES ON)
 set(CPACK_COMPONENTS_ALL library development)
@@ -19,18 +36,21 @@ set(CPACK_DEB_COMPONENT_INSTALL ON)
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
 set(CPACK_DEBIAN_PACKAGE_RELEASE 1)
 set(CPACK_DEBIAN_PACKAGE_PRIORITY optional)
-set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS ON)
 set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS_PRIVATE_DIRS "${PROJECT_BINARY_DIR}/lib")
 set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
 
 # What a package needs is read off its binaries; what the other two need of the library is told here.
 set(zr_debian_version "${PROJECT_VERSION}-${CPACK_DEBIAN_PACKAGE_RELEASE}")
 set(zr_same_library "libzrparsersql (= ${zr_debian_version})")
+# What a package that links the library needs: class layouts hold within one minor version.
+math(EXPR zr_next_minor "${PROJECT_VERSION_MINOR} + 1")
+configure_file("${PROJECT_SOURCE_DIR}/cmake/debian/shlibs.in" "${PROJECT_BINARY_DIR}/package/shlibs" @ONLY)
 
 set(CPACK_DEBIAN_LIBRARY_PACKAGE_NAME libzrparsersql)
 set(CPACK_DEBIAN_LIBRARY_PACKAGE_SECTION libs)
 set(CPACK_DEBIAN_LIBRARY_PACKAGE_SHLIBDEPS ON)
-set(CPACK_DEBIAN_LIBRARY_PACKAGE_CONTROL_EXTRA "${PROJECT_SOURCE_DIR}/cmake/debian/triggers")
+set(CPACK_DEBIAN_LIBRARY_PACKAGE_CONTROL_EXTRA "${PROJECT_SOURCE_DIR}/cmake/debian/triggers"
+                                               "${PROJECT_BINARY_DIR}/package/shlibs")
 set(CPACK_DEBIAN_LIBRARY_DESCRIPTION
     "analysis of SQL query text of five dialects
 The library reads the text of a query as MySQL, MS Access, PostgreSQL, SQL
@@ -75,9 +95,11 @@ if(ZR_GZIP)
 endif()
 foreach(component IN LISTS CPACK_COMPONENTS_ALL)
   string(TOUPPER ${component} zr_upper)
-  set(zr_doc_dir "${CMAKE_INSTALL_DATAROOTDIR}/doc/${CPACK_DEBIAN_${zr_upper}_PACKAGE_NAME}")
-  install(FILES "${PROJECT_SOURCE_DIR}/cmake/debian/copyright" ${zr_changes} DESTINATION "${zr_doc_dir}"
-          COMPONENT ${component})
+  set(zr_package "${CPACK_DEBIAN_${zr_upper}_PACKAGE_NAME}")
+  install(FILES "${PROJECT_SOURCE_DIR}/cmake/debian/copyright" ${zr_changes}
+          DESTINATION "${CMAKE_INSTALL_DATAROOTDIR}/doc/${zr_package}" COMPONENT ${component})
+  install(FILES "${PROJECT_SOURCE_DIR}/cmake/debian/${zr_package}.lintian-overrides"
+          DESTINATION "${CMAKE_INSTALL_DATAROOTDIR}/lintian/overrides" RENAME ${zr_package} COMPONENT ${component})
 endforeach()
 
 include(CPack)

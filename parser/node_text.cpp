@@ -1,110 +1,104 @@
 #include "parser/node_text.h"
 
 #include <algorithm>
+#include <cstdint>
+#include <string_view>
 #include <utility>
 
-#include "parser/token_text.h"
 #include "parser/tree_view.h"
 
 namespace zr {
 
 namespace {
 
-using Token = ANTLR3_COMMON_TOKEN;
+using engine::LexedText;
+using engine::SyntaxNode;
+using engine::SyntaxTree;
 
-// The tokens of a query by their number.
-class TokenRow {
- public:
-    explicit TokenRow(pANTLR3_COMMON_TOKEN_STREAM stream) : tokens_(stream ? stream->tokens : nullptr) {}
+// Numbers of tokens; a place ahead of the first one is one as well.
+using TokenIndex = std::int64_t;
 
-    // A token that the grammar saw and that was read from the text, or null.
-    const Token* at(ANTLR3_MARKER index) const {
-        if (!tokens_ || index < 0) return nullptr;
-        const auto* token =
-            static_cast<const Token*>(tokens_->get(tokens_, static_cast<ANTLR3_UINT32>(index)));
-        return token && token->channel == ANTLR3_TOKEN_DEFAULT_CHANNEL && wasRead(*token) ? token : nullptr;
-    }
-    static bool wasRead(const Token& token) { return token.start != 0 && token.input; }
-
- private:
-    pANTLR3_VECTOR tokens_;
-};
-
-const char16_t* unitsBegin(const Token& token) {
-    return reinterpret_cast<const char16_t*>(token.start);
+// A view over a node of the engine's, and null for any other view.
+const TreeView* nodeBehind(CZRSQLTree& view) {
+    const TreeView* behind = TreeView::of(view);
+    return behind && behind->node() != TreeView::kNoNode ? behind : nullptr;
 }
-const char16_t* unitsEnd(const Token& token) {
-    return unitsBegin(token) + tokenUnits(token).size();
+
+// Whether the grammar saw a token of that number.
+bool isSeen(const LexedText& text, TokenIndex index) {
+    return index >= 0 && index < text.count() && !text.isHidden(static_cast<std::uint32_t>(index));
+}
+
+CString plainText(ViewStore& store, SyntaxNode node) {
+    const SyntaxTree& tree = *store.tree();
+    return tree.isToken(node) ? store.textOf(node) : CString(tree.name(node));
 }
 
 // Puts the texts of a node's children together.
 class Joiner {
  public:
-    explicit Joiner(const TokenRow& row) : row_(row) {}
+    explicit Joiner(ViewStore& store) : store_(store), tree_(*store.tree()), text_(tree_.text()) {}
 
     // From behind this token on, characters that no token took count.
-    void startBehind(const Token& token) { last_ = &token; }
-    void add(ANTLR3_BASE_TREE& child) {
-        Token* token = child.getToken(&child);
-        if (token && TokenRow::wasRead(*token)) {
-            addGapsUpTo(*token);
-            text_ += tokenText(*token);
-            last_ = token;
+    void startBehind(TokenIndex token) { last_ = token; }
+    void add(SyntaxNode child) {
+        if (tree_.isToken(child)) {
+            addGapsUpTo(tree_.tokenOf(child));
+            joined_ += store_.textOf(child);
+            last_ = tree_.tokenOf(child);
         } else {
-            text_ += nodeText(child);
-            last_ = nullptr;
+            joined_ += CString(tree_.name(child));
+            last_ = kNone;
         }
     }
-    void addGapsUpTo(const Token& token) {
-        if (!last_) return;
+    void addGapsUpTo(TokenIndex token) {
+        if (last_ == kNone) return;
         // Tokens between the two took their characters, whether they are in the tree or not. Hidden ones
-        // reached no grammar: row_ leaves them out, and so what they cover counts.
-        const char16_t* from = unitsEnd(*last_);
-        for (ANTLR3_MARKER index = last_->index + 1; index <= token.index; ++index) {
-            const Token* next = row_.at(index);
-            if (!next) continue;
-            if (unitsBegin(*next) > from)
-                text_ += std::u16string_view(from, static_cast<std::size_t>(unitsBegin(*next) - from));
-            from = std::max(from, unitsEnd(*next));
+        // reached no grammar, and so what they cover counts.
+        std::uint32_t from = text_.token(static_cast<std::uint32_t>(last_)).to;
+        for (TokenIndex index = last_ + 1; index <= token; ++index) {
+            if (!isSeen(text_, index)) continue;
+            const engine::LexedToken& next = text_.token(static_cast<std::uint32_t>(index));
+            if (next.from > from) joined_ += text_.text().substr(from, next.from - from);
+            from = std::max(from, next.to);
         }
     }
-    CString text() && { return std::move(text_); }
+    CString text() && { return std::move(joined_); }
 
  private:
-    const TokenRow& row_;
-    const Token* last_ = nullptr;
-    CString text_;
+    static constexpr TokenIndex kNone = -1;
+
+    ViewStore& store_;
+    const SyntaxTree& tree_;
+    const LexedText& text_;
+    TokenIndex last_ = kNone;
+    CString joined_;
 };
 
-bool isLoneQuote(const Token* token) {
-    if (!token) return false;
-    const std::u16string_view units = tokenUnits(*token);
+bool isLoneQuote(const LexedText& text, TokenIndex index) {
+    if (!isSeen(text, index)) return false;
+    const std::u16string_view units = text.unitsOf(static_cast<std::uint32_t>(index));
     return units == u"'" || units == u"\"";
 }
 
-// The quote tokens around a string's children, each null when the quotes are part of the child's own token.
+// The quote tokens around a string's children, each -1 when the quotes are part of the child's own token.
 struct Quotes {
-    const Token* open = nullptr;
-    const Token* close = nullptr;
+    TokenIndex open = -1;
+    TokenIndex close = -1;
 };
 
-Quotes quotesOf(ANTLR3_BASE_TREE& string, const TokenRow& row) {
-    const auto& tree = *static_cast<pANTLR3_COMMON_TREE>(string.super);
+Quotes quotesOf(const SyntaxTree& tree, SyntaxNode string) {
+    const LexedText& text = tree.text();
     // The tokens of the string. A tree builder that notes no boundaries leaves both 0.
-    ANTLR3_MARKER first = tree.startIndex;
-    ANTLR3_MARKER last = tree.stopIndex;
+    TokenIndex first = tree.span(string).first;
+    TokenIndex last = tree.span(string).last;
     const bool isBounded = last > first;
     // Where the children begin and end: the quotes stand outside.
-    ANTLR3_MARKER openEnd = last, closeBegin = first;
-    const ANTLR3_UINT32 count = string.getChildCount(&string);
-    if (count) {
-        auto* head = static_cast<pANTLR3_BASE_TREE>(string.getChild(&string, 0));
-        auto* tail = static_cast<pANTLR3_BASE_TREE>(string.getChild(&string, count - 1));
-        const Token* headToken = head->getToken(head);
-        const Token* tailToken = tail->getToken(tail);
-        if (!headToken || !tailToken) return {};
-        openEnd = headToken->index - 1;
-        closeBegin = tailToken->index + 1;
+    TokenIndex openEnd = last, closeBegin = first;
+    if (const std::uint32_t count = tree.childCount(string)) {
+        const SyntaxNode head = tree.firstChild(string);
+        openEnd = static_cast<TokenIndex>(tree.tokenOf(head)) - 1;
+        closeBegin = static_cast<TokenIndex>(tree.tokenOf(head + count - 1)) + 1;
         if (!isBounded) {
             first = openEnd;
             last = closeBegin;
@@ -113,47 +107,49 @@ Quotes quotesOf(ANTLR3_BASE_TREE& string, const TokenRow& row) {
         return {};
     }
     Quotes quotes;
-    for (ANTLR3_MARKER index = first; index <= openEnd && !quotes.open; ++index)
-        if (isLoneQuote(row.at(index))) quotes.open = row.at(index);
-    for (ANTLR3_MARKER index = last; index >= closeBegin && !quotes.close; --index)
-        if (isLoneQuote(row.at(index))) quotes.close = row.at(index);
+    for (TokenIndex index = first; index <= openEnd && quotes.open < 0; ++index)
+        if (isLoneQuote(text, index)) quotes.open = index;
+    for (TokenIndex index = last; index >= closeBegin && quotes.close < 0; --index)
+        if (isLoneQuote(text, index)) quotes.close = index;
     return quotes;
 }
 
 template <class Visit>
-void forEachChild(ANTLR3_BASE_TREE& node, Visit visit) {
-    const ANTLR3_UINT32 count = node.getChildCount(&node);
-    for (ANTLR3_UINT32 index = 0; index < count; ++index)
-        visit(*static_cast<pANTLR3_BASE_TREE>(node.getChild(&node, index)));
+void forEachChild(const SyntaxTree& tree, SyntaxNode node, Visit visit) {
+    const SyntaxNode first = tree.firstChild(node);
+    for (std::uint32_t index = 0; index < tree.childCount(node); ++index) visit(first + index);
 }
 
 }  // namespace
 
 CString joinedText(CZRSQLTree& name) {
-    const auto* view = dynamic_cast<TreeView*>(&name);
-    if (!view || !view->tree()) return concatenatedText(name);
-    const TokenRow row(view->tokens());
-    Joiner joiner(row);
-    forEachChild(*view->tree(), [&](ANTLR3_BASE_TREE& child) { joiner.add(child); });
+    const TreeView* view = nodeBehind(name);
+    if (!view) return concatenatedText(name);
+    const SyntaxTree& tree = *view->store().tree();
+    // Most names are one token.
+    if (tree.childCount(view->node()) == 1) return plainText(view->store(), tree.firstChild(view->node()));
+    Joiner joiner(view->store());
+    forEachChild(tree, view->node(), [&](SyntaxNode child) { joiner.add(child); });
     return std::move(joiner).text();
 }
 
 CString quotedText(CZRSQLTree& string) {
-    const auto* view = dynamic_cast<TreeView*>(&string);
-    if (!view || !view->tree()) return concatenatedText(string);
-    const TokenRow row(view->tokens());
-    const Quotes quotes = quotesOf(*view->tree(), row);
-    Joiner joiner(row);
-    if (quotes.open) joiner.startBehind(*quotes.open);
-    forEachChild(*view->tree(), [&](ANTLR3_BASE_TREE& child) { joiner.add(child); });
-    if (quotes.close && quotes.close != quotes.open) joiner.addGapsUpTo(*quotes.close);
+    const TreeView* view = nodeBehind(string);
+    if (!view) return concatenatedText(string);
+    const SyntaxTree& tree = *view->store().tree();
+    const Quotes quotes = quotesOf(tree, view->node());
+    Joiner joiner(view->store());
+    if (quotes.open >= 0) joiner.startBehind(quotes.open);
+    forEachChild(tree, view->node(), [&](SyntaxNode child) { joiner.add(child); });
+    if (quotes.close >= 0 && quotes.close != quotes.open) joiner.addGapsUpTo(quotes.close);
     return std::move(joiner).text();
 }
 
 CString concatenatedText(CZRSQLTree& node) {
     CString text;
-    if (const auto* view = dynamic_cast<TreeView*>(&node); view && view->tree()) {
-        forEachChild(*view->tree(), [&](ANTLR3_BASE_TREE& child) { text += nodeText(child); });
+    if (const TreeView* view = nodeBehind(node)) {
+        const SyntaxTree& tree = *view->store().tree();
+        forEachChild(tree, view->node(), [&](SyntaxNode child) { text += plainText(view->store(), child); });
         return text;
     }
     const unsigned int count = node.GetChildCount();

@@ -2,22 +2,22 @@
 
 #include <new>
 
+#include "parser/grammars.h"
 #include "parser/parser_imp.h"
-#include "parser/recognizers.h"
 #include "parser/tree_view.h"
 
-class CZROracleParserImp final : public zr::ParserImp<zr::OracleRecognizers, CZROracleTree> {};
-class CZRMySQLParcerImp final : public zr::ParserImp<zr::MySqlRecognizers, CZRMySQLTree> {};
-class CZRPostgreParserImp final : public zr::ParserImp<zr::PostgreSqlRecognizers, CZRPostgreTree> {};
+class CZROracleParserImp final : public zr::ParserImp<zr::grammars::Oracle, CZROracleTree> {};
+class CZRMySQLParcerImp final : public zr::ParserImp<zr::grammars::MySQLSelect, CZRMySQLTree> {};
+class CZRPostgreParserImp final : public zr::ParserImp<zr::grammars::PostgreSQL, CZRPostgreTree> {};
 class CZRMSAccessSQL_v3ParcerImp final
-    : public zr::ParserImp<zr::MsAccessRecognizers, CZRMSAccessSQL_v3Tree> {};
+    : public zr::ParserImp<zr::grammars::MSAccessSQL_v3, CZRMSAccessSQL_v3Tree> {};
 
-class CZRMSSQLParserImp final : public zr::ParserImp<zr::MssqlRecognizers, CZRMSSQLTree> {
+class CZRMSSQLParserImp final : public zr::ParserImp<zr::grammars::MSSQL, CZRMSSQLTree> {
  public:
-    void GetSQLFromTree(CZRSQLTree** out) { *out = newView(m_fromResult.tree, nullptr); }
+    void GetSQLFromTree(CZRSQLTree** out) { *out = newView(m_fromResult); }
 
  private:
-    ZRRuleReturn m_fromResult{};  // never filled; hosts get their empty view over it
+    const zr::engine::SyntaxTree* m_fromResult = nullptr;  // never filled; hosts get their empty view over it
 };
 
 // A facade hands everything on to the object behind it. On an exhausted heap there is none, and nothing

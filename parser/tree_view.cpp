@@ -1,57 +1,59 @@
 #include "parser/tree_view.h"
 
-#include <algorithm>
-#include <utility>
-
-#include "parser/token_text.h"
+#include <typeinfo>
 
 namespace zr {
 
-namespace {
-constexpr std::size_t kFirstBlock = 4 * 1024;
-constexpr std::size_t kLargestBlock = 256 * 1024;
-}  // namespace
+void ViewStore::makePlaces() {
+    // Memory that no view comes to stays untouched.
+    if (!views_) views_.reset(new std::byte[tree_->nodeCount() * sizeof(TreeView)]);
+}
 
-void* ViewStore::allocate(std::size_t bytes) {
-    bytes = (bytes + alignof(void*) - 1) / alignof(void*) * alignof(void*);
-    if (bytes > left_) {
-        const std::size_t usual =
-            std::min(kFirstBlock << std::min<std::size_t>(blocks_.size(), 6), kLargestBlock);
-        const std::size_t size = std::max(usual, bytes);
-        std::unique_ptr<std::byte[]> block(new std::byte[size]);
-        blocks_.push_back(std::move(block));
-        free_ = blocks_.back().get();
-        left_ = size;
-    }
-    void* place = free_;
-    free_ += bytes;
-    left_ -= bytes;
-    return place;
+CString ViewStore::textOf(engine::SyntaxNode node) {
+    // Longer texts are mostly strings, which come once.
+    constexpr std::size_t kLongestShared = 24;
+    const std::u16string_view text = tree_->tokenText(node);
+    if (text.size() > kLongestShared) return CString(text);
+    CString& known = texts_[CString::hash(text) % texts_.size()];
+    if (known.View() != text) known = text;
+    return known;
 }
 
 CZRSQLTree* TreeView::GetChild(unsigned int index) {
-    if (!m_children) {
-        childCount_ = GetChildCount();
-        if (childCount_)
-            m_children = new (store_->allocate(childCount_ * sizeof(TreeView*))) TreeView*[childCount_]();
+    const unsigned int count = TreeView::GetChildCount();
+    if (index >= count) {
+        std::unique_ptr<CZRSQLTree>& view = store_->beyond(*this, index);
+        if (!view) view = viewOverNoNode();
+        return view.get();
     }
-    const bool isThere = index < childCount_;
-    TreeView*& view = isThere ? m_children[index] : store_->beyond(*this, index);
-    if (!view)
-        view = makeView(isThere ? static_cast<pANTLR3_BASE_TREE>(m_tree->getChild(m_tree, index)) : nullptr);
-    return view;
+    const engine::SyntaxNode first = tree().firstChild(node_);
+    if (!hasChildren_) {
+        makeViews(first, count);
+        hasChildren_ = true;
+    }
+    return reinterpret_cast<TreeView*>(store_->placeOf(first + index));
+}
+
+const TreeView* TreeView::of(const CZRSQLTree& view) {
+    // The walk asks for each name. A look at the class is a tenth of a cast that goes up from it.
+    const std::type_info* const kind = &typeid(view);
+    for (const std::type_info* known : {&typeid(CZRMSSQLTree), &typeid(CZROracleTree), &typeid(CZRMySQLTree),
+                                        &typeid(CZRPostgreTree), &typeid(CZRMSAccessSQL_v3Tree)})
+        if (kind == known) return static_cast<const TreeView*>(&view);
+    return dynamic_cast<const TreeView*>(&view);
 }
 
 unsigned int TreeView::GetChildCount() {
-    return m_tree ? m_tree->getChildCount(m_tree) : 0;
+    return node_ == kNoNode ? 0 : tree().childCount(node_);
 }
 
 CString TreeView::GetText() {
-    return m_tree ? nodeText(*m_tree) : CString(u" ");
+    if (node_ == kNoNode) return CString(u" ");
+    return tree().isToken(node_) ? store_->textOf(node_) : CString(tree().name(node_));
 }
 
 unsigned int TreeView::GetType() {
-    return m_tree ? m_tree->getType(m_tree) : 0;
+    return node_ == kNoNode ? 0 : tree().type(node_);
 }
 
 }  // namespace zr

@@ -1,31 +1,37 @@
 #pragma once
 
-#include <antlr3.h>
-
+#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <memory>
 #include <new>
+#include <string_view>
 #include <unordered_map>
-#include <vector>
 
+#include "grammar/engine/syntax_tree.h"
 #include "zrparsersql/sql_tree.h"
 
 namespace zr {
 
 class TreeView;
 
-// What all views of one tree share: the memory they live in, freed at one stroke with the root view, and the
-// tokens the tree was built from.
+// What all views of one tree share: the memory they live in, freed at one stroke with the root view.
 class ViewStore {
  public:
-    explicit ViewStore(pANTLR3_COMMON_TOKEN_STREAM tokens) : tokens_(tokens) {}
+    explicit ViewStore(const engine::SyntaxTree* tree) : tree_(tree) {}
 
-    // Aligned for pointers; holds as long as the store.
-    void* allocate(std::size_t bytes);
+    // Null where there is no tree.
+    const engine::SyntaxTree* tree() const { return tree_; }
+    // Makes places for the views of all nodes, unless they are there.
+    void makePlaces();
+    // Where the view of a node has its place, as long as the store. Nodes in a row have theirs in a row.
+    std::byte* placeOf(engine::SyntaxNode node) const;
     // Place for the view of a child that is not there.
-    TreeView*& beyond(const TreeView& parent, unsigned int index) { return beyond_[{&parent, index}]; }
-    pANTLR3_COMMON_TOKEN_STREAM tokens() const { return tokens_; }
+    std::unique_ptr<CZRSQLTree>& beyond(const TreeView& parent, unsigned int index) {
+        return beyond_[{&parent, index}];
+    }
+    // The text of a token's node. Texts that come again share their buffers.
+    CString textOf(engine::SyntaxNode node);
 
  private:
     struct Place {
@@ -39,25 +45,24 @@ class ViewStore {
         }
     };
 
-    pANTLR3_COMMON_TOKEN_STREAM tokens_;  // not owned; null where there is no tree
-    std::vector<std::unique_ptr<std::byte[]>> blocks_;
-    std::byte* free_ = nullptr;
-    std::size_t left_ = 0;
-    std::unordered_map<Place, TreeView*, PlaceHash> beyond_;
+    const engine::SyntaxTree* tree_;  // not owned
+    std::unique_ptr<std::byte[]> views_;
+    std::array<CString, 64> texts_;  // those asked for last, by hash
+    std::unordered_map<Place, std::unique_ptr<CZRSQLTree>, PlaceHash> beyond_;
 };
 
 // The one implementation of the dialects' views. A view over no node answers like a leaf.
 class TreeView : public CZRSQLTree {
  public:
     // A root view; a null tree gives a view over no node.
-    TreeView(pANTLR3_BASE_TREE tree, pANTLR3_COMMON_TOKEN_STREAM tokens)
-        : m_tree(tree), store_(new ViewStore(tokens)), isRoot_(true) {}
+    explicit TreeView(const engine::SyntaxTree* tree)
+        : store_(new ViewStore(tree)), node_(tree ? engine::SyntaxTree::root() : kNoNode), isRoot_(true) {}
     // A view below a root.
-    TreeView(pANTLR3_BASE_TREE tree, ViewStore& store) : m_tree(tree), store_(&store), isRoot_(false) {}
+    TreeView(engine::SyntaxNode node, ViewStore& store) : store_(&store), node_(node), isRoot_(false) {}
     TreeView(const TreeView&) = delete;
     TreeView& operator=(const TreeView&) = delete;
-    // Frees the views below a root; the runtime's nodes are the parser's. Views below a root own nothing by
-    // themselves and end with their memory, so that depth costs nothing here.
+    // Frees the views below a root; the nodes are the parser's. Views below a root own nothing by themselves
+    // and end with their memory, so that depth costs nothing here.
     ~TreeView() override {
         if (isRoot_) delete store_;
     }
@@ -67,20 +72,23 @@ class TreeView : public CZRSQLTree {
     CString GetText() override;
     unsigned int GetType() override;
 
-    pANTLR3_BASE_TREE tree() const { return m_tree; }
-    pANTLR3_COMMON_TOKEN_STREAM tokens() const { return store_->tokens(); }
+    // The view as one of these, or null where it is none.
+    static const TreeView* of(const CZRSQLTree& view);
 
- protected:
-    ViewStore& store() { return *store_; }
+    static constexpr engine::SyntaxNode kNoNode = 0xFFFFFFFF;
+
+    engine::SyntaxNode node() const { return node_; }
+    ViewStore& store() const { return *store_; }
 
  private:
-    // A view of the object's own class, in the store.
-    virtual TreeView* makeView(pANTLR3_BASE_TREE tree) = 0;
+    const engine::SyntaxTree& tree() const { return *store_->tree(); }
+    // Views of the object's own class, for nodes in a row at their places.
+    virtual void makeViews(engine::SyntaxNode first, unsigned int count) = 0;
+    virtual std::unique_ptr<CZRSQLTree> viewOverNoNode() = 0;
 
-    pANTLR3_BASE_TREE m_tree;
     ViewStore* store_;
-    TreeView** m_children = nullptr;  // one a child, null until it is asked for
-    unsigned int childCount_ = 0;
+    engine::SyntaxNode node_;
+    bool hasChildren_ = false;  // their views are made
     bool isRoot_;
 };
 
@@ -90,11 +98,20 @@ class ViewOf : public TreeView {
     using TreeView::TreeView;
 
  private:
-    TreeView* makeView(pANTLR3_BASE_TREE tree) override {
-        static_assert(alignof(Self) <= alignof(void*));
-        return new (store().allocate(sizeof(Self))) Self(tree, store());
+    void makeViews(engine::SyntaxNode first, unsigned int count) override {
+        static_assert(sizeof(Self) == sizeof(TreeView) && alignof(Self) <= alignof(std::max_align_t));
+        store().makePlaces();
+        std::byte* place = store().placeOf(first);
+        for (unsigned int i = 0; i < count; ++i, place += sizeof(Self)) new (place) Self(first + i, store());
+    }
+    std::unique_ptr<CZRSQLTree> viewOverNoNode() override {
+        return std::unique_ptr<CZRSQLTree>(new Self(kNoNode, store()));
     }
 };
+
+inline std::byte* ViewStore::placeOf(engine::SyntaxNode node) const {
+    return views_.get() + node * sizeof(TreeView);
+}
 
 }  // namespace zr
 

@@ -2,8 +2,6 @@
 
 #include <atomic>
 
-#include "zrparsersql/message_box.h"
-
 #if defined(_WIN32)
 #include <windows.h>
 #endif
@@ -15,8 +13,12 @@ std::atomic<ZRMessageBoxFunction> currentFunction{nullptr};
 
 }  // namespace
 
-ZRMessageBoxFunction zrSetMessageBoxFunction(ZRMessageBoxFunction function) {
+ZRMessageBoxFunction zr::exchangeMessageBox(ZRMessageBoxFunction function) {
     return currentFunction.exchange(function);
+}
+
+ZRMessageBoxFunction zr::currentMessageBox() {
+    return currentFunction.load();
 }
 
 int zr::showMessageBox(void* owner, const char16_t* text, const char16_t* caption, std::uint32_t style) {

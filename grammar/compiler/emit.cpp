@@ -165,9 +165,12 @@ class Emitter {
         names[3] = "<UP>";
         for (const auto& entry : vocabulary_.entries) names[index(entry.number)] = entry.name;
         array(o, "char* const", "tokenNames", names, [&](const std::string& n) { o << cString(n); });
-        o << "const GrammarTable grammar{" << cString(g_) << ", " << cString(baseName(lexer_.file)) << ", "
-          << cString(baseName(parser_.rules[0].file)) << ", tokenNames, &lexer, &parser};\n";
         o << "}  // namespace tables\n}  // namespace\n\n";
+        // The one name that reaches beyond the source, for those of the library who need no context.
+        o << "namespace zr::grammars {\nextern const zr::engine::GrammarTable " << g_ << ";\n"
+          << "const zr::engine::GrammarTable " << g_ << "{" << cString(g_) << ", "
+          << cString(baseName(lexer_.file)) << ", " << cString(baseName(parser_.rules[0].file))
+          << ", tables::tokenNames, &tables::lexer, &tables::parser};\n}  // namespace zr::grammars\n\n";
         contexts(o);
         return o.str();
     }
@@ -358,21 +361,23 @@ class Emitter {
         o << "void bindLexer(" << lexer << "& ctx) {\n";
         for (std::size_t i = 0; i < lexer_.rules.size(); ++i)
             o << "    ctx." << lexerEntry(lexer_.rules[i]) << " = &LexerGlue::entry<" << i << ">;\n";
-        o << "    ctx.getGrammarFileName = [] { return tables::grammar.lexerFile; };\n}\n\n";
+        o << "    ctx.getGrammarFileName = [] { return zr::grammars::" << g_
+          << ".lexerFile; };\n}\n\n";
         o << "void bindParser(" << parser << "& ctx) {\n";
         for (std::size_t i = 0; i < parser_.rules.size(); ++i)
             o << "    ctx." << parserEntry(parser_.rules[i].name) << " = &ParserGlue::entry<" << i << ">;\n";
-        o << "    ctx.getGrammarFileName = [] { return tables::grammar.parserFile; };\n}\n}  // "
+        o << "    ctx.getGrammarFileName = [] { return zr::grammars::" << g_
+          << ".parserFile; };\n}\n}  // "
              "namespace\n\n";
         o << "extern \"C\" {\n";
         o << "p" << lexer << " " << lexer
           << "NewSSD(pANTLR3_INPUT_STREAM input, pANTLR3_RECOGNIZER_SHARED_STATE state) {\n"
-          << "    return LexerGlue::create(tables::grammar, input, state, &bindLexer);\n}\n";
+          << "    return LexerGlue::create(zr::grammars::" << g_ << ", input, state, &bindLexer);\n}\n";
         o << "p" << lexer << " " << lexer << "New(pANTLR3_INPUT_STREAM input) { return " << lexer
           << "NewSSD(input, nullptr); }\n";
         o << "p" << parser << " " << parser
           << "NewSSD(pANTLR3_COMMON_TOKEN_STREAM tokens, pANTLR3_RECOGNIZER_SHARED_STATE state) {\n"
-          << "    return ParserGlue::create(tables::grammar, tokens, state, &bindParser);\n}\n";
+          << "    return ParserGlue::create(zr::grammars::" << g_ << ", tokens, state, &bindParser);\n}\n";
         o << "p" << parser << " " << parser << "New(pANTLR3_COMMON_TOKEN_STREAM tokens) { return " << parser
           << "NewSSD(tokens, nullptr); }\n}\n";
     }

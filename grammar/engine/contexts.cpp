@@ -1,41 +1,31 @@
 #include "grammar/engine/contexts.h"
 
 #include <new>
-#include <string>
+#include <string_view>
+#include <vector>
 
 #include "grammar/engine/diagnostics.h"
-#include "grammar/engine/recogniser.h"
-#include "grammar/engine/tree_builder.h"
+#include "grammar/engine/rule_reading.h"
+#include "grammar/engine/runtime_place.h"
 
 namespace zr::engine {
 namespace {
-
-void appendNumber(std::u16string& to, std::uint32_t number) {
-    for (const char c : std::to_string(number)) to.push_back(static_cast<char16_t>(c));
-}
 
 /// Stands in for the runtime's printer: the one place where reports of a recogniser become text.
 void displayRecognitionError(pANTLR3_BASE_RECOGNIZER recogniser, pANTLR3_UINT8*) {
     if (!zr::diagnosticsWanted() || recogniser->state->exception == nullptr) return;
     const pANTLR3_EXCEPTION e = recogniser->state->exception;
-    std::u16string text;
-    appendNumber(text, static_cast<std::uint32_t>(e->line));
-    text += u":";
-    // The runtime counts the columns of the first line from -1.
-    appendNumber(text, static_cast<std::uint32_t>(e->charPositionInLine + (e->line == 1 ? 1 : 0)));
-    text += u": no way to read on";
-    if (recogniser->type == ANTLR3_TYPE_PARSER && e->token != nullptr) {
-        const auto* token = static_cast<pANTLR3_COMMON_TOKEN>(e->token);
-        if (token->type == ANTLR3_TOKEN_EOF) {
-            text += u" at the end of the text";
-        } else if (token->start != 0 && token->stop >= token->start) {
-            text += u" at '";
-            text.append(reinterpret_cast<const char16_t*>(token->start),
-                        reinterpret_cast<const char16_t*>(token->stop) + 1);
-            text += u"'";
-        }
+    const auto* token =
+        recogniser->type == ANTLR3_TYPE_PARSER ? static_cast<pANTLR3_COMMON_TOKEN>(e->token) : nullptr;
+    if (token != nullptr && token->type == ANTLR3_TOKEN_EOF)
+        return reportUnreadableEnd(static_cast<std::uint32_t>(e->line));
+    std::u16string_view units;
+    if (token != nullptr && token->start != 0 && token->stop >= token->start) {
+        const auto* first = reinterpret_cast<const char16_t*>(token->start);
+        const auto* last = reinterpret_cast<const char16_t*>(token->stop);
+        units = {first, static_cast<std::size_t>(last - first) + 1};
     }
-    zr::diagnose(text);
+    reportUnreadable(placeOf(static_cast<ANTLR3_UINT32>(e->line), e->charPositionInLine), units);
 }
 
 /// The on-channel tokens of the stream from its position on.
@@ -61,69 +51,23 @@ struct Tokens {
     }
 };
 
-class RuleRun final : TreeBuilder::ErrorNodes {
+/// The runtime's nodes, made by its adaptor.
+class RuntimeTree {
  public:
-    RuleRun(const ParserState& state)
-        : state_(state), table_(*state.grammar->parser), stream_(state.parser->tstream), tokens_(stream_) {}
+    using Node = pANTLR3_BASE_TREE;
 
-    ZRRuleReturn run(std::uint16_t rule) {
-        const bool start = rule == table_.startRule;
-        const std::uint16_t wanted = start ? table_.statementRule : rule;
-        if (tokens_.list.size() > state_.options.maxTokens) return failed(0);
-        Recogniser recogniser(table_, tokens_.types, state_.options);
-        Recogniser::Result result = recogniser.run(wanted, 0);
-        if (result.found || result.overLimit || !start || table_.recoverRule == kNone16)
-            return finish(recogniser, result, start);
-        // Nothing reads the statement: its mandatory part is left to recovery.
-        Recogniser recovering(table_, tokens_.types, state_.options);
-        result = recovering.recover(wanted, 0);
-        return finish(recovering, result, start);
+    RuntimeTree(const ParserState& state, pANTLR3_TOKEN_STREAM stream, const Tokens& tokens)
+        : state_(state), adaptor_(state.adaptor), stream_(stream), tokens_(tokens) {}
+
+    Node token(std::uint32_t position) { return leaf(tokens_.list[position]); }
+    Node end() { return leaf(tokens_.endOfFile); }
+    Node imaginary(std::uint16_t type) {
+        const char* name = state_.grammar->tokenNames[type];
+        return static_cast<Node>(adaptor_->createTypeText(
+            adaptor_, type, reinterpret_cast<pANTLR3_UINT8>(const_cast<char*>(name))));
     }
-
- private:
-    ZRRuleReturn finish(const Recogniser& recogniser, const Recogniser::Result& result, bool start) {
-        if (result.overBudget) zr::diagnose(u"the search for the furthest reading was cut short");
-        if (!result.found) return failed(0);
-        TreeBuilder builder(*state_.grammar, recogniser, tokens_.list, state_.adaptor);
-        std::vector<pANTLR3_BASE_TREE> roots = builder.build(result, *this);
-        const auto count = static_cast<std::uint32_t>(tokens_.list.size());
-        std::uint32_t end = result.high;
-        if (start) {
-            if (table_.keepTail) {
-                for (std::uint32_t i = end; i < count; ++i) roots.push_back(leaf(tokens_.list[i]));
-                roots.push_back(leaf(tokens_.endOfFile));
-            }
-            end = count;
-        }
-        moveTo(end);
-        ZRRuleReturn value{nullptr, nullptr, single(roots)};
-        if (count != 0) value.start = tokens_.list[0];
-        if (end != 0) value.stop = tokens_.list[end - 1];
-        if (value.tree != nullptr && value.start != nullptr && value.stop != nullptr)
-            state_.adaptor->setTokenBoundaries(state_.adaptor, value.tree, value.start, value.stop);
-        return value;
-    }
-
-    pANTLR3_BASE_TREE leaf(pANTLR3_COMMON_TOKEN token) const {
-        return static_cast<pANTLR3_BASE_TREE>(state_.adaptor->create(state_.adaptor, token));
-    }
-
-    /// One root stands for itself, several go under a nil node.
-    pANTLR3_BASE_TREE single(const std::vector<pANTLR3_BASE_TREE>& roots) const {
-        if (roots.size() == 1) return roots[0];
-        const auto nil = static_cast<pANTLR3_BASE_TREE>(state_.adaptor->nilNode(state_.adaptor));
-        for (pANTLR3_BASE_TREE root : roots) state_.adaptor->addChild(state_.adaptor, nil, root);
-        return nil;
-    }
-
-    /// The whole rule failed at its first token: the error node is its tree, and nothing is taken.
-    ZRRuleReturn failed(std::uint32_t at) {
-        ZRRuleReturn value{nullptr, nullptr, errorNode(at, at)};
-        value.start = value.stop = tokens_.list.empty() ? tokens_.endOfFile : tokens_.list[0];
-        return value;
-    }
-
-    pANTLR3_BASE_TREE errorNode(std::uint32_t from, std::uint32_t to) override {
+    Node list() { return static_cast<Node>(adaptor_->nilNode(adaptor_)); }
+    Node error(std::uint32_t from, std::uint32_t to) {
         const pANTLR3_BASE_RECOGNIZER recogniser = state_.parser->rec;
         const ANTLR3_MARKER place = stream_->istream->index(stream_->istream);
         moveTo(from);
@@ -134,12 +78,13 @@ class RuleRun final : TreeBuilder::ErrorNodes {
         recogniser->reportError(recogniser);
         recogniser->state->errorRecovery = ANTLR3_FALSE;
         stream_->istream->seek(stream_->istream, place);
-        const auto tokenAt = [&](std::uint32_t i) {
-            return i < tokens_.list.size() ? tokens_.list[i] : tokens_.endOfFile;
-        };
-        return static_cast<pANTLR3_BASE_TREE>(
-            state_.adaptor->errorNode(state_.adaptor, stream_, tokenAt(from),
-                                      tokenAt(to > from ? to - 1 : from), recogniser->state->exception));
+        return static_cast<Node>(adaptor_->errorNode(adaptor_, stream_, tokenAt(from),
+                                                     tokenAt(to > from ? to - 1 : from),
+                                                     recogniser->state->exception));
+    }
+    void adopt(Node root, Node child) { adaptor_->addChild(adaptor_, root, child); }
+    void bound(Node node, std::uint32_t from, std::uint32_t to) {
+        adaptor_->setTokenBoundaries(adaptor_, node, tokens_.list[from], tokens_.list[to - 1]);
     }
 
     void moveTo(std::uint32_t position) {
@@ -152,11 +97,35 @@ class RuleRun final : TreeBuilder::ErrorNodes {
         is->seek(is, common->tokens->count);
     }
 
+ private:
+    Node leaf(pANTLR3_COMMON_TOKEN token) const {
+        return static_cast<Node>(adaptor_->create(adaptor_, token));
+    }
+    pANTLR3_COMMON_TOKEN tokenAt(std::uint32_t position) const {
+        return position < tokens_.list.size() ? tokens_.list[position] : tokens_.endOfFile;
+    }
+
     const ParserState& state_;
-    const ParserTable& table_;
+    pANTLR3_BASE_TREE_ADAPTOR adaptor_;
     pANTLR3_TOKEN_STREAM stream_;
-    Tokens tokens_;
+    const Tokens& tokens_;
 };
+
+ZRRuleReturn readFromStream(const ParserState& state, std::uint16_t rule) {
+    const pANTLR3_TOKEN_STREAM stream = state.parser->tstream;
+    const Tokens tokens(stream);
+    RuntimeTree tree(state, stream, tokens);
+    const auto read = readRule(*state.grammar, tokens.types, state.options, rule, tree);
+    ZRRuleReturn value{nullptr, nullptr, read.root};
+    if (read.failed) {
+        value.start = value.stop = tokens.list.empty() ? tokens.endOfFile : tokens.list[0];
+        return value;
+    }
+    tree.moveTo(read.end);
+    if (!tokens.list.empty()) value.start = tokens.list[0];
+    if (read.end != 0) value.stop = tokens.list[read.end - 1];
+    return value;
+}
 
 }  // namespace
 
@@ -198,7 +167,7 @@ void freeParserParts(pANTLR3_PARSER parser, pANTLR3_BASE_TREE_ADAPTOR adaptor,
 
 ZRRuleReturn runRule(const ParserState& state, std::uint16_t rule) {
     try {
-        return RuleRun(state).run(rule);
+        return readFromStream(state, rule);
     } catch (const std::bad_alloc&) {
         // The contexts are C: no exception goes through them.
         return {nullptr, nullptr, nullptr};

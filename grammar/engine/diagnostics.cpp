@@ -6,6 +6,8 @@
 #include <cstdio>
 #include <string>
 
+#include "platform/message_box.h"
+
 namespace {
 
 // The one process-wide setting of the library, as the header tells.
@@ -42,13 +44,17 @@ void toStandardError(void*, const char16_t* text, std::uint32_t length) {
 
 }  // namespace
 
-void zrSetDiagnosticFunction(ZRDiagnosticFunction function, void* user) {
-    sinkUser.store(user);
-    sinkFunction.store(function);
-}
-
-void zrDiagnosticsToStandardError(int on) {
-    zrSetDiagnosticFunction(on ? &toStandardError : nullptr, nullptr);
+void zrSetDiagnostics(uint32_t parts, ZRDiagnostics* diagnostics) {
+    const ZRDiagnostics wanted = *diagnostics;
+    *diagnostics = {sinkFunction.load(), sinkUser.load(),
+                    (parts & ZR_SET_BOX) != 0 ? zr::exchangeMessageBox(wanted.box) : zr::currentMessageBox()};
+    if ((parts & ZR_SET_STANDARD_ERROR) != 0) {
+        sinkUser.store(nullptr);
+        sinkFunction.store(&toStandardError);
+    } else if ((parts & ZR_SET_REPORTS) != 0) {
+        sinkUser.store(wanted.user);
+        sinkFunction.store(wanted.report);
+    }
 }
 
 namespace zr {

@@ -1,23 +1,16 @@
 #include "grammar/engine/lexer_engine.h"
 
 #include <algorithm>
-#include <string>
 #include <vector>
 
 #include "grammar/engine/diagnostics.h"
+#include "grammar/engine/lexer_match.h"
+#include "grammar/engine/runtime_place.h"
 
 namespace zr::engine {
 namespace {
 
 constexpr std::uint32_t kHiddenChannel = 99;
-
-std::uint32_t classOf(const LexerTable& table, char16_t unit) {
-    if (unit < 128) return table.asciiClass[unit];
-    const UnitRange* end = table.ranges + table.rangeCount;
-    return std::upper_bound(table.ranges, end, unit,
-                            [](char16_t u, const UnitRange& r) { return u < r.low; })[-1]
-        .cls;
-}
 
 const char16_t* position(pANTLR3_INPUT_STREAM in) {
     return static_cast<const char16_t*>(in->nextChar);
@@ -40,23 +33,11 @@ void advance(pANTLR3_INPUT_STREAM in, std::size_t count) {
     in->nextChar = const_cast<char16_t*>(to);
 }
 
-void appendNumber(std::u16string& to, std::uint32_t number) {
-    for (const char c : std::to_string(number)) to.push_back(static_cast<char16_t>(c));
-}
-
-void reportDropped(pANTLR3_LEXER lexer) {
+void dropUnit(pANTLR3_LEXER lexer) {
     ++lexer->rec->state->errorCount;
-    if (!zr::diagnosticsWanted()) return;
     const pANTLR3_INPUT_STREAM in = lexer->input;
-    std::u16string text;
-    appendNumber(text, in->line);
-    text += u":";
-    // The runtime counts the columns of the first line from -1.
-    appendNumber(text, static_cast<std::uint32_t>(in->charPositionInLine + (in->line == 1 ? 1 : 0)));
-    text += u": no token starts with '";
-    text += *position(in);
-    text += u"'";
-    zr::diagnose(text);
+    if (zr::diagnosticsWanted()) reportDropped(placeOf(in->line, in->charPositionInLine), *position(in));
+    advance(in, 1);
 }
 
 /// The token of `length` units at the stream's position goes to the lexer's state, as the runtime's emit
@@ -100,24 +81,13 @@ void nextToken(const LexerTable& table, pANTLR3_LEXER lexer) {
             state->token = &state->tokSource->skipToken;
             return;
         }
-        const char16_t* best = nullptr;
-        std::uint16_t bestRule = kNone16;
-        std::uint16_t current = 0;
-        for (const char16_t* at = start; at < end; ++at) {
-            current = table.next[static_cast<std::size_t>(current) * table.classes + classOf(table, *at)];
-            if (current == kNone16) break;
-            if (table.accept[current] != kNone16) {
-                best = at + 1;
-                bestRule = table.accept[current];
-            }
-        }
-        if (best != nullptr) {
+        const LexerMatch match = longestMatch(table, start, end);
+        if (match.rule != kNone16) {
             state->tokenStartCharIndex = reinterpret_cast<ANTLR3_MARKER>(start);
-            emit(table.rules[bestRule], lexer, static_cast<std::size_t>(best - start));
+            emit(table.rules[match.rule], lexer, static_cast<std::size_t>(match.end - start));
             return;
         }
-        reportDropped(lexer);
-        advance(in, 1);
+        dropUnit(lexer);
     }
 }
 

@@ -25,7 +25,8 @@ struct Options {
     std::uint32_t maxTokens = 20000000;
 };
 
-/// What a thread keeps at most of the memory of its last search, and of its last tree, for the next one.
+/// What a thread keeps at most of the memory of its last search, and of its last tree, for the next one. The
+/// builder and the nodes that it joins have half of a tree's each.
 constexpr std::size_t kSpareBytes = std::size_t{32} << 20;
 
 }  // namespace zr::engine

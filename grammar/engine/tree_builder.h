@@ -1,78 +1,313 @@
 #pragma once
 
-#include <antlr3.h>
-
+#include <cstddef>
+#include <cstdint>
 #include <vector>
 
+#include "grammar/engine/closer_steps.h"
+#include "grammar/engine/options.h"
 #include "grammar/engine/recogniser.h"
 
-/// Builds the runtime's tree along the derivation that the recogniser chose, through the runtime's adaptor.
+/// Builds the tree along the derivation that the recogniser chose.
 namespace zr::engine {
 
+/// `Tree` makes the nodes, the runtime's or the engine's own:
+///
+///     Tree::Node                              a node, or the absence of one
+///     token(position)                         a node for a token
+///     imaginary(type)                         a node for none
+///     error(from, to)                         what stands for tokens that were skipped
+///     adopt(root, child)                      adds a last child
+///     bound(node, from, to)                   notes the tokens from one position up to another
+template <class Tree>
 class TreeBuilder {
  public:
-    /// `tokens` are the on-channel tokens that the recogniser saw, without end of file.
-    TreeBuilder(const GrammarTable& grammar, const Recogniser& recogniser,
-                const std::vector<pANTLR3_COMMON_TOKEN>& tokens, pANTLR3_BASE_TREE_ADAPTOR adaptor);
-    ~TreeBuilder();
+    using Node = typename Tree::Node;
+
+    /// `types` are the tokens that the recogniser saw.
+    TreeBuilder(const ParserTable& table, const Recogniser& recogniser,
+                const std::vector<std::uint16_t>& types, Tree& tree)
+        : table_(table), recogniser_(recogniser), types_(types), tree_(tree) {
+        work_.swap(spare());
+    }
+    ~TreeBuilder() {
+        if (work_.bytes() <= spare().bytes() || work_.bytes() > kSpareBytes / 2) return;
+        work_.clear();
+        work_.swap(spare());
+    }
     TreeBuilder(const TreeBuilder&) = delete;
     TreeBuilder& operator=(const TreeBuilder&) = delete;
 
-    /// What stands in the place of a part that was skipped; asked once for each such part.
-    struct ErrorNodes {
-        virtual pANTLR3_BASE_TREE errorNode(std::uint32_t from, std::uint32_t to) = 0;
-
-     protected:
-        ~ErrorNodes() = default;
-    };
-
     /// The roots that the derivation yields, in order: one for a rule with a root, several for a list.
-    const std::vector<pANTLR3_BASE_TREE>& build(const Recogniser::Result& result, ErrorNodes& errors);
+    std::vector<Node>& build(const Recogniser::Result& result);
 
  private:
-    /// One element of a path with its exact place in the tokens.
-    struct Step {
-        std::uint16_t node;
-        std::uint32_t low, high;  ///< possible positions ahead of it
-        std::uint32_t at;         ///< the position it really starts at
-        std::uint32_t child, childEnd;
+    /// An entry whose path is being walked. As long as every place on it is one position, the path is
+    /// followed as it stands; where places become intervals, the rest of it is settled first.
+    struct Frame {
+        std::uint16_t node;  ///< where the path goes on; kNone16 once its steps are settled
+        std::uint32_t at;    ///< position there
+        std::uint32_t end;   ///< where the entry ends
+        std::uint32_t nextStep, stepsBase;
     };
 
     struct Scope {
         Mark mark;
-        std::uint32_t base;   ///< first value of this scope
         bool rooted;          ///< the first value is a root: what comes behind it are its children
+        std::uint32_t base;   ///< first value of this scope
         std::uint32_t start;  ///< first token
     };
 
-    struct Frame {
-        std::uint32_t nextStep, stepsEnd;  ///< into steps_
-        std::uint32_t stepsBase;
-    };
+    /// What grows with a text; a thread keeps that of its last tree for the next one.
+    struct Work {
+        std::vector<Frame> frames;
+        std::vector<std::uint32_t> path;  ///< states still to come, of all frames, the next one last
+        std::vector<Step> steps;
+        std::vector<Scope> scopes;
+        std::vector<Node> values;
 
-    /// The steps of a thread's last tree, kept for its next one like the vectors of a search.
-    static std::vector<Step>& spareSteps();
-    void expand(std::uint32_t entry, std::uint32_t endState, std::uint32_t exact);
-    void locate(std::uint32_t from, std::uint32_t exact);
-    void token(const Step& step);
+        std::size_t bytes() const {
+            return frames.capacity() * sizeof(Frame) + path.capacity() * sizeof(std::uint32_t) +
+                   steps.capacity() * sizeof(Step) + scopes.capacity() * sizeof(Scope) +
+                   values.capacity() * sizeof(Node);
+        }
+        void clear() {
+            frames.clear();
+            path.clear();
+            steps.clear();
+            scopes.clear();
+            values.clear();
+        }
+        void swap(Work& other) {
+            frames.swap(other.frames);
+            path.swap(other.path);
+            steps.swap(other.steps);
+            scopes.swap(other.scopes);
+            values.swap(other.values);
+        }
+    };
+    static Work& spare() {
+        static thread_local Work mine;
+        return mine;
+    }
+
+    void open(std::uint32_t entry, std::uint32_t endState, std::uint32_t end);
+    void walk();
+    void walkSettled();
+    void settle();
+    void call(Mark mark, std::uint32_t from, std::uint32_t to, std::uint32_t child, std::uint32_t childEnd);
+    std::uint32_t takeState() {
+        const std::uint32_t state = work_.path.back();
+        work_.path.pop_back();
+        return state;
+    }
+    bool isCloserAt(std::uint32_t position) const {
+        return position < types_.size() && types_[position] == table_.closer;
+    }
+
+    void token(const NodeRow& node, std::uint32_t at);
+    void root(const NodeRow& node) {
+        if (dropped_ == 0) becomeRoot(work_.scopes.back(), valueCount(), tree_.imaginary(node.arg));
+    }
     void openScope(Mark mark, std::uint32_t at);
     void closeScope(std::uint32_t at);
-    void adoptAll(pANTLR3_BASE_TREE root, std::uint32_t base, std::uint32_t end);
-    void becomeRoot(Scope& scope, std::uint32_t end, pANTLR3_BASE_TREE root);
-    void bound(pANTLR3_BASE_TREE node, std::uint32_t start, std::uint32_t stop) const;
+    void adoptAll(Node root, std::uint32_t base, std::uint32_t end);
+    void becomeRoot(Scope& scope, std::uint32_t end, Node root);
+    std::uint32_t valueCount() const { return static_cast<std::uint32_t>(work_.values.size()); }
 
-    const GrammarTable& grammar_;
     const ParserTable& table_;
     const Recogniser& recogniser_;
-    const std::vector<pANTLR3_COMMON_TOKEN>& tokens_;
-    pANTLR3_BASE_TREE_ADAPTOR adaptor_;
-    std::vector<Step> steps_;
-    std::vector<std::uint32_t> path_;
-    std::vector<Frame> frames_;
-    std::vector<Scope> scopes_;
-    std::vector<pANTLR3_BASE_TREE> values_;
+    const std::vector<std::uint16_t>& types_;
+    Tree& tree_;
+    Work work_;
     std::uint32_t dropped_ = 0;  ///< scopes at work whose tree is left out
-    std::uint32_t runEndOf(std::uint32_t position) const;
 };
+
+template <class Tree>
+std::vector<typename Tree::Node>& TreeBuilder<Tree>::build(const Recogniser::Result& result) {
+    openScope(Mark::None, recogniser_.startOf(result.entry));
+    open(result.entry, result.endState, result.high);
+    while (!work_.frames.empty()) {
+        if (work_.frames.back().node == kNone16)
+            walkSettled();
+        else
+            walk();
+    }
+    return work_.values;
+}
+
+template <class Tree>
+void TreeBuilder<Tree>::open(std::uint32_t entry, std::uint32_t endState, std::uint32_t end) {
+    for (std::uint32_t s = endState; s != Recogniser::kNone; s = recogniser_.state(s).before)
+        work_.path.push_back(s);
+    work_.frames.push_back({recogniser_.state(takeState()).node, recogniser_.startOf(entry), end, 0, 0});
+}
+
+/// Goes on with the entry opened last until it has ended or opened another one.
+template <class Tree>
+void TreeBuilder<Tree>::walk() {
+    Frame& frame = work_.frames.back();
+    const NodeRow* const nodes = table_.nodes;
+    std::uint16_t at = frame.node;
+    std::uint32_t position = frame.at;
+    for (;;) {
+        const NodeRow& node = nodes[at];
+        switch (node.op) {
+            case Op::Choice:
+                at = recogniser_.state(takeState()).node;
+                continue;
+            case Op::Token:
+            case Op::Set:
+                token(node, position++);
+                break;
+            case Op::ScopeBegin:
+                openScope(node.mark, position);
+                break;
+            case Op::ScopeEnd:
+                closeScope(position);
+                break;
+            case Op::Root:
+                root(node);
+                break;
+            case Op::Soft:
+            case Op::SoftStar:
+            case Op::Hard:
+                if (!isCloserAt(position)) break;
+                frame.node = at;
+                frame.at = position;
+                return settle();
+            case Op::Call: {
+                const Recogniser::State& back = recogniser_.state(work_.path.back());
+                if (back.low != back.high) {
+                    frame.node = at;
+                    frame.at = position;
+                    return settle();
+                }
+                work_.path.pop_back();
+                frame.node = node.next;
+                frame.at = back.high;
+                return call(node.mark, position, back.high, back.child, back.childEnd);
+            }
+            case Op::End:
+                work_.frames.pop_back();
+                return closeScope(position);
+        }
+        at = node.next;
+    }
+}
+
+template <class Tree>
+void TreeBuilder<Tree>::settle() {
+    Frame& frame = work_.frames.back();
+    frame.stepsBase = frame.nextStep = static_cast<std::uint32_t>(work_.steps.size());
+    settleSteps(table_, recogniser_, types_, frame.node, frame.at, frame.end, work_.path, work_.steps);
+    frame.node = kNone16;
+}
+
+/// The same as walk() along settled steps.
+template <class Tree>
+void TreeBuilder<Tree>::walkSettled() {
+    Frame& frame = work_.frames.back();
+    while (frame.nextStep < work_.steps.size()) {
+        const Step& step = work_.steps[frame.nextStep++];
+        const NodeRow& node = table_.nodes[step.node];
+        switch (node.op) {
+            case Op::Token:
+            case Op::Set:
+            case Op::Hard:
+                token(node, step.at);
+                break;
+            case Op::Soft:
+                if (step.high > step.at) token(node, step.at);
+                break;
+            case Op::ScopeBegin:
+                openScope(node.mark, step.at);
+                break;
+            case Op::ScopeEnd:
+                closeScope(step.at);
+                break;
+            case Op::Root:
+                root(node);
+                break;
+            case Op::Call:
+                return call(node.mark, step.at, step.high, step.child, step.childEnd);
+            default:
+                break;
+        }
+    }
+    const std::uint32_t end = frame.end;
+    work_.steps.resize(frame.stepsBase);
+    work_.frames.pop_back();
+    closeScope(end);
+}
+
+template <class Tree>
+void TreeBuilder<Tree>::call(Mark mark, std::uint32_t from, std::uint32_t to, std::uint32_t child,
+                             std::uint32_t childEnd) {
+    openScope(mark, from);
+    const std::uint32_t endState = recogniser_.end(childEnd).state;
+    if (endState != Recogniser::kNone) return open(child, endState, to);
+    work_.values.push_back(tree_.error(from, to));
+    closeScope(from);
+}
+
+template <class Tree>
+void TreeBuilder<Tree>::token(const NodeRow& node, std::uint32_t at) {
+    if (node.mark == Mark::Drop || dropped_ != 0) return;
+    const Node made = tree_.token(at);
+    if (node.mark == Mark::Root)
+        becomeRoot(work_.scopes.back(), valueCount(), made);
+    else
+        work_.values.push_back(made);
+}
+
+template <class Tree>
+void TreeBuilder<Tree>::openScope(Mark mark, std::uint32_t at) {
+    if (mark == Mark::Drop) ++dropped_;
+    work_.scopes.push_back({mark, false, valueCount(), at});
+}
+
+template <class Tree>
+void TreeBuilder<Tree>::closeScope(std::uint32_t at) {
+    const Scope scope = work_.scopes.back();
+    work_.scopes.pop_back();
+    std::vector<Node>& values = work_.values;
+    std::uint32_t end = valueCount();
+    if (scope.rooted && end > scope.base + 1) {
+        adoptAll(values[scope.base], scope.base + 1, end);
+        end = scope.base + 1;
+        values.resize(end);
+    }
+    if (end == scope.base + 1 && at > scope.start) tree_.bound(values.back(), scope.start, at);
+    if (scope.mark == Mark::None) return;
+    if (scope.mark == Mark::Drop) {
+        --dropped_;
+    } else if (scope.mark == Mark::Root && end > scope.base) {
+        // The rule's tree becomes the root of what the scope around it has built so far.
+        const Node root = values[scope.base];
+        adoptAll(root, scope.base + 1, end);
+        values.resize(scope.base);
+        becomeRoot(work_.scopes.back(), scope.base, root);
+    }
+}
+
+template <class Tree>
+void TreeBuilder<Tree>::adoptAll(Node root, std::uint32_t base, std::uint32_t end) {
+    for (std::uint32_t i = base; i < end; ++i) tree_.adopt(root, work_.values[i]);
+}
+
+/// `root` becomes the root of the scope's values up to `end`; values behind `end` must be gone already.
+template <class Tree>
+void TreeBuilder<Tree>::becomeRoot(Scope& scope, std::uint32_t end, Node root) {
+    std::vector<Node>& values = work_.values;
+    if (scope.rooted) {
+        adoptAll(values[scope.base], scope.base + 1, end);
+        end = scope.base + 1;
+    }
+    adoptAll(root, scope.base, end);
+    values.resize(scope.base);
+    values.push_back(root);
+    scope.rooted = true;
+}
 
 }  // namespace zr::engine

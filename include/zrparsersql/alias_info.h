@@ -23,6 +23,7 @@ class ZR_SHARED_DECLARATION CZRAliasInfo : public CZRSourceFildInfo {
     ~CZRAliasInfo() override;
 
     CZRAliasInfo* Clone(int selectedOnly = 0) const override;
+    // Derived, and no base table.
     bool IsDerivedSource() const override;
     bool IsBaseTable() const override;
 

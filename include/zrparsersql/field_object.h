@@ -3,7 +3,8 @@
 #include "zrparsersql/export.h"
 #include "zrparsersql/wide_string.h"
 
-// One column reference of a query: the texts of its table and column.
+// One column reference of a query: the texts of its table and column. Owned by the query whose m_fields holds
+// it; not guarded against use from several threads.
 class CFieldObject {
  public:
     CString m_table;

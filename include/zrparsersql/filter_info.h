@@ -78,8 +78,7 @@ struct ZR_SHARED_DECLARATION CZRFilterValue {
     const char* GetAs(int encoding);
     const char16_t* GetWide();
     // Reads the text as a number, as far as it is one; 0 where it is none or out of range. Each "," of the
-    // text becomes
-    // "." for good.
+    // text becomes "." for good.
     double GetDouble();
     // Answers 0 and leaves the result alone when the text is no date.
     int GetDate(zr::DateTime& result);
@@ -113,8 +112,10 @@ class ZR_SHARED_DECLARATION CZRFilterItemInfo {
 
     // The condition as text of the dialect.
     virtual CString GetConditionText() = 0;
+    // Write to and read from a storage node, see storage.h. What the node or the factory throws comes out.
     virtual void Save(CZRStorageNode& node);
     virtual void Load(CZRStorageNode& node, CZRDescriptorFactory& factory);
+    // A new object of the same class, for the caller to own.
     virtual CZRFilterItemInfo* Clone() const = 0;
 
     CString GetFieldID() const { return FieldID; }
@@ -134,7 +135,7 @@ class ZR_SHARED_DECLARATION CZRFilterItemInfo {
 };
 
 // The row filter of a table: conditions, or a free SQL text. Subclasses and destruction as for
-// CZRFilterItemInfo.
+// CZRFilterItemInfo. Not guarded against use from several threads.
 class ZR_SHARED_DECLARATION CZRFilterInfo {
  public:
     CList<CZRFilterItemInfo*> Items;  // owned
@@ -147,11 +148,14 @@ class ZR_SHARED_DECLARATION CZRFilterInfo {
     CZRFilterInfo& operator=(const CZRFilterInfo&) = delete;
     ~CZRFilterInfo();
 
+    // Kind of database that the filter is written for; it is stored with the filter.
     virtual DBTypes GetDBType() const = 0;
     // The whole filter as text of the dialect.
     virtual CString GetFilterText() = 0;
+    // As for CZRFilterItemInfo; the items that were there before are ended.
     virtual void Save(CZRStorageNode& node);
     virtual void Load(CZRStorageNode& node, CZRDescriptorFactory& factory);
+    // A new object of the same class, for the caller to own.
     virtual CZRFilterInfo* Clone() const = 0;
 
     CString GetSQLQuery() const { return SQLQuery; }

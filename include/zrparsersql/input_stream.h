@@ -3,11 +3,10 @@
 
 #include <antlr3.h>
 #include <stdint.h>
+#include <uchar.h>
+
 #ifdef __cplusplus
-#include <uchar.h>
 extern "C" {
-#else
-#include <uchar.h>
 #endif
 
 /* An input stream of the parsing runtime over UTF-16 text, read in place: nothing is copied, and every unit

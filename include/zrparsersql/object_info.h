@@ -23,7 +23,7 @@ class ZR_SHARED_DECLARATION CZRObjectInfo {
     CString Type;              // source type
     CString TypeMapped;        // target type
     CString TypeMappedString;  // complete target type, as a definition writes it
-    int Length = -1;           // -1: none
+    int Length = -1;           // as the type counts it (characters, bytes or digits); -1: none
     int LengthMapped = -1;     // -1: none
     int Scale = 0;
     int ScaleMapped = 0;
@@ -65,6 +65,7 @@ class ZR_SHARED_DECLARATION CZRObjectInfo {
     // Read and stored as it is.
     virtual CString GetSrcName() const;
     virtual void SetSrcName(CString value);
+    // Kind of database that the host's class is for; DB_NONE here.
     virtual DBTypes GetDBType() const;
     virtual CString GetType() const;
     virtual void SetType(CString value);
@@ -100,7 +101,7 @@ class ZR_SHARED_DECLARATION CZRObjectInfo {
     virtual void SetUnsignedMapped(int value);
     virtual int GetIndexOff() const;
     virtual void SetIndexOff(int value);
-    // Write to and read from a storage node, see storage.h.
+    // Write to and read from a storage node, see storage.h. What the node or the factory throws comes out.
     virtual void Save(CZRStorageNode& node);
     virtual void Load(CZRStorageNode& node, CZRDescriptorFactory& factory);
     // Takes over names, types, selection and state of another object, read through its getters, and leaves
@@ -110,10 +111,12 @@ class ZR_SHARED_DECLARATION CZRObjectInfo {
     // A new object of the same class, for the caller to own. selectedOnly matters to classes with lists: they
     // leave out the entries that are not selected.
     virtual CZRObjectInfo* Clone(int selectedOnly = 0) const = 0;
+    // Whether the object stands for something that is computed, such as a query, or for a stored table.
     virtual bool IsDerivedSource() const = 0;
     virtual bool IsBaseTable() const = 0;
     // Longest name that the target allows, in UTF-16 units; -1 for no limit.
     virtual int GetMaxNameLength() const;
+    // 1; a query answers whether it reads from another one.
     virtual int HasQuerySource();
 
     int GetDataType() const { return DataType; }

@@ -37,7 +37,7 @@ class ZR_API CZRParseSQLException : public CZRException {
     CZRParseSQLException& operator=(const CZRParseSQLException& other);
     ~CZRParseSQLException() override;
 
-    // Shows an error box without text and caption, whatever the object holds; see message_box.h.
+    // Shows an error box without text and caption, whatever the object holds; see diagnostics.h.
     void DoMessageBox(HWND owner) override;
     int GetErrNumber() override;
     int GetErrCode() override;

@@ -10,7 +10,7 @@ class CZRQueryInfo;
 // Work on the raw text of a query, for hosts that need no more than that. Nothing here parses: words are
 // searched as they are written here, in capitals, wherever they stand, and the first hit from the left counts
 // unless said otherwise. Positions count UTF-16 units. Free of shared state; failure: only an exhausted heap,
-// as std::bad_alloc.
+// as std::bad_alloc. A pointer to a query may not be null; the caller goes on owning it.
 
 // The first piece between commas that holds "JOIN"; the last piece when none does.
 ZR_SHARED_DECLARATION CString FindJoinPart(CString text);

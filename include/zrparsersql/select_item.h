@@ -29,7 +29,8 @@ enum SelectItemKind : int {
 
 // One node of a descriptor's expression tree. Owned by the list, item or descriptor that holds it; nothing in
 // it points into the syntax tree it was made from. Trees may be of any depth: copying and deleting one needs
-// no machine stack for it. Not guarded against use from several threads.
+// no machine stack for it. Not guarded against use from several threads. Failure: an exhausted heap, as
+// std::bad_alloc, and what GetExpressionText tells.
 class ZR_SHARED_DECLARATION SelectItem {
  public:
     int m_nested = 0;     // 1 for an operator that stands directly under a nested join

@@ -43,6 +43,7 @@ class ZR_SHARED_DECLARATION CZRFieldInfo : public CZRSourceFildInfo {
 
     // Tells the table that owns the column; a cloned column is told its new owner.
     virtual void SetOwner(CZRTableInfo* owner) = 0;
+    // The complete target type as a definition writes it, and the collation or an empty text.
     virtual CString GetTypeDefinition() const = 0;
     virtual CString GetCollation() const = 0;
     // Nonzero keeps the column out of the keys by which rows are addressed.
@@ -53,6 +54,7 @@ class ZR_SHARED_DECLARATION CZRFieldInfo : public CZRSourceFildInfo {
 class ZR_SHARED_DECLARATION CZRIndexColumn {
  public:
     virtual ~CZRIndexColumn();
+    // ID of the column in the index's table.
     virtual CString GetColumnID() const = 0;
 };
 
@@ -68,8 +70,11 @@ class ZR_SHARED_DECLARATION CZRIndexInfo : public CZRObjectInfo {
 
     CZRIndexInfo* Clone(int selectedOnly = 0) const override = 0;
 
+    // Tells the table that owns the index; it is not owned here.
     virtual void SetOwner(CZRTableInfo* owner) = 0;
+    // Looks the columns up in the owner by their IDs and notes it in Resolved.
     virtual void ResolveReferences() = 0;
+    // 1 or 0.
     virtual int IsPrimaryKey() const = 0;
     virtual int IsUnique() const = 0;
 };
@@ -82,7 +87,9 @@ class ZR_SHARED_DECLARATION CZRForeignKeyInfo : public CZRObjectInfo {
 
     CZRForeignKeyInfo* Clone(int selectedOnly = 0) const override = 0;
 
+    // Tells the table that owns the key; it is not owned here.
     virtual void SetOwner(CZRTableInfo* owner) = 0;
+    // Looks table and columns up in the owner's database by their IDs and notes it in Resolved.
     virtual void ResolveReferences() = 0;
     // ID of the table that the key refers to.
     virtual CString GetReferencedTableID() const = 0;

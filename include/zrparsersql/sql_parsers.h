@@ -15,17 +15,16 @@
 //     ... walk ...
 //     delete tree;  // ahead of the facade
 //
-// SetSQL    takes the text by reference and reads it in place, without a copy: the text must stay alive and
-// unchanged
-//           as long as the facade or one of its trees is in use.
-// ParseSQL  parses the text set last; without a text it does nothing. Wrong SQL is no failure: the tree then
-// holds
-//           error nodes, or is one. Earlier trees stay good until the facade goes.
-// GetSQLTree stores a new root view over the tree of the last ParseSQL in *out. The caller owns it. Before
-// the first
-//           ParseSQL the view stands over no node. An exhausted heap stores null.
+// SetSQL takes the text by reference and reads it in place, without a copy: the text must stay alive and
+// unchanged as long as the facade or one of its trees is in use.
 //
-// Neither throws. Threads: a facade and its trees belong to one thread; facades are independent of each
+// ParseSQL parses the text set last; without a text it does nothing. Wrong SQL is no failure: the tree then
+// holds error nodes, or is one. Earlier trees stay good until the facade goes.
+//
+// GetSQLTree stores a new root view over the tree of the last ParseSQL in *out, which may not be null. The
+// caller owns it. Before the first ParseSQL the view stands over no node. An exhausted heap stores null.
+//
+// None of them throws. Threads: a facade and its trees belong to one thread; facades are independent of each
 // other.
 class ZR_API CZRSQLParser {
  public:

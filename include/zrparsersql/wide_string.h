@@ -1,5 +1,9 @@
 #pragma once
 
+#if defined(_MSVC_LANG) ? _MSVC_LANG < 202002L : __cplusplus < 202002L
+#error "The headers of ZRParserSQL are C++20: compile with -std=c++20 or newer"
+#endif
+
 #include <atomic>
 #include <cstddef>
 #include <cstdint>
@@ -222,6 +226,8 @@ class ZR_SHARED_DECLARATION CString {
     }
 
     friend CString operator+(const CString& left, const CString& right) {
+        if (left.IsEmpty()) return right;
+        if (right.IsEmpty()) return left;
         return concatenate(left.View(), right.View());
     }
     friend CString operator+(const CString& left, std::u16string_view right) {

@@ -24,19 +24,9 @@
 namespace zr::test {
 namespace {
 
-/// The recognisers of one grammar. A statement's rule is the one that its start rule begins with.
-template <auto LexerNew, auto ParserNew, auto StatementRule>
-struct Recognisers {
-    using Lexer = decltype(LexerNew(nullptr));
-    using Parser = decltype(ParserNew(nullptr));
-    static Lexer newLexer(pANTLR3_INPUT_STREAM input) { return LexerNew(input); }
-    static Parser newParser(pANTLR3_COMMON_TOKEN_STREAM tokens) { return ParserNew(tokens); }
-    static ZRRuleReturn readStatement(Parser parser) { return (parser->*StatementRule)(parser); }
-};
-
 /// A token of the text is read from the text itself: a string that the runtime makes of UTF-16 input may bear
 /// the wrong encoding. Imaginary and error nodes have plain characters for a text.
-std::u16string textOf(ANTLR3_COMMON_TOKEN& token) {
+std::u16string tokenText(ANTLR3_COMMON_TOKEN& token) {
     if (token.textState == ANTLR3_TEXT_CHARP) {
         const std::string_view name = reinterpret_cast<const char*>(token.tokText.chars);
         return {name.begin(), name.end()};
@@ -50,12 +40,26 @@ std::u16string textOf(ANTLR3_COMMON_TOKEN& token) {
     return last < first ? std::u16string() : std::u16string(first, last + 1);
 }
 
+}  // namespace
+
 std::u16string textOf(pANTLR3_BASE_TREE node) {
     if (node->isNilNode(node)) return u"nil";
-    if (pANTLR3_COMMON_TOKEN token = node->getToken(node)) return textOf(*token);
+    if (pANTLR3_COMMON_TOKEN token = node->getToken(node)) return tokenText(*token);
     pANTLR3_STRING text = node->getText(node);
     return text == nullptr ? std::u16string() : std::u16string(text->chars, text->chars + text->len);
 }
+
+namespace {
+
+/// The recognisers of one grammar. A statement's rule is the one that its start rule begins with.
+template <auto LexerNew, auto ParserNew, auto StatementRule>
+struct Recognisers {
+    using Lexer = decltype(LexerNew(nullptr));
+    using Parser = decltype(ParserNew(nullptr));
+    static Lexer newLexer(pANTLR3_INPUT_STREAM input) { return LexerNew(input); }
+    static Parser newParser(pANTLR3_COMMON_TOKEN_STREAM tokens) { return ParserNew(tokens); }
+    static ZRRuleReturn readStatement(Parser parser) { return (parser->*StatementRule)(parser); }
+};
 
 /// Lexer, token stream and parser over one text, freed in the order in which the runtime wants it.
 template <typename G>
@@ -87,7 +91,7 @@ class Pipeline {
         for (ANTLR3_UINT32 i = 0; i < count; ++i) {
             ANTLR3_COMMON_TOKEN& token = tokenAt(i);
             if (!isSeen(token)) continue;
-            out.push_back({static_cast<int>(token.getType(&token)), textOf(token), offset(token.start),
+            out.push_back({static_cast<int>(token.getType(&token)), tokenText(token), offset(token.start),
                            offset(token.stop) + 1});
         }
         return out;

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <antlr3.h>
+
 #include <cstddef>
 #include <string>
 #include <string_view>
@@ -16,6 +18,9 @@ struct TokenText {
     std::size_t from, to;  ///< where it stands in the text, uncut
     bool operator==(const TokenText&) const = default;
 };
+
+/// The text of a node of the runtime.
+std::u16string textOf(pANTLR3_BASE_TREE node);
 
 /// What lexer and parser of one grammar make of a text, copied out of the runtime's objects, which are gone.
 struct Reading {

@@ -5,7 +5,6 @@
 #include <gtest/gtest.h>
 #include <zrparsersql/analysis.h>
 #include <zrparsersql/diagnostics.h>
-#include <zrparsersql/message_box.h>
 #include <zrparsersql/nested_queries.h>
 #include <zrparsersql/parse_exception.h>
 #include <zrparsersql/sql_parsers.h>
@@ -159,6 +158,57 @@ TEST_F(Boundary, ReportsReachTheFunctionThatTheHostSet) {
     analyse(u"SELECT a FROM t");
     zrSetDiagnosticFunction(nullptr, nullptr);
     EXPECT_EQ(reports, 3) << "one for each blank";
+}
+
+int pressNo(void*, const char16_t*, const char16_t*, std::uint32_t) {
+    return 7;
+}
+void countReport(void* user, const char16_t*, std::uint32_t) {
+    ++*static_cast<int*>(user);
+}
+
+/// What is set now.
+ZRDiagnostics settings() {
+    ZRDiagnostics now{};
+    zrSetDiagnostics(0, &now);
+    return now;
+}
+
+TEST_F(Boundary, WhatWasSetIsHandedBackAndCanBeRestored) {
+    const ZRDiagnostics initial = settings();
+    EXPECT_EQ(initial.report, nullptr);
+    EXPECT_EQ(initial.user, nullptr);
+    EXPECT_EQ(initial.box, nullptr);
+
+    int reports = 0;
+    ZRDiagnostics mine{&countReport, &reports, &pressNo};
+    zrSetDiagnostics(ZR_SET_REPORTS | ZR_SET_BOX, &mine);
+    EXPECT_EQ(mine.report, nullptr);
+    EXPECT_EQ(mine.box, nullptr);
+    EXPECT_EQ(settings().report, &countReport);
+    EXPECT_EQ(settings().user, &reports);
+    EXPECT_EQ(settings().box, &pressNo);
+
+    zrSetDiagnostics(ZR_SET_REPORTS | ZR_SET_BOX, &mine);
+    EXPECT_EQ(settings().report, nullptr);
+    EXPECT_EQ(settings().user, nullptr);
+    EXPECT_EQ(settings().box, nullptr);
+}
+
+TEST_F(Boundary, ReportsAndTheBoxAreSetApart) {
+    int reports = 0;
+    zrSetDiagnosticFunction(&countReport, &reports);
+    EXPECT_EQ(zrSetMessageBoxFunction(&pressNo), nullptr);
+    EXPECT_EQ(settings().report, &countReport);
+    zrSetDiagnosticFunction(nullptr, nullptr);
+    EXPECT_EQ(settings().box, &pressNo);
+    zrDiagnosticsToStandardError(1);
+    EXPECT_NE(settings().report, nullptr);
+    EXPECT_EQ(settings().box, &pressNo);
+    EXPECT_EQ(zrSetMessageBoxFunction(nullptr), &pressNo);
+    EXPECT_NE(settings().report, nullptr);
+    zrDiagnosticsToStandardError(0);
+    EXPECT_EQ(settings().report, nullptr);
 }
 
 TEST_F(Boundary, AFacadeIsKnownAndDeletedByItsBase) {

@@ -7,6 +7,7 @@
 # CPACK, CMAKE, CC and CXX name the tools.
 set -euo pipefail
 build=$1 tests=$2 work=$3
+root=$tests/../..
 rm -rf "$work"
 mkdir -p "$work"
 fail() {
@@ -36,10 +37,15 @@ version=$(dpkg-deb --field "$work"/packages/zrsql_*.deb Version)
 has libzrparsersql Depends libantlr3c libicu libuuid1 libstdc++6
 has libzrparsersql-dev Depends "libzrparsersql (= $version)" libantlr3c-dev libicu-dev uuid-dev
 has zrsql Depends "libzrparsersql (= $version)" libsqlite3-0
-dpkg-deb --info "$work"/packages/libzrparsersql_*.deb shlibs | grep -q '^libzrparsersql 0 libzrparsersql ' || fail "no shlibs"
+dpkg-deb --info "$work"/packages/libzrparsersql_*.deb shlibs | grep -q "^libzrparsersql 0 libzrparsersql (>= ${version%.*}), libzrparsersql (<< " || fail "no shlibs"
 dpkg-deb --info "$work"/packages/libzrparsersql_*.deb triggers | grep -q ldconfig || fail "no ldconfig trigger"
 for name in "${names[@]}"; do
     [[ -s $work/root/usr/share/doc/$name/copyright ]] || fail "$name has no copyright file"
+done
+
+guides=$work/root/usr/share/doc/libzrparsersql-dev
+for file in README.md docs/embedding.md examples/embed/CMakeLists.txt examples/embed/expected/columns.txt; do
+    cmp "$root/$file" "$guides/$file" || fail "the development package has not the tree's $file"
 done
 
 bash "$tests/host.sh" cmake "$work/root/usr" "$tests/host" "$work/cmake"

@@ -34,6 +34,20 @@ trap 'rm -rf "$work"' EXIT
         }' "$work/classes"
 } >"$work/slots"
 
+# Every class of the public headers that has a virtual table is described: by itself, or, where it is abstract, through a
+# class that stands in for it.
+(cd "$root/include" && printf '#include <%s>\n' zrparsersql/*.h) |
+    "$compiler" -x c++ -std=c++20 -fsyntax-only -fdump-lang-class="$work/public" -I "$root/include" -
+undescribed=$(awk '
+    FNR == NR { if (/^[^ #]/) described[$1] = 1; next }
+    FILENAME == ARGV[2] {
+        if (/^Class /) class = $2
+        else if (/ \(0x/ && class in described) described[$1] = 1
+        next
+    }
+    /^Vtable for / && $3 !~ /^std::|^__/ && !($3 in described) { print $3 }' "$work/slots" "$work/classes" "$work/public")
+[[ -z $undescribed ]] || { echo "without a description in virtual_slots.cpp: $undescribed" >&2; exit 1; }
+
 if [[ -n ${ZR_BLESS:-} ]]; then
     cp "$work/slots" "$description"
 else

@@ -1,7 +1,7 @@
 #include "zrparsersql/parse_exception.h"
 
 #include <gtest/gtest.h>
-#include <zrparsersql/message_box.h>
+#include <zrparsersql/diagnostics.h>
 
 #include <string>
 

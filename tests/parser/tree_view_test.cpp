@@ -54,7 +54,7 @@ TEST(TreeView, AnErrorNodeHasTypeZeroAndNoChildren) {
 }
 
 TEST(TreeView, MakesChildrenOfItsOwnClass) {
-    CZRMySQLTree view(nullptr, nullptr);
+    CZRMySQLTree view(nullptr);
     EXPECT_NE(dynamic_cast<CZRMySQLTree*>(view.GetChild(0)), nullptr);
     EXPECT_EQ(dynamic_cast<CZRMSSQLTree*>(view.GetChild(0)), nullptr);
     const ParsedMssql parsed(u"SELECT a");

@@ -1,7 +1,6 @@
 #include "platform/message_box.h"
 
 #include <gtest/gtest.h>
-#include <zrparsersql/message_box.h>
 
 #include <string>
 
@@ -22,20 +21,20 @@ int remember(void* owner, const char16_t* text, const char16_t* caption, std::ui
 
 TEST(MessageBox, GoesToTheFunctionThatIsSet) {
     int window = 0;
-    const ZRMessageBoxFunction before = zrSetMessageBoxFunction(remember);
+    const ZRMessageBoxFunction before = zr::exchangeMessageBox(remember);
     EXPECT_EQ(zr::showMessageBox(&window, u"text", u"caption", 16), 7);
     EXPECT_EQ(shown.owner, &window);
     EXPECT_EQ(shown.text, u"text");
     EXPECT_EQ(shown.caption, u"caption");
     EXPECT_EQ(shown.style, 16u);
-    EXPECT_EQ(zrSetMessageBoxFunction(before), remember);
+    EXPECT_EQ(zr::exchangeMessageBox(before), remember);
 }
 
 #if !defined(_WIN32)
 TEST(MessageBox, ShowsNothingWithoutAFunction) {
-    const ZRMessageBoxFunction before = zrSetMessageBoxFunction(nullptr);
+    const ZRMessageBoxFunction before = zr::exchangeMessageBox(nullptr);
     EXPECT_EQ(zr::showMessageBox(nullptr, u"", u"", 16), 0);
-    zrSetMessageBoxFunction(before);
+    zr::exchangeMessageBox(before);
 }
 #endif
 

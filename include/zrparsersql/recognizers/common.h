@@ -2,7 +2,9 @@
 #define ZRPARSERSQL_RECOGNIZERS_COMMON_H
 
 /* What the context headers of all grammars share. The contexts are the parsing runtime's (ANTLR 3 C) and are
-   used through it: a lexer context feeds a token stream, a parser context reads from it. */
+   used through it: a lexer context feeds a token stream, a parser context reads from it. Wrong text is no
+   failure: the runtime's error counts grow, and the tree has error nodes or is one. What was made of one text
+   belongs to one thread at a time. */
 
 #include <antlr3.h>
 #include <zrparsersql/export.h>

@@ -3,7 +3,6 @@
 #include <zrparsersql/database_info.h>
 #include <zrparsersql/diagnostics.h>
 #include <zrparsersql/input_stream.h>
-#include <zrparsersql/message_box.h>
 #include <zrparsersql/parse_exception.h>
 #include <zrparsersql/query_info.h>
 #include <zrparsersql/recognizers/MSSQLfrom.h>

@@ -1,0 +1,98 @@
+#include "grammar/engine/closer_steps.h"
+
+#include <algorithm>
+
+namespace zr::engine {
+namespace {
+
+/// Settles, from the end backwards, where in a run of closers each step stands: the optional closers further
+/// in take as many as they can, which is the first derivation in written order.
+void locate(const ParserTable& table, const Recogniser& recogniser, std::vector<Step>& steps,
+            std::size_t from, std::uint32_t exact) {
+    std::uint32_t after = exact;
+    for (std::size_t i = steps.size(); i-- > from;) {
+        Step& step = steps[i];
+        const Op op = table.nodes[step.node].op;
+        switch (op) {
+            case Op::Token:
+            case Op::Set:
+            case Op::Hard:
+                step.at = after - 1;
+                break;
+            case Op::Soft:
+                step.at = step.high >= after ? after : after - 1;
+                break;
+            case Op::SoftStar:
+                step.at = std::min(step.high, after);
+                break;
+            case Op::Call:
+                step.at = recogniser.startOf(step.child);
+                break;
+            default:
+                step.at = after;
+                break;
+        }
+        // Where a call or an optional closer ends is told by what comes behind it; the slot keeps that
+        // position.
+        if (op == Op::Call || op == Op::Soft) step.high = after;
+        after = step.at;
+    }
+}
+
+}  // namespace
+
+void settleSteps(const ParserTable& table, const Recogniser& recogniser,
+                 const std::vector<std::uint16_t>& types, std::uint16_t node, std::uint32_t position,
+                 std::uint32_t exact, std::vector<std::uint32_t>& path, std::vector<Step>& steps) {
+    const auto runEndOf = [&](std::uint32_t at) {
+        while (at < types.size() && types[at] == table.closer) ++at;
+        return at;
+    };
+    const auto takeState = [&]() -> const Recogniser::State& {
+        const std::uint32_t next = path.back();
+        path.pop_back();
+        return recogniser.state(next);
+    };
+    const std::size_t base = steps.size();
+    std::uint32_t low = position, high = position;
+    for (;;) {
+        const NodeRow& row = table.nodes[node];
+        if (row.op == Op::End) break;
+        if (row.op == Op::Choice) {
+            node = takeState().node;
+            continue;
+        }
+        Step step{node, low, high, 0, Recogniser::kNone, Recogniser::kNone};
+        switch (row.op) {
+            case Op::Token:
+            case Op::Set:
+                low = high = high + 1;
+                break;
+            case Op::Hard:
+                ++low;
+                high = std::min(high + 1, runEndOf(step.low));
+                break;
+            case Op::Soft:
+                high = std::min(high + 1, runEndOf(low));
+                break;
+            case Op::SoftStar:
+                high = runEndOf(low);
+                break;
+            case Op::Call: {
+                const Recogniser::State& back = takeState();
+                step.child = back.child;
+                step.childEnd = back.childEnd;
+                low = back.low;
+                high = back.high;
+                break;
+            }
+            default:
+                break;
+        }
+        steps.push_back(step);
+        node = row.next;
+    }
+    locate(table, recogniser, steps, base, exact);
+}
+
+}  // namespace zr::engine

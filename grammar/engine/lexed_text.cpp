@@ -1,0 +1,59 @@
+#include "grammar/engine/lexed_text.h"
+
+#include <algorithm>
+#include <numeric>
+
+#include "grammar/engine/diagnostics.h"
+#include "grammar/engine/lexer_match.h"
+#include "grammar/engine/reports.h"
+
+namespace zr::engine {
+
+LexedText::LexedText(const LexerTable& table, std::u16string_view text) : table_(&table), text_(text) {
+    read();
+}
+
+void LexedText::read() {
+    // A guess that text as people write it rarely exceeds.
+    constexpr std::size_t kUnitsOfToken = 5;
+    tokens_.reserve(text_.size() / kUnitsOfToken + 8);
+    types_.reserve(tokens_.capacity());
+    const LexerTable& table = *table_;
+    const char16_t* const units = text_.data();
+    const char16_t* const end = units + text_.size();
+    const bool reports = zr::diagnosticsWanted();
+    PlaceFinder places(text_);
+    const auto offset = [units](const char16_t* at) { return static_cast<std::uint32_t>(at - units); };
+    for (const char16_t* start = units; start < end;) {
+        const LexerMatch match = longestMatch(table, start, end);
+        if (match.rule == kNone16) {
+            if (reports) reportDropped(places.at(offset(start)), *start);
+            ++start;
+            continue;
+        }
+        add({offset(start), offset(match.end), table.rules[match.rule].token, match.rule});
+        start = match.end;
+    }
+}
+
+void LexedText::add(const LexedToken& token) {
+    if (table_->rules[token.rule].hidden == 0) {
+        if (hasHidden_) seen_.push_back(count());
+        types_.push_back(token.type);
+    } else if (!hasHidden_) {
+        // Up to here positions and indexes were the same.
+        hasHidden_ = true;
+        seen_.resize(count());
+        std::iota(seen_.begin(), seen_.end(), 0u);
+    }
+    tokens_.push_back(token);
+}
+
+std::u16string_view LexedText::textOf(std::uint32_t index) const {
+    const std::u16string_view units = unitsOf(index);
+    const LexRuleRow& rule = table_->rules[tokens_[index].rule];
+    const std::size_t cut = std::min<std::size_t>(units.size(), rule.cutFront + rule.cutBack);
+    return units.substr(std::min<std::size_t>(rule.cutFront, units.size()), units.size() - cut);
+}
+
+}  // namespace zr::engine
