@@ -97,6 +97,7 @@ class Maker {
         addQueries();
         addTables();
         addKeys();
+        addFunctions();
         database_->ResolveReferences();
         return std::move(database_);
     }
@@ -212,6 +213,16 @@ class Maker {
         table.addForeignKey(std::move(key));
     }
 
+    // The model knows a function by its name alone: of several the one with the most parameters stays.
+    void addFunctions() {
+        for (const CatalogRows::Function& function : rows_.functions) {
+            if (!isWanted(function)) continue;
+            int& parameters = parametersOf_.try_emplace(function.name, 0).first->second;
+            parameters = std::max(parameters, function.parameters);
+            database_->UserFunctions[function.name].Format(u"%d", parameters);
+        }
+    }
+
     struct Known {
         Table* table = nullptr;
         CString schema;
@@ -223,6 +234,7 @@ class Maker {
     std::unique_ptr<Database> database_;
     std::unordered_map<CString, CString> schemaOfView_;
     std::unordered_map<CString, Known> tables_;
+    std::unordered_map<CString, int> parametersOf_;
 };
 
 }  // namespace

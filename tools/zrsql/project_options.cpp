@@ -54,7 +54,8 @@ void ProjectWords::addTo(CLI::App& app) {
         "import", "Make a project of what a database tells of itself: tables, keys and views");
     imported
         ->add_option("CATALOGUE", catalogue_,
-                     "An SQLite database, or a CSV or JSON dump of INFORMATION_SCHEMA or Oracle's ALL_ views")
+                     "An SQLite database, a CSV or JSON dump of INFORMATION_SCHEMA or Oracle's ALL_ views, or a "
+                     "server, such as postgresql://USER@HOST:PORT/DATABASE?schema=NAME")
         ->required();
     imported->add_option("PROJECT", options_.file, "The project to make, a JSON or SQLite file")->required();
     commands_.emplace_back(imported, ProjectCommand::Import);
@@ -69,7 +70,9 @@ void ProjectWords::addTo(CLI::App& app) {
     imported->add_option("--schema", options_.schema, "Take this schema or owner only")->type_name("NAME");
     addForm(*imported);
     imported->footer(
-        "Example:\n  zrsql project import columns.csv shop.json -d mssql --also views.csv --schema dbo\n\n"
+        "Examples:\n  zrsql project import columns.csv shop.json -d mssql --also views.csv --schema dbo\n"
+        "  zrsql project import mysql://reader@db.example/shop shop.json -d mysql\n\n"
+        "Passwords are taken from PGPASSWORD or ~/.pgpass, MYSQL_PWD or ~/.my.cnf.\n"
         "What can't be taken in is told on standard error, a line each, and the rest goes on.");
 
     CLI::App* table = add("add-table", "Add a table", ProjectCommand::AddTable);
