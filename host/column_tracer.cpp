@@ -10,6 +10,7 @@ namespace {
 
 constexpr const char16_t* kStar = u"*";
 constexpr int kStarPredicate = 5;  // PostgreSQL's select list of nothing but "*"
+constexpr std::u16string_view kCastMark = u"CAST";
 
 void addNew(ColumnOrigins& to, const ColumnOrigins& origins) {
     for (const ColumnOrigin& origin : origins)
@@ -271,7 +272,9 @@ Unknown ColumnTracer::missingOf(const CZRQueryInfo& query) const {
 }
 
 ResultColumn ColumnTracer::columnOf(const SelectItem& item, const CZRQueryInfo& query) {
-    ResultColumn column{nameOf(item), isAlias(item) ? item.m_items.GetHead() : &item, {}, {}};
+    const bool isNamed = isAlias(item);
+    ResultColumn column{
+        isNamed ? nameOf(item) : withoutCast(nameOf(item)), isNamed ? item.m_items.GetHead() : &item, {}, {}};
     Origins origins;
     addOriginsIn(origins, *column.expression, query);
     column.origins = std::move(origins.ends);
@@ -316,7 +319,7 @@ std::vector<ColumnUse> ColumnTracer::usesOf(const CZRQueryInfo& query) {
             // Rows are ordered by result columns, where one has the name.
             if (name == "order by" && field->m_sourceTable.IsEmpty() && field->m_tableAlias.IsEmpty()) {
                 for (const ResultColumn& column : results)
-                    if (column.name.EqualsNoCase(nameOf(*field)))
+                    if (column.name.EqualsNoCase(withoutCast(nameOf(*field))))
                         return add(name, {column.origins, column.steps});
             }
             if (part.m_kind == SIK_FIELD_LIKE || field->m_sourceField.IsEmpty() ||
@@ -349,8 +352,23 @@ std::vector<const CZRSourceInfo*> ColumnTracer::objectsReadBy(const CZRQueryInfo
 
 ColumnTracer::Origins ColumnTracer::originsOf(const SelectItemField& field, const CZRQueryInfo& query) {
     const CString& qualifier = field.m_tableAlias.IsEmpty() ? field.m_sourceTable : field.m_tableAlias;
-    return qualifier.IsEmpty() ? unqualified(field.m_sourceField, query)
-                               : qualified(qualifier, field.m_sourceField, query);
+    const auto named = [&](const CString& name) {
+        return qualifier.IsEmpty() ? unqualified(name, query) : qualified(qualifier, name, query);
+    };
+    Origins origins = named(field.m_sourceField);
+    const bool isKnown = std::all_of(origins.ends.begin(), origins.ends.end(),
+                                     [](const ColumnOrigin& origin) { return origin.isKnown(); });
+    if (const CString name = withoutCast(field.m_sourceField); !isKnown && name != field.m_sourceField)
+        return named(name);
+    return origins;
+}
+
+// PostgreSQL's grammar leaves a mark of a cast in the column's name: o.id::text is the column "idCAST".
+CString ColumnTracer::withoutCast(const CString& name) const {
+    const std::u16string_view text = name.View();
+    const bool hasMark =
+        database_.GetDBType() == DB_POSTGRESQL && text.size() > kCastMark.size() && text.ends_with(kCastMark);
+    return hasMark ? CString(text.substr(0, text.size() - kCastMark.size())) : name;
 }
 
 ColumnTracer::Origins ColumnTracer::qualified(const CString& qualifier, const CString& column,

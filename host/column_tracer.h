@@ -121,6 +121,7 @@ class ColumnTracer {
     Origins originsOf(const SelectItemField& field, const CZRQueryInfo& query);
     Origins qualified(const CString& qualifier, const CString& column, const CZRQueryInfo& query);
     Origins unqualified(const CString& column, const CZRQueryInfo& query);
+    CString withoutCast(const CString& name) const;
     Origins originsIn(const Source& source, const CString& column);
     const CZRQueryInfo* queryAround(const CZRQueryInfo& query) const;
     const ResultColumn* findColumn(const CZRQueryInfo& query, const CString& name) const;
