@@ -107,6 +107,14 @@ TEST_F(CatalogReading, LeavesTheSqliteDatabaseAsItIs) {
     EXPECT_FALSE(std::filesystem::exists(file + "-journal"));
 }
 
+TEST_F(CatalogReading, KeepsOfFunctionsOfOneNameTheOneWithTheMostParameters) {
+    rows.functions = {{u"a", u"twice", 2}, {u"a", u"twice", 1}, {u"b", u"other", 0}, {u"a", u"none", 0}};
+    const Database& made = make(DB_POSTGRESQL, u"a");
+    EXPECT_EQ(made.UserFunctions.GetCount(), 2);
+    EXPECT_EQ(*made.UserFunctions.Find(u"twice"), u"2");
+    EXPECT_EQ(*made.UserFunctions.Find(u"none"), u"0");
+}
+
 TEST_F(CatalogReading, TellsWhatIsWrongWithAFile) {
     const auto complaint = [&](const std::string& file) -> std::string {
         try {

@@ -302,6 +302,36 @@ TEST_F(LineageOfPostgres, SpreadsStars) {
         (Texts{"id: customers.id", "name: customers.name", "city: customers.city", "most: orders.total"}));
 }
 
+TEST_F(LineageOfPostgres, FollowsColumnsThatAreCast) {
+    EXPECT_EQ(
+        columnsOf(u"SELECT o.id::text AS a, total::numeric(10,2), min(o.customer_id::int::text) AS low, "
+                  u"(o.id)::bigint AS b, x.c::text AS c FROM orders o, secrets x"),
+        (Texts{"a: orders.id", "total: orders.total", "low: orders.customer_id", "b: orders.id",
+               "c: secrets.c (the project does not tell the columns of the table)"}));
+}
+
+TEST_F(LineageOfPostgres, KnowsUsesOfColumnsThatAreCast) {
+    addQuery(u"v", u"SELECT o.id FROM orders o WHERE o.total::text = 'x' AND (customer_id)::text = 'y'");
+    EXPECT_EQ(uses(u"v"), (Texts{"where: orders.total", "where: orders.customer_id"}));
+}
+
+TEST_F(LineageOfPostgres, LeavesAColumnAloneThatIsNamedLikeACastOne) {
+    addTable(u"marked", {u"id", u"idCAST"});
+    EXPECT_EQ(columnsOf(u"SELECT m1.idCAST AS a, m1.id::text AS b FROM marked m1"),
+              (Texts{"a: marked.idCAST", "b: marked.idCAST"}))
+        << "which of the two is meant can't be told";
+}
+
+TEST_F(LineageOfPostgres, KnowsNoMarkOfACastInOtherDialects) {
+    Database other(DB_MSSQL);
+    auto query = std::make_unique<Query>(DB_MSSQL);
+    setNames(*query, u"v");
+    query->SetSQL(u"SELECT idCAST FROM orders");
+    other.addQuery(std::move(query));
+    Lineage traced(other);
+    EXPECT_EQ(traced.tracer().columnsOf(*other.Queries.GetHead())[0].name, u"idCAST");
+}
+
 class LineageOfMysql : public Traced {
  protected:
     LineageOfMysql() : Traced(DB_MYSQL) {}
