@@ -168,9 +168,15 @@ std::string CatalogUrl::text() const {
     return text;
 }
 
-ServerSettings takeSettings(CatalogUrl& url) {
+ServerSettings takeSettings(CatalogUrl& url, const CString& schema) {
     ServerSettings settings;
-    settings.schema = url.take("schema").value_or(std::string());
+    settings.schema = schema.toUtf8();
+    if (const auto named = url.take("schema")) {
+        if (!settings.schema.empty() && settings.schema != *named)
+            throw CatalogReadError(url.shown() + ": the address names the schema " + *named +
+                                   ", and the schema " + settings.schema + " is asked for");
+        settings.schema = *named;
+    }
     if (const auto seconds = url.take("connect_timeout")) {
         settings.connectSeconds = secondsIn(url, "connect_timeout", *seconds);
         settings.tellsConnectSeconds = true;

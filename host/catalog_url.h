@@ -6,6 +6,8 @@
 #include <utility>
 #include <vector>
 
+#include "zrparsersql/wide_string.h"
+
 namespace zr::host {
 
 // The address of a database on a server, SCHEME://USER@HOST:PORT/DATABASE?NAME=VALUE&...
@@ -46,7 +48,8 @@ struct ServerSettings {
     unsigned lockSeconds = 5;
 };
 
-// Takes the parameters schema, connect_timeout and statement_timeout out of the address.
-ServerSettings takeSettings(CatalogUrl& url);
+// Takes the parameters schema, connect_timeout and statement_timeout out of the address; a schema that is
+// asked for besides has to be the same. Raises CatalogReadError.
+ServerSettings takeSettings(CatalogUrl& url, const CString& schema = {});
 
 }  // namespace zr::host

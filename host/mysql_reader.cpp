@@ -87,8 +87,8 @@ class Connection {
 
 class MysqlReader : public CatalogReader {
  public:
-    explicit MysqlReader(CatalogUrl url) : url_(std::move(url)) {
-        settings_ = takeSettings(url_);
+    MysqlReader(CatalogUrl url, const CString& schema) : url_(std::move(url)) {
+        settings_ = takeSettings(url_, schema);
         socket_ = url_.take("socket").value_or(std::string());
         if (!url_.parameters.empty())
             throw CatalogReadError(url_.shown() + ": there is no parameter \"" +
@@ -230,8 +230,8 @@ class MysqlReader : public CatalogReader {
 
 }  // namespace
 
-std::unique_ptr<CatalogReader> mysqlReader(CatalogUrl url) {
-    return std::make_unique<MysqlReader>(std::move(url));
+std::unique_ptr<CatalogReader> mysqlReader(CatalogUrl url, const CString& schema) {
+    return std::make_unique<MysqlReader>(std::move(url), schema);
 }
 
 }  // namespace zr::host

@@ -140,7 +140,9 @@ std::string arrayOf(const std::vector<std::string>& words) {
 
 class PostgresqlReader : public CatalogReader {
  public:
-    explicit PostgresqlReader(CatalogUrl url) : url_(std::move(url)) { settings_ = takeSettings(url_); }
+    PostgresqlReader(CatalogUrl url, const CString& schema) : url_(std::move(url)) {
+        settings_ = takeSettings(url_, schema);
+    }
 
     CString schema() const override { return CString::fromUtf8(settings_.schema); }
 
@@ -310,8 +312,8 @@ class PostgresqlReader : public CatalogReader {
 
 }  // namespace
 
-std::unique_ptr<CatalogReader> postgresqlReader(CatalogUrl url) {
-    return std::make_unique<PostgresqlReader>(std::move(url));
+std::unique_ptr<CatalogReader> postgresqlReader(CatalogUrl url, const CString& schema) {
+    return std::make_unique<PostgresqlReader>(std::move(url), schema);
 }
 
 }  // namespace zr::host

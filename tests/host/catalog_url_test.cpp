@@ -110,6 +110,23 @@ TEST(ServerSettings, ComeFromTheAddress) {
     EXPECT_EQ(url.text(), "postgresql://db/x?sslmode=require") << "the rest is the client library's";
 }
 
+TEST(ServerSettings, TakeTheSchemaThatIsAskedForBesides) {
+    CatalogUrl plain = parseUrl("mysql://db/x");
+    EXPECT_EQ(takeSettings(plain, u"s").schema, "s");
+    CatalogUrl same = parseUrl("mysql://db/x?schema=s");
+    EXPECT_EQ(takeSettings(same, u"s").schema, "s");
+    CatalogUrl other = parseUrl("mysql://db/x?schema=t");
+    EXPECT_EQ(complaint([&] { takeSettings(other, u"s"); }),
+              "mysql://db/x: the address names the schema t, and the schema s is asked for");
+}
+
+TEST(KindOfServer, IsToldByItsAddress) {
+    EXPECT_EQ(kindOfServer("postgres://db/x"), DB_POSTGRESQL);
+    EXPECT_EQ(kindOfServer("MariaDB://db/x"), DB_MYSQL);
+    EXPECT_EQ(kindOfServer("oracle://db/x"), std::nullopt);
+    EXPECT_EQ(kindOfServer("postgres"), std::nullopt);
+}
+
 TEST(ServerSettings, HaveTimesOutOfTheBox) {
     CatalogUrl url = parseUrl("mysql://db/x");
     const ServerSettings settings = takeSettings(url);

@@ -197,6 +197,14 @@ TEST_F(FromPostgresql, ASchemaWithoutRightsAloneGivesNoProject) {
                     "zrsql: " + address("postgres?schema=secret") + ": there is no table or view in it"));
 }
 
+TEST_F(FromPostgresql, TheAddressTellsTheDialectAndTheOptionTheSchema) {
+    const ProgramResult result =
+        runZrsql({"project", "import", address("postgres"), project(), "--schema", "shop", "--force"});
+    EXPECT_EQ(result.output, "40 tables and 60 queries; 0 left out\n") << result.errors;
+    EXPECT_THAT(runZrsql({"project", "list", project()}).output,
+                HasSubstr(": JSON, postgresql, schema shop\n"));
+}
+
 TEST_F(FromPostgresql, ASchemaThatIsNotThereIsToldWithThoseThatAre) {
     EXPECT_EQ(failure(address("postgres?schema=shopp")),
               shown() + ": there is no schema \"shopp\"; there are Odd One, public, secret, shop");

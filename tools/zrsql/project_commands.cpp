@@ -84,7 +84,7 @@ void importCatalogue(const ProjectOptions& options, std::string& out) {
     host::CatalogRows rows;
     CString schema = CString::fromUtf8(options.schema);
     for (const std::string& catalogue : options.catalogues) {
-        const auto reader = host::readerFor(catalogue);
+        const auto reader = host::readerFor(catalogue, CString::fromUtf8(options.schema));
         if (schema.IsEmpty()) schema = reader->schema();
         reader->read(rows);
     }
