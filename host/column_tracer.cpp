@@ -36,6 +36,17 @@ CString nameOf(const SelectItem& item) {
     return u"-";
 }
 
+// A bare name that is an alias, too: descriptors leave its text alone, without what the alias stands for.
+bool isBareAlias(const SelectItemField& field, const CZRQueryInfo& query) {
+    return field.m_sourceField.IsEmpty() && field.m_sourceTable.IsEmpty() && field.m_tableAlias.IsEmpty() &&
+           field.m_items.IsEmpty() && query.m_aliases.Contains(field.m_text.View());
+}
+
+bool isAllKnown(const ColumnOrigins& origins) {
+    return std::all_of(origins.begin(), origins.end(),
+                       [](const ColumnOrigin& origin) { return origin.isKnown(); });
+}
+
 // Dialects may end a query's analysis at a nested query in its first clause.
 bool endsInFirstClause(const CZRQueryInfo& query) {
     return query.m_selectItems.IsEmpty() && !query.m_subQueries.IsEmpty();
@@ -130,9 +141,19 @@ const ColumnTracer::Sources& ColumnTracer::sourcesOf(const CZRQueryInfo& query) 
             source.query = meaning.query;
             source.isStored = meaning.query != nullptr;
         }
+        if (from.isBehindJoin && source.isOpen() && isAliasOfLast(place->second)) {
+            place->second.back().alias = source.name;
+            continue;
+        }
         place->second.push_back(std::move(source));
     }
     return place->second;
+}
+
+// Whether a name behind a join that is nothing in the database is meant as the name of the source before it.
+bool ColumnTracer::isAliasOfLast(const Sources& sources) const {
+    return database_.GetDBType() == DB_MYSQL && !sources.empty() && sources.back().alias.IsEmpty() &&
+           !sources.back().name.IsEmpty();
 }
 
 std::vector<const CZRQueryInfo*> ColumnTracer::adopt(const CZRQueryInfo& query) {
@@ -290,6 +311,11 @@ void ColumnTracer::addOriginsIn(Origins& origins, const SelectItem& expression, 
             const Origins found = originsOf(*itemClass.field, query);
             addNew(origins.ends, found.ends);
             addNew(origins.steps, found.steps);
+        } else if (itemClass.field && isBareAlias(*itemClass.field, query)) {
+            // SQL knows no aliases within a select list: the name is a column's.
+            const Origins found = unqualified(itemClass.field->m_text, query);
+            addNew(origins.ends, found.ends);
+            addNew(origins.steps, found.steps);
         }
         const Columns* const nested = itemClass.query ? tracedColumns(*itemClass.query) : nullptr;
         if (!nested) return;
@@ -321,6 +347,13 @@ std::vector<ColumnUse> ColumnTracer::usesOf(const CZRQueryInfo& query) {
                 for (const ResultColumn& column : results)
                     if (column.name.EqualsNoCase(withoutCast(nameOf(*field))))
                         return add(name, {column.origins, column.steps});
+            }
+            if (isBareAlias(*field, reader)) {
+                Origins column = unqualified(field->m_text, reader);
+                if (isAllKnown(column.ends)) return add(name, std::move(column));
+                for (const ResultColumn& result : results)
+                    if (result.name.EqualsNoCase(field->m_text))
+                        return add(name, {result.origins, result.steps});
             }
             if (part.m_kind == SIK_FIELD_LIKE || field->m_sourceField.IsEmpty() ||
                 field->m_sourceField == kStar)
@@ -356,10 +389,8 @@ ColumnTracer::Origins ColumnTracer::originsOf(const SelectItemField& field, cons
         return qualifier.IsEmpty() ? unqualified(name, query) : qualified(qualifier, name, query);
     };
     Origins origins = named(field.m_sourceField);
-    const bool isKnown = std::all_of(origins.ends.begin(), origins.ends.end(),
-                                     [](const ColumnOrigin& origin) { return origin.isKnown(); });
-    if (const CString name = withoutCast(field.m_sourceField); !isKnown && name != field.m_sourceField)
-        return named(name);
+    const CString name = withoutCast(field.m_sourceField);
+    if (!isAllKnown(origins.ends) && name != field.m_sourceField) return named(name);
     return origins;
 }
 

@@ -105,6 +105,7 @@ class ColumnTracer {
     };
 
     const Sources& sourcesOf(const CZRQueryInfo& query);
+    bool isAliasOfLast(const Sources& sources) const;
     // Notes what is nested where. Gives the query and all nested ones.
     std::vector<const CZRQueryInfo*> adopt(const CZRQueryInfo& query);
     std::vector<const CZRQueryInfo*> queriesBehind(const CZRQueryInfo& query);

@@ -290,6 +290,19 @@ TEST_F(LineageImpact, OfARingEnds) {
     EXPECT_EQ(std::count(all.begin(), all.end(), "1 r1: y | | r2"), 1);
 }
 
+TEST_F(LineageOfColumns, TakesANameThatIsAnAliasTooForTheColumn) {
+    EXPECT_EQ(columnsOf(u"SELECT city AS city, name AS n, n AS k, orders.total AS total, total * 2 AS twice "
+                        u"FROM customers, orders"),
+              (Texts{"city: customers.city", "n: customers.name", "k: ?.n (no source of the query has it)",
+                     "total: orders.total", "twice: orders.total"}));
+}
+
+TEST_F(LineageOfColumns, TakesANameOfAConditionForTheColumnOrElseForTheAlias) {
+    addQuery(u"v",
+             u"SELECT name AS city, total + 1 AS more FROM customers, orders WHERE city = 'x' GROUP BY more");
+    EXPECT_EQ(uses(u"v"), (Texts{"where: customers.city", "group by: orders.total"}));
+}
+
 class LineageOfPostgres : public Traced {
  protected:
     LineageOfPostgres() : Traced(DB_POSTGRESQL) {}
@@ -341,6 +354,32 @@ TEST_F(LineageOfMysql, FollowsQuotedNamesAndUnions) {
     EXPECT_EQ(
         columnsOf(u"SELECT `o`.`id` AS `n`, total FROM `orders` `o` UNION SELECT id, name FROM customers"),
         (Texts{"n: orders.id, customers.id", "total: orders.total, customers.name"}));
+}
+
+// Joins without ON, as MariaDB prints tables with commas between them.
+TEST_F(LineageOfMysql, KnowsTheLastAliasOfJoinsWithoutConditions) {
+    addTable(u"limits", {u"low"});
+    EXPECT_EQ(columnsOf(u"select `o`.`id` AS `id`,`l`.`low` AS `low`,`city` AS `city`,`c`.`name` AS `name` "
+                        u"from `s`.`orders` `o` join "
+                        u"`s`.`customers` `c` join `s`.`limits` `l` where `o`.`id` = `l`.`low`"),
+              (Texts{"id: orders.id", "low: limits.low", "city: customers.city", "name: customers.name"}));
+    EXPECT_EQ(uses(u"q"), (Texts{"where: orders.id", "where: limits.low"}));
+}
+
+TEST_F(LineageOfMysql, KnowsTheLastAliasOfFourJoinedTables) {
+    addTable(u"limits", {u"low"});
+    addTable(u"tags", {u"label"});
+    EXPECT_EQ(
+        columnsOf(
+            u"select o.id, c.name, l.low, x.label from orders o join customers c join limits l join tags x"),
+        (Texts{"id: orders.id", "name: customers.name", "low: limits.low", "label: tags.label"}));
+}
+
+TEST_F(LineageOfMysql, TakesATableBehindJoinsForNoAlias) {
+    addTable(u"limits", {u"low"});
+    addTable(u"tags", {u"label"});
+    EXPECT_EQ(columnsOf(u"select orders.id, low, label from orders join customers join limits join tags"),
+              (Texts{"id: orders.id", "low: limits.low", "label: tags.label"}));
 }
 
 class LineageOfOracle : public Traced {
