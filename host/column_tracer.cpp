@@ -38,8 +38,11 @@ CString nameOf(const SelectItem& item) {
 
 // A bare name that is an alias, too: descriptors leave its text alone, without what the alias stands for.
 bool isBareAlias(const SelectItemField& field, const CZRQueryInfo& query) {
-    return field.m_sourceField.IsEmpty() && field.m_sourceTable.IsEmpty() && field.m_tableAlias.IsEmpty() &&
-           field.m_items.IsEmpty() && query.m_aliases.Contains(field.m_text.View());
+    if (!field.m_sourceField.IsEmpty() || !field.m_sourceTable.IsEmpty() || !field.m_tableAlias.IsEmpty() ||
+        !field.m_items.IsEmpty())
+        return false;
+    const CString oracleKey = field.m_text + u"_FIELD";
+    return query.m_aliases.Contains(field.m_text.View()) || query.m_aliases.Contains(oracleKey.View());
 }
 
 bool isAllKnown(const ColumnOrigins& origins) {

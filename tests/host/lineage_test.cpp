@@ -387,6 +387,12 @@ class LineageOfOracle : public Traced {
     LineageOfOracle() : Traced(DB_ORACLE) {}
 };
 
+TEST_F(LineageOfOracle, TakesANameThatIsAnAliasTooForTheColumn) {
+    EXPECT_EQ(
+        columnsOf(u"SELECT city AS city, total * 2 AS twice, orders.total AS total FROM customers, orders"),
+        (Texts{"city: customers.city", "twice: orders.total", "total: orders.total"}));
+}
+
 TEST_F(LineageOfOracle, FollowsNamesOfAnyCase) {
     EXPECT_EQ(columnsOf(u"SELECT O.ID N, C.NAME FROM ORDERS O, CUSTOMERS C WHERE O.CUSTOMER_ID = C.ID"),
               (Texts{"N: orders.id", "NAME: customers.name"}));

@@ -1,9 +1,11 @@
 #include "expected_lineage.h"
 
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <ostream>
+#include <iostream>
+#include <map>
 #include <sstream>
 
 #include "program.h"
@@ -60,57 +62,95 @@ std::ostream& operator<<(std::ostream& out, const Score& score) {
                << " missed: precision " << score.precision() << ", recall " << score.recall();
 }
 
-Comparison compare(tool::TracedProject& project, const std::vector<std::string>& files) {
-    std::map<std::string, std::vector<std::pair<std::string, Names>>> expected;
-    for (const auto& [name, sources] : readLines(files)) {
-        const std::size_t dot = name.find('.');
-        expected[name.substr(0, dot)].emplace_back(name.substr(dot + 1), wordsOf(sources));
+namespace {
+
+// The lineage of a project beside what is expected of it.
+class Comparison {
+ public:
+    Comparison(tool::TracedProject& project, const std::vector<std::string>& files) {
+        for (const auto& [name, sources] : readLines(files)) {
+            const std::size_t dot = name.find('.');
+            expected_[name.substr(0, dot)].emplace_back(name.substr(dot + 1), wordsOf(sources));
+        }
+        // The queries stand in the order in which they read from each other.
+        for (const CZRQueryInfo* query : project.database().Queries) compare(project, *query);
+        EXPECT_EQ(expected_.size(), views);
     }
-    Comparison result;
-    host::ColumnTracer& tracer = project.lineage().tracer();
-    // The queries stand in the order in which they read from each other.
-    for (const CZRQueryInfo* query : project.database().Queries) {
-        ++result.views;
-        const std::string view = query->GetSrcName().toUtf8();
-        const auto& wanted = expected[view];
-        const auto& columns = tracer.columnsOf(*query);
 
-        bool isUponOthers = false;
-        for (const CZRSourceInfo* object : tracer.objectsReadBy(*query)) {
-            const std::string name = object->GetSrcName().toUtf8();
-            isUponOthers =
-                isUponOthers || result.notWhole.contains(name) || result.uponNotWhole.contains(name);
-        }
-        const bool isWhole = !project.readPlaceOf(*query).stop;
-        if (!isWhole)
-            result.notWhole.insert(view);
-        else if (isUponOthers)
-            result.uponNotWhole.insert(view);
-        const bool isMeasured = isWhole && !isUponOthers;
+    std::size_t views = 0;
+    std::size_t columns = 0;  // of views that are measured
+    Score score;              // of the sources of these
+    Names notWhole;
+    Names uponNotWhole;
+    Names unlike;  // views that are not read whole or have other columns, and columns with other sources
+    Names wrong;   // "view.column: table.column" that is told and not expected
 
-        if (isMeasured) {
-            result.columns += wanted.size();
-            bool isSame = columns.size() == wanted.size();
-            for (std::size_t at = 0; isSame && at < columns.size(); ++at)
-                isSame = columns[at].name.toUtf8() == wanted[at].first;
-            if (!isSame) result.differences.insert(view);
-        }
-        for (const auto& [column, sources] : wanted) {
-            const auto found =
-                std::find_if(columns.begin(), columns.end(),
-                             [&](const host::ResultColumn& each) { return each.name.toUtf8() == column; });
-            const Names names = found == columns.end() ? Names() : known(found->origins);
-            for (const std::string& name : names)
-                if (!sources.contains(name)) result.claims.push_back(view + "." + column + ": " + name);
-            if (!isMeasured) continue;
-            result.score.add(sources, names);
-            const bool hasUnknown = found != columns.end() && names.size() != found->origins.size();
-            if (names != sources || hasUnknown) result.differences.insert(view + "." + column);
-        }
+ private:
+    void compare(tool::TracedProject& project, const CZRQueryInfo& query) {
+        ++views;
+        const std::string view = query.GetSrcName().toUtf8();
+        const auto& wanted = expected_[view];
         EXPECT_FALSE(wanted.empty()) << "nothing is expected of " << view;
+        const auto& found = project.lineage().tracer().columnsOf(query);
+        const bool isMeasured = noteReading(project, query, view);
+        if (isMeasured) {
+            columns += wanted.size();
+            const bool isSame = std::equal(found.begin(), found.end(), wanted.begin(), wanted.end(),
+                                           [](const host::ResultColumn& column, const auto& entry) {
+                                               return column.name.toUtf8() == entry.first;
+                                           });
+            if (!isSame) unlike.insert(view);
+        }
+        for (const auto& entry : wanted) {
+            const std::string& column = entry.first;
+            const Names& sources = entry.second;
+            const auto place = std::find_if(
+                found.begin(), found.end(),
+                [&column](const host::ResultColumn& each) { return each.name.toUtf8() == column; });
+            const host::ColumnOrigins origins = place == found.end() ? host::ColumnOrigins() : place->origins;
+            const Names names = known(origins);
+            for (const std::string& name : names)
+                if (!sources.contains(name)) wrong.insert(view + "." + column + ": " + name);
+            if (!isMeasured) continue;
+            score.add(sources, names);
+            if (names != sources || names.size() != origins.size()) unlike.insert(view + "." + column);
+        }
     }
-    EXPECT_EQ(expected.size(), result.views);
-    return result;
+
+    // Whether the view was read whole, and so were those behind it.
+    bool noteReading(tool::TracedProject& project, const CZRQueryInfo& query, const std::string& view) {
+        if (project.readPlaceOf(query).stop) {
+            notWhole.insert(view);
+            unlike.insert(view);
+            return false;
+        }
+        for (const CZRSourceInfo* object : project.lineage().tracer().objectsReadBy(query)) {
+            const std::string name = object->GetSrcName().toUtf8();
+            if (!notWhole.contains(name) && !uponNotWhole.contains(name)) continue;
+            uponNotWhole.insert(view);
+            return false;
+        }
+        return true;
+    }
+
+    std::map<std::string, std::vector<std::pair<std::string, Names>>> expected_;
+};
+
+}  // namespace
+
+void expectLineage(const std::string& project, const std::vector<std::string>& expectations,
+                   const std::string& gaps) {
+    tool::TracedProject traced(project);
+    Comparison comparison(traced, expectations);
+    Names named;
+    for (const auto& [name, why] : readLines({gaps})) named.insert(name);
+    EXPECT_EQ(comparison.unlike, named);
+    // Of views that are not measured, too, nothing is told that is wrong.
+    EXPECT_THAT(comparison.wrong, testing::IsEmpty());
+    std::cout << comparison.views << " views, " << comparison.notWhole.size()
+              << " of them not read to their end, " << comparison.uponNotWhole.size()
+              << " upon one of these. Sources of the " << comparison.columns
+              << " result columns of the others: " << comparison.score << "\n";
 }
 
 Names namedBy(tool::TracedProject& project, const CZRQueryInfo& query) {

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <map>
 #include <set>
 #include <string>
 #include <vector>
@@ -25,18 +24,12 @@ struct Score {
 };
 std::ostream& operator<<(std::ostream& out, const Score& score);
 
-// What the lineage of a project says, held against expectations ("view.column: table.column ...").
-struct Comparison {
-    std::size_t views = 0;
-    std::size_t columns = 0;  // of views that were read whole, and so were the views behind them
-    Score score;              // of these columns' sources
-    Names notWhole;           // views whose text was not read to its end
-    Names uponNotWhole;       // views that were read whole and read from such a one
-    Names differences;        // columns whose sources are others, and views whose columns are others
-    std::vector<std::string>
-        claims;  // known sources that are wrong, in any view: "view.column: table.column"
-};
-Comparison compare(tool::TracedProject& project, const std::vector<std::string>& files);
+// Holds the source columns of every result column of a project's views against the files of expectations,
+// lines "view.column: table.column ...", and prints precision and recall. A view is measured that was read to
+// its end, and so were all views behind it. What does not come out right has to be what the file of gaps
+// names: views that are not read to their end, columns with other sources, and views with other columns.
+void expectLineage(const std::string& project, const std::vector<std::string>& expectations,
+                   const std::string& gaps);
 
 // "source.column" of all that a query names itself, in any clause; what is unknown left out.
 Names namedBy(tool::TracedProject& project, const CZRQueryInfo& query);

@@ -13,7 +13,6 @@ namespace {
 
 using testing::ElementsAre;
 using testing::HasSubstr;
-using testing::IsEmpty;
 
 const std::string kClient = "MYSQL_PWD= mariadb --no-defaults -S FOLDER/socket -u root -N -B ";
 
@@ -56,19 +55,7 @@ TEST_F(FromMariaDb, TheLineageIsTheExpectedOne) {
     ASSERT_EQ(made.exitStatus, 0) << made.errors;
     EXPECT_EQ(made.output, "40 tables and 60 queries; 0 left out\n");
 
-    tool::TracedProject traced(project());
-    const Comparison found = compare(traced, {"lineage.txt", "lineage_mariadb.txt"});
-    Names gaps;
-    for (const auto& [name, why] : readLines({"gaps_mariadb.txt"})) gaps.insert(name);
-    Names differences = found.notWhole;
-    differences.insert(found.differences.begin(), found.differences.end());
-    EXPECT_EQ(differences, gaps);
-    EXPECT_THAT(found.claims, IsEmpty());
-    EXPECT_EQ(found.score.precision(), 1.0);
-    std::cout << "Of " << found.views << " views " << found.notWhole.size()
-              << " are not read to their end, and " << found.uponNotWhole.size()
-              << " rest upon one of these.\nSources of the " << found.columns
-              << " columns of the others: " << found.score << "\n";
+    expectLineage(project(), {"lineage.txt", "lineage_mariadb.txt"}, "gaps_mariadb.txt");
 }
 
 TEST_F(FromMariaDb, TheOtherNameOfTheAddressAndTheSocketServeAsWell) {

@@ -60,19 +60,7 @@ TEST_F(FromPostgresql, TheLineageIsTheExpectedOne) {
     ASSERT_EQ(made.exitStatus, 0) << made.errors;
     EXPECT_EQ(made.output, "40 tables and 60 queries; 0 left out\n");
 
-    tool::TracedProject traced(project());
-    const Comparison found = compare(traced, {"lineage.txt", "lineage_postgresql.txt"});
-    Names gaps;
-    for (const auto& [name, why] : readLines({"gaps_postgresql.txt"})) gaps.insert(name);
-    Names differences = found.notWhole;
-    differences.insert(found.differences.begin(), found.differences.end());
-    EXPECT_EQ(differences, gaps);
-    EXPECT_THAT(found.claims, IsEmpty());
-    EXPECT_EQ(found.score.precision(), 1.0);
-    std::cout << "Of " << found.views << " views " << found.notWhole.size()
-              << " are not read to their end, and " << found.uponNotWhole.size()
-              << " rest upon one of these.\nSources of the " << found.columns
-              << " columns of the others: " << found.score << "\n";
+    expectLineage(project(), {"lineage.txt", "lineage_postgresql.txt"}, "gaps_postgresql.txt");
 }
 
 // The server's own record of what a view depends on has every column that stands anywhere in it, of tables
