@@ -264,7 +264,7 @@ TEST_F(FromPostgresql, AServerThatFallsSilentIsGivenUp) {
 }
 
 TEST_F(FromPostgresql, AViewThatWaitsForALockIsLeftOutAndTheRestGoesOn) {
-    // The lock is let go when the session is ended, below.
+    // The lock is let go when its connection is ended, below.
     const std::string folder = server.folder();
     server.shell("PGAPPNAME=holder " + kPsql +
                  "-c 'BEGIN; LOCK TABLE shop.carriers; SELECT pg_sleep(60)' >/dev/null 2>&1 &");
