@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <charconv>
 #include <map>
+#include <set>
 #include <unordered_map>
 
 namespace zr::host {
@@ -97,6 +98,7 @@ class Maker {
         addQueries();
         addTables();
         addKeys();
+        addFunctions();
         database_->ResolveReferences();
         return std::move(database_);
     }
@@ -133,12 +135,12 @@ class Maker {
     void addTables() {
         std::vector<const CatalogRows::Column*> columns;
         for (const CatalogRows::Column& column : rows_.columns)
-            if (isWanted(column) && !schemaOfView_.contains(lower(column.table))) columns.push_back(&column);
+            if (isWanted(column) && !isOfView(column)) columns.push_back(&column);
         std::stable_sort(columns.begin(), columns.end(),
                          [](const auto* a, const auto* b) { return a->place < b->place; });
         // Tables stand in the order in which the rows tell them first.
         for (const CatalogRows::Column& column : rows_.columns)
-            if (isWanted(column) && !schemaOfView_.contains(lower(column.table))) tableOf(column);
+            if (isWanted(column) && !isOfView(column)) tableOf(column);
         for (const CatalogRows::Column* column : columns) {
             Table* const table = tableOf(*column);
             if (!table || column->name.IsEmpty()) continue;
@@ -154,21 +156,34 @@ class Maker {
         }
     }
 
-    // Null where a table of another schema has the name.
+    // Some catalogues tell the columns of views as well. A table of another schema that has a view's name is
+    // left out.
+    bool isOfView(const CatalogRows::Column& column) {
+        const auto view = schemaOfView_.find(lower(column.table));
+        if (view == schemaOfView_.end()) return false;
+        if (!view->second.EqualsNoCase(column.schema) && !column.schema.IsEmpty() && !view->second.IsEmpty())
+            leaveOut(column, "there is a view of that name, in " + view->second.toUtf8());
+        return true;
+    }
+
+    // Null where another table has the name, in another schema or with other capitals.
     Table* tableOf(const CatalogRows::Column& column) {
         Known& known = tables_[lower(column.table)];
         if (!known.table) {
             auto table = std::make_unique<Table>(database_->GetDBType());
             setNames(*table, column.table);
-            known = {&database_->addTable(std::move(table)), column.schema, {}};
+            known = {&database_->addTable(std::move(table)), column.schema};
         }
-        if (known.schema.EqualsNoCase(column.schema)) return known.table;
-        if (std::find(known.others.begin(), known.others.end(), column.schema) == known.others.end()) {
-            known.others.push_back(column.schema);
-            note("table " + column.schema.toUtf8() + "." + column.table.toUtf8() +
-                 ": left out; there is one of that name already, in " + known.schema.toUtf8());
-        }
+        const bool isSchema = known.schema.EqualsNoCase(column.schema);
+        if (isSchema && known.table->GetSrcName() == column.table) return known.table;
+        leaveOut(column, isSchema ? "there is a table " + known.table->GetSrcName().toUtf8() + " already"
+                                  : "there is one of that name already, in " + known.schema.toUtf8());
         return nullptr;
+    }
+
+    void leaveOut(const CatalogRows::Column& column, const std::string& why) {
+        if (leftOut_.emplace(column.schema, column.table).second)
+            note("table " + column.schema.toUtf8() + "." + column.table.toUtf8() + ": left out; " + why);
     }
 
     void addKeys() {
@@ -181,7 +196,8 @@ class Maker {
         for (const CatalogRows::Key* key : keys) byName[{lower(key->table), key->name}].push_back(key);
         for (const auto& [name, parts] : byName) {
             const auto found = tables_.find(name.first);
-            if (found == tables_.end() || !found->second.schema.EqualsNoCase(parts.front()->schema))
+            if (found == tables_.end() || !found->second.schema.EqualsNoCase(parts.front()->schema) ||
+                found->second.table->GetSrcName() != parts.front()->table)
                 note("key " + name.second.toUtf8() + ": left out; there is no table " +
                      parts.front()->table.toUtf8());
             else if (parts.front()->kind == CatalogRows::Key::Kind::Foreign)
@@ -212,10 +228,19 @@ class Maker {
         table.addForeignKey(std::move(key));
     }
 
+    // The model knows a function by its name alone: of several the one with the most parameters stays.
+    void addFunctions() {
+        for (const CatalogRows::Function& function : rows_.functions) {
+            if (!isWanted(function)) continue;
+            int& parameters = parametersOf_.try_emplace(function.name, 0).first->second;
+            parameters = std::max(parameters, function.parameters);
+            database_->UserFunctions[function.name].Format(u"%d", parameters);
+        }
+    }
+
     struct Known {
         Table* table = nullptr;
         CString schema;
-        std::vector<CString> others;  // schemas whose table of that name was left out
     };
 
     CatalogRows& rows_;
@@ -223,6 +248,8 @@ class Maker {
     std::unique_ptr<Database> database_;
     std::unordered_map<CString, CString> schemaOfView_;
     std::unordered_map<CString, Known> tables_;
+    std::set<std::pair<CString, CString>> leftOut_;  // schema and name of tables
+    std::unordered_map<CString, int> parametersOf_;
 };
 
 }  // namespace

@@ -11,7 +11,8 @@
 // Reading what a database tells of itself: tables, columns with types, keys and the texts of views.
 namespace zr::host {
 
-// A catalogue that can't be read at all; the message begins with the file's name.
+// A catalogue that can't be read at all; the message is one line that begins with the file's name or the
+// server's address.
 class CatalogReadError : public std::runtime_error {
  public:
     using std::runtime_error::runtime_error;
@@ -45,9 +46,15 @@ struct CatalogRows {
         CString name;
         std::optional<CString> text;  // with or without CREATE VIEW
     };
+    struct Function {
+        CString schema;
+        CString name;
+        int parameters = 0;
+    };
     std::vector<Column> columns;
     std::vector<Key> keys;
     std::vector<View> views;
+    std::vector<Function> functions;
     std::vector<std::string> notes;  // what was left out, and why: a line each
 };
 
@@ -57,11 +64,22 @@ class CatalogReader {
     virtual ~CatalogReader() = default;
     // Appends all that the source tells. Raises CatalogReadError.
     virtual void read(CatalogRows& rows) = 0;
+    // The one schema that it reads; empty: not one alone.
+    virtual CString schema() const { return {}; }
 };
 
-// The reader for a file, by its content: an SQLite database; a dump of INFORMATION_SCHEMA or of Oracle's ALL_
-// views as CSV or JSON. Raises CatalogReadError when it can't be opened.
-std::unique_ptr<CatalogReader> readerFor(const std::string& path);
+// The reader for the address of a server (postgresql://, mysql://, mariadb://), or for a file, by its
+// content: an SQLite database; a dump of INFORMATION_SCHEMA or of Oracle's ALL_ views as CSV or JSON. Raises
+// CatalogReadError when it can't be opened or is no part of this build. Of a server a schema that is given is
+// read alone; a file is read whole.
+std::unique_ptr<CatalogReader> readerFor(const std::string& source, const CString& schema = {});
+
+// The kind of database that the address of a server tells; nothing for a file or an address that is not
+// known.
+std::optional<DBTypes> kindOfServer(const std::string& source);
+
+// What this build can read, for people.
+std::vector<std::string> catalogReaders();
 
 // Makes the tables and queries of the rows; a name that is a view's is no table. With a schema, rows of
 // others are passed over. What can't be taken in is noted, and the rest goes on.

@@ -10,6 +10,7 @@ namespace {
 
 constexpr const char16_t* kStar = u"*";
 constexpr int kStarPredicate = 5;  // PostgreSQL's select list of nothing but "*"
+constexpr std::u16string_view kCastMark = u"CAST";
 
 void addNew(ColumnOrigins& to, const ColumnOrigins& origins) {
     for (const ColumnOrigin& origin : origins)
@@ -33,6 +34,20 @@ CString nameOf(const SelectItem& item) {
     if (const SelectItemField* field = classOf(item).field)
         return field->m_sourceField.IsEmpty() ? field->m_text : field->m_sourceField;
     return u"-";
+}
+
+// A bare name that is an alias, too: descriptors leave its text alone, without what the alias stands for.
+bool isBareAlias(const SelectItemField& field, const CZRQueryInfo& query) {
+    if (!field.m_sourceField.IsEmpty() || !field.m_sourceTable.IsEmpty() || !field.m_tableAlias.IsEmpty() ||
+        !field.m_items.IsEmpty())
+        return false;
+    const CString oracleKey = field.m_text + u"_FIELD";
+    return query.m_aliases.Contains(field.m_text.View()) || query.m_aliases.Contains(oracleKey.View());
+}
+
+bool isAllKnown(const ColumnOrigins& origins) {
+    return std::all_of(origins.begin(), origins.end(),
+                       [](const ColumnOrigin& origin) { return origin.isKnown(); });
 }
 
 // Dialects may end a query's analysis at a nested query in its first clause.
@@ -129,9 +144,19 @@ const ColumnTracer::Sources& ColumnTracer::sourcesOf(const CZRQueryInfo& query) 
             source.query = meaning.query;
             source.isStored = meaning.query != nullptr;
         }
+        if (from.isBehindJoin && source.isOpen() && isAliasOfLast(place->second)) {
+            place->second.back().alias = source.name;
+            continue;
+        }
         place->second.push_back(std::move(source));
     }
     return place->second;
+}
+
+// Whether a name behind a join that is nothing in the database is meant as the name of the source before it.
+bool ColumnTracer::isAliasOfLast(const Sources& sources) const {
+    return database_.GetDBType() == DB_MYSQL && !sources.empty() && sources.back().alias.IsEmpty() &&
+           !sources.back().name.IsEmpty();
 }
 
 std::vector<const CZRQueryInfo*> ColumnTracer::adopt(const CZRQueryInfo& query) {
@@ -271,7 +296,9 @@ Unknown ColumnTracer::missingOf(const CZRQueryInfo& query) const {
 }
 
 ResultColumn ColumnTracer::columnOf(const SelectItem& item, const CZRQueryInfo& query) {
-    ResultColumn column{nameOf(item), isAlias(item) ? item.m_items.GetHead() : &item, {}, {}};
+    const bool isNamed = isAlias(item);
+    ResultColumn column{
+        isNamed ? nameOf(item) : withoutCast(nameOf(item)), isNamed ? item.m_items.GetHead() : &item, {}, {}};
     Origins origins;
     addOriginsIn(origins, *column.expression, query);
     column.origins = std::move(origins.ends);
@@ -285,6 +312,11 @@ void ColumnTracer::addOriginsIn(Origins& origins, const SelectItem& expression, 
         // A reference to an alias has what it stands for below it.
         if (itemClass.field && part.m_kind != SIK_FIELD_LIKE && !itemClass.field->m_sourceField.IsEmpty()) {
             const Origins found = originsOf(*itemClass.field, query);
+            addNew(origins.ends, found.ends);
+            addNew(origins.steps, found.steps);
+        } else if (itemClass.field && isBareAlias(*itemClass.field, query)) {
+            // SQL knows no aliases within a select list: the name is a column's.
+            const Origins found = unqualified(itemClass.field->m_text, query);
             addNew(origins.ends, found.ends);
             addNew(origins.steps, found.steps);
         }
@@ -316,8 +348,15 @@ std::vector<ColumnUse> ColumnTracer::usesOf(const CZRQueryInfo& query) {
             // Rows are ordered by result columns, where one has the name.
             if (name == "order by" && field->m_sourceTable.IsEmpty() && field->m_tableAlias.IsEmpty()) {
                 for (const ResultColumn& column : results)
-                    if (column.name.EqualsNoCase(nameOf(*field)))
+                    if (column.name.EqualsNoCase(withoutCast(nameOf(*field))))
                         return add(name, {column.origins, column.steps});
+            }
+            if (isBareAlias(*field, reader)) {
+                Origins column = unqualified(field->m_text, reader);
+                if (isAllKnown(column.ends)) return add(name, std::move(column));
+                for (const ResultColumn& result : results)
+                    if (result.name.EqualsNoCase(field->m_text))
+                        return add(name, {result.origins, result.steps});
             }
             if (part.m_kind == SIK_FIELD_LIKE || field->m_sourceField.IsEmpty() ||
                 field->m_sourceField == kStar)
@@ -349,8 +388,21 @@ std::vector<const CZRSourceInfo*> ColumnTracer::objectsReadBy(const CZRQueryInfo
 
 ColumnTracer::Origins ColumnTracer::originsOf(const SelectItemField& field, const CZRQueryInfo& query) {
     const CString& qualifier = field.m_tableAlias.IsEmpty() ? field.m_sourceTable : field.m_tableAlias;
-    return qualifier.IsEmpty() ? unqualified(field.m_sourceField, query)
-                               : qualified(qualifier, field.m_sourceField, query);
+    const auto named = [&](const CString& name) {
+        return qualifier.IsEmpty() ? unqualified(name, query) : qualified(qualifier, name, query);
+    };
+    Origins origins = named(field.m_sourceField);
+    const CString name = withoutCast(field.m_sourceField);
+    if (!isAllKnown(origins.ends) && name != field.m_sourceField) return named(name);
+    return origins;
+}
+
+// PostgreSQL's grammar leaves a mark of a cast in the column's name: o.id::text is the column "idCAST".
+CString ColumnTracer::withoutCast(const CString& name) const {
+    const std::u16string_view text = name.View();
+    const bool hasMark =
+        database_.GetDBType() == DB_POSTGRESQL && text.size() > kCastMark.size() && text.ends_with(kCastMark);
+    return hasMark ? CString(text.substr(0, text.size() - kCastMark.size())) : name;
 }
 
 ColumnTracer::Origins ColumnTracer::qualified(const CString& qualifier, const CString& column,

@@ -105,6 +105,7 @@ class ColumnTracer {
     };
 
     const Sources& sourcesOf(const CZRQueryInfo& query);
+    bool isAliasOfLast(const Sources& sources) const;
     // Notes what is nested where. Gives the query and all nested ones.
     std::vector<const CZRQueryInfo*> adopt(const CZRQueryInfo& query);
     std::vector<const CZRQueryInfo*> queriesBehind(const CZRQueryInfo& query);
@@ -121,6 +122,7 @@ class ColumnTracer {
     Origins originsOf(const SelectItemField& field, const CZRQueryInfo& query);
     Origins qualified(const CString& qualifier, const CString& column, const CZRQueryInfo& query);
     Origins unqualified(const CString& column, const CZRQueryInfo& query);
+    CString withoutCast(const CString& name) const;
     Origins originsIn(const Source& source, const CString& column);
     const CZRQueryInfo* queryAround(const CZRQueryInfo& query) const;
     const ResultColumn* findColumn(const CZRQueryInfo& query, const CString& name) const;

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <unordered_map>
+#include <unordered_set>
 
 #include "host/descriptor_access.h"
 
@@ -23,11 +24,14 @@ const SelectItem* aliasedTable(const CZRAliasInfo& alias) {
 std::vector<FromSource> fromSources(const CZRQueryInfo& query) {
     std::vector<FromSource> sources;
     std::unordered_map<const SelectItem*, CString> aliases;
+    std::unordered_set<const SelectItem*> behindJoins;
     const auto add = [&](const SelectItem& item) {
         if (isAlias(item)) {
             aliases[item.m_items.GetHead()] = item.m_items.GetTail()->m_text;
             return;
         }
+        if (item.m_isOperator && item.m_name.EqualsNoCase(u"JOIN"))
+            behindJoins.insert(item.m_items.begin(), item.m_items.end());
         const ItemClass itemClass = classOf(item);
         FromSource source;
         if (itemClass.query)
@@ -37,6 +41,7 @@ std::vector<FromSource> fromSources(const CZRQueryInfo& query) {
         else
             return;  // such as a column of a join's condition
         if (const auto alias = aliases.find(&item); alias != aliases.end()) source.alias = alias->second;
+        source.isBehindJoin = behindJoins.contains(&item);
         sources.push_back(source);
     };
     for (const SelectItem* item : query.m_fromItems) forEachItem(*item, add);

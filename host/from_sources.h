@@ -11,6 +11,8 @@ struct FromSource {
     const SelectItemField* table = nullptr;
     const CZRQueryInfo* query = nullptr;
     CString alias;  // empty: none
+    // A bare name behind both sides of a join, as MySQL's grammar leaves the last alias of joins without ON.
+    bool isBehindJoin = false;
 };
 
 // The sources of a query's FROM clause, in order. Of any depth.

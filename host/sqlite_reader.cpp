@@ -4,9 +4,7 @@
 
 #include <functional>
 
-#include "host/dump_reader.h"
-#include "host/file_replacement.h"
-#include "host/sqlite_form.h"
+#include "host/catalog_cells.h"
 
 namespace zr::host {
 
@@ -28,9 +26,6 @@ class Connection {
     ~Connection() { sqlite3_close(handle_); }
     Connection(const Connection&) = delete;
     Connection& operator=(const Connection&) = delete;
-
-    // A row's cells; one that is null is none.
-    using Cells = std::vector<std::optional<std::string>>;
 
     void each(const std::string& sql, const std::vector<std::string>& values,
               const std::function<void(const Cells&)>& take) {
@@ -61,10 +56,6 @@ class Connection {
     sqlite3* handle_ = nullptr;
 };
 
-CString textIn(const std::optional<std::string>& cell) {
-    return CString::fromUtf8(cell.value_or(std::string()));
-}
-
 void readTable(Connection& connection, CatalogRows& rows, const std::string& table) {
     const CString tableName = CString::fromUtf8(table);
     std::vector<std::pair<int, CString>> primary;
@@ -75,8 +66,7 @@ void readTable(Connection& connection, CatalogRows& rows, const std::string& tab
                         column.name = textIn(cells[0]);
                         column.type = textIn(cells[1]);
                         rows.columns.push_back(column);
-                        if (const int place = std::stoi(cells[2].value_or("0")))
-                            primary.emplace_back(place, column.name);
+                        if (const int place = numberIn(cells[2])) primary.emplace_back(place, column.name);
                     });
     for (const auto& [place, column] : primary)
         rows.keys.push_back(
@@ -91,7 +81,7 @@ void readTable(Connection& connection, CatalogRows& rows, const std::string& tab
                                  textIn(cells[0]),
                                  CatalogRows::Key::Kind::Unique,
                                  textIn(cells[1]),
-                                 std::stoi(cells[2].value_or("0")),
+                                 numberIn(cells[2]),
                                  {},
                                  {}});
         });
@@ -106,7 +96,7 @@ void readTable(Connection& connection, CatalogRows& rows, const std::string& tab
                                  u"fk_" + tableName + u"_" + textIn(cells[0]),
                                  CatalogRows::Key::Kind::Foreign,
                                  textIn(cells[2]),
-                                 std::stoi(cells[4].value_or("0")),
+                                 numberIn(cells[4]),
                                  textIn(cells[1]),
                                  textIn(cells[3])});
         });
@@ -129,15 +119,6 @@ void SqliteReader::read(CatalogRows& rows) {
         });
     for (const std::string& table : tables) readTable(connection, rows, table);
     connection.each("COMMIT", {}, [](const auto&) {});
-}
-
-std::unique_ptr<CatalogReader> readerFor(const std::string& path) {
-    try {
-        if (isSqliteFile(path)) return std::make_unique<SqliteReader>(path);
-        return std::make_unique<DumpReader>(path, readFile(path));
-    } catch (const FileError& error) {
-        throw CatalogReadError(error.what());
-    }
 }
 
 }  // namespace zr::host

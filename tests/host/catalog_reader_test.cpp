@@ -107,6 +107,33 @@ TEST_F(CatalogReading, LeavesTheSqliteDatabaseAsItIs) {
     EXPECT_FALSE(std::filesystem::exists(file + "-journal"));
 }
 
+TEST_F(CatalogReading, LeavesOutTablesWhoseNameIsTaken) {
+    using Key = CatalogRows::Key;
+    rows.columns = {{u"a", u"users", u"id", u"int"},         {u"a", u"Users", u"mail", u"text"},
+                    {u"b", u"USERS", u"x", u"int"},          {u"b", u"USERS", u"y", u"int"},
+                    {u"b", u"shown", u"x", u"int"},          {u"b", u"shown", u"y", u"int"},
+                    {u"a", u"shown", u"of_the_view", u"int"}};
+    rows.keys = {{u"a", u"users", u"users_key", Key::Kind::Primary, u"id", 1, {}, {}},
+                 {u"a", u"Users", u"mail_key", Key::Kind::Primary, u"mail", 1, {}, {}}};
+    rows.views = {{u"a", u"shown", u"SELECT id FROM users"}};
+    make(DB_POSTGRESQL);
+    EXPECT_THAT(columns(u"users"), ElementsAre("id int -1 0"));
+    EXPECT_THAT(keys(u"users"), ElementsAre("users_key primary: id"));
+    EXPECT_THAT(columns(u"shown"), ElementsAre("no table"));
+    EXPECT_THAT(rows.notes, ElementsAre("table b.shown: left out; there is a view of that name, in a",
+                                        "table a.Users: left out; there is a table users already",
+                                        "table b.USERS: left out; there is one of that name already, in a",
+                                        "key mail_key: left out; there is no table Users"));
+}
+
+TEST_F(CatalogReading, KeepsOfFunctionsOfOneNameTheOneWithTheMostParameters) {
+    rows.functions = {{u"a", u"twice", 2}, {u"a", u"twice", 1}, {u"b", u"other", 0}, {u"a", u"none", 0}};
+    const Database& made = make(DB_POSTGRESQL, u"a");
+    EXPECT_EQ(made.UserFunctions.GetCount(), 2);
+    EXPECT_EQ(*made.UserFunctions.Find(u"twice"), u"2");
+    EXPECT_EQ(*made.UserFunctions.Find(u"none"), u"0");
+}
+
 TEST_F(CatalogReading, TellsWhatIsWrongWithAFile) {
     const auto complaint = [&](const std::string& file) -> std::string {
         try {

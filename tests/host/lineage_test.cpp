@@ -290,6 +290,19 @@ TEST_F(LineageImpact, OfARingEnds) {
     EXPECT_EQ(std::count(all.begin(), all.end(), "1 r1: y | | r2"), 1);
 }
 
+TEST_F(LineageOfColumns, TakesANameThatIsAnAliasTooForTheColumn) {
+    EXPECT_EQ(columnsOf(u"SELECT city AS city, name AS n, n AS k, orders.total AS total, total * 2 AS twice "
+                        u"FROM customers, orders"),
+              (Texts{"city: customers.city", "n: customers.name", "k: ?.n (no source of the query has it)",
+                     "total: orders.total", "twice: orders.total"}));
+}
+
+TEST_F(LineageOfColumns, TakesANameOfAConditionForTheColumnOrElseForTheAlias) {
+    addQuery(u"v",
+             u"SELECT name AS city, total + 1 AS more FROM customers, orders WHERE city = 'x' GROUP BY more");
+    EXPECT_EQ(uses(u"v"), (Texts{"where: customers.city", "group by: orders.total"}));
+}
+
 class LineageOfPostgres : public Traced {
  protected:
     LineageOfPostgres() : Traced(DB_POSTGRESQL) {}
@@ -300,6 +313,36 @@ TEST_F(LineageOfPostgres, SpreadsStars) {
     EXPECT_EQ(
         columnsOf(u"SELECT v.*, max(o.total) AS most FROM v JOIN orders o ON o.id = v.id GROUP BY v.id"),
         (Texts{"id: customers.id", "name: customers.name", "city: customers.city", "most: orders.total"}));
+}
+
+TEST_F(LineageOfPostgres, FollowsColumnsThatAreCast) {
+    EXPECT_EQ(
+        columnsOf(u"SELECT o.id::text AS a, total::numeric(10,2), min(o.customer_id::int::text) AS low, "
+                  u"(o.id)::bigint AS b, x.c::text AS c FROM orders o, secrets x"),
+        (Texts{"a: orders.id", "total: orders.total", "low: orders.customer_id", "b: orders.id",
+               "c: secrets.c (the project does not tell the columns of the table)"}));
+}
+
+TEST_F(LineageOfPostgres, KnowsUsesOfColumnsThatAreCast) {
+    addQuery(u"v", u"SELECT o.id FROM orders o WHERE o.total::text = 'x' AND (customer_id)::text = 'y'");
+    EXPECT_EQ(uses(u"v"), (Texts{"where: orders.total", "where: orders.customer_id"}));
+}
+
+TEST_F(LineageOfPostgres, LeavesAColumnAloneThatIsNamedLikeACastOne) {
+    addTable(u"marked", {u"id", u"idCAST"});
+    EXPECT_EQ(columnsOf(u"SELECT m1.idCAST AS a, m1.id::text AS b FROM marked m1"),
+              (Texts{"a: marked.idCAST", "b: marked.idCAST"}))
+        << "which of the two is meant can't be told";
+}
+
+TEST_F(LineageOfPostgres, KnowsNoMarkOfACastInOtherDialects) {
+    Database other(DB_MSSQL);
+    auto query = std::make_unique<Query>(DB_MSSQL);
+    setNames(*query, u"v");
+    query->SetSQL(u"SELECT idCAST FROM orders");
+    other.addQuery(std::move(query));
+    Lineage traced(other);
+    EXPECT_EQ(traced.tracer().columnsOf(*other.Queries.GetHead())[0].name, u"idCAST");
 }
 
 class LineageOfMysql : public Traced {
@@ -313,10 +356,42 @@ TEST_F(LineageOfMysql, FollowsQuotedNamesAndUnions) {
         (Texts{"n: orders.id, customers.id", "total: orders.total, customers.name"}));
 }
 
+// Joins without ON, as MariaDB prints tables with commas between them.
+TEST_F(LineageOfMysql, KnowsTheLastAliasOfJoinsWithoutConditions) {
+    addTable(u"limits", {u"low"});
+    EXPECT_EQ(columnsOf(u"select `o`.`id` AS `id`,`l`.`low` AS `low`,`city` AS `city`,`c`.`name` AS `name` "
+                        u"from `s`.`orders` `o` join "
+                        u"`s`.`customers` `c` join `s`.`limits` `l` where `o`.`id` = `l`.`low`"),
+              (Texts{"id: orders.id", "low: limits.low", "city: customers.city", "name: customers.name"}));
+    EXPECT_EQ(uses(u"q"), (Texts{"where: orders.id", "where: limits.low"}));
+}
+
+TEST_F(LineageOfMysql, KnowsTheLastAliasOfFourJoinedTables) {
+    addTable(u"limits", {u"low"});
+    addTable(u"tags", {u"label"});
+    EXPECT_EQ(
+        columnsOf(
+            u"select o.id, c.name, l.low, x.label from orders o join customers c join limits l join tags x"),
+        (Texts{"id: orders.id", "name: customers.name", "low: limits.low", "label: tags.label"}));
+}
+
+TEST_F(LineageOfMysql, TakesATableBehindJoinsForNoAlias) {
+    addTable(u"limits", {u"low"});
+    addTable(u"tags", {u"label"});
+    EXPECT_EQ(columnsOf(u"select orders.id, low, label from orders join customers join limits join tags"),
+              (Texts{"id: orders.id", "low: limits.low", "label: tags.label"}));
+}
+
 class LineageOfOracle : public Traced {
  protected:
     LineageOfOracle() : Traced(DB_ORACLE) {}
 };
+
+TEST_F(LineageOfOracle, TakesANameThatIsAnAliasTooForTheColumn) {
+    EXPECT_EQ(
+        columnsOf(u"SELECT city AS city, total * 2 AS twice, orders.total AS total FROM customers, orders"),
+        (Texts{"city: customers.city", "twice: orders.total", "total: orders.total"}));
+}
 
 TEST_F(LineageOfOracle, FollowsNamesOfAnyCase) {
     EXPECT_EQ(columnsOf(u"SELECT O.ID N, C.NAME FROM ORDERS O, CUSTOMERS C WHERE O.CUSTOMER_ID = C.ID"),

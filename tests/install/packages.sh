@@ -54,3 +54,6 @@ bash "$tests/host.sh" pkg-config "$work/root/usr" "$tests/host_in_c" "$work/pkg-
 library_dir=$(dirname "$(find "$work/root" -name libzrparsersql.so.0 -print -quit)")
 tree=$(LD_LIBRARY_PATH=$library_dir "$work/root/usr/bin/zrsql" tree -d mssqlfrom "a JOIN b")
 [[ $tree == '(5 "FROM_DEF_" '* ]] || fail "zrsql: $tree"
+readers=$(LD_LIBRARY_PATH=$library_dir "$work/root/usr/bin/zrsql" --version)
+[[ $readers != *PostgreSQL* ]] || has zrsql Depends libpq5
+[[ $readers != *MariaDB* ]] || has zrsql Depends libmariadb3

@@ -56,6 +56,7 @@ TEST(ZrsqlUse, HelpAndVersionAreNoFailure) {
     const auto version = runZrsql({"--version"});
     EXPECT_EQ(version.exitStatus, 0);
     EXPECT_THAT(version.output, testing::StartsWith("zrsql "));
+    EXPECT_THAT(version.output, HasSubstr("\nimports from: SQLite, CSV, JSON"));
 }
 
 TEST(ZrsqlInput, IsTheSameFromArgumentFileAndStandardInput) {

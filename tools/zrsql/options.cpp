@@ -3,6 +3,8 @@
 #include <CLI/CLI.hpp>
 #include <iostream>
 
+#include "host/catalog_reader.h"
+
 namespace zr::tool {
 
 namespace {
@@ -59,6 +61,10 @@ TreeFormat treeFormat(const std::string& name) {
     return name == "pretty" ? TreeFormat::Pretty : TreeFormat::Sexpr;
 }
 
+std::string versionText() {
+    return "zrsql " ZR_VERSION "\nimports from: " + CLI::detail::join(host::catalogReaders(), ", ");
+}
+
 // Empty, or why the dialect can't serve the command.
 std::string complaintAbout(const Dialect* dialect, const Words& words, Command command) {
     if (!dialect) return "there is no dialect \"" + words.dialect + "\"; there are " + dialectNames();
@@ -71,7 +77,7 @@ std::string complaintAbout(const Dialect* dialect, const Words& words, Command c
 
 std::optional<Options> readOptions(int argc, char** argv, int& exitStatus) {
     CLI::App app("Shows what the library libzrparsersql sees in a SQL text.", "zrsql");
-    app.set_version_flag("--version", std::string("zrsql " ZR_VERSION));
+    app.set_version_flag("--version", versionText());
     app.require_subcommand(1);
     Words words;
     const CLI::App* tokens = addCommand(app, words, "tokens", "Show the tokens of the text");

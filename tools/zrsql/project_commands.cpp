@@ -82,9 +82,13 @@ void makeProject(const ProjectOptions& options) {
 void importCatalogue(const ProjectOptions& options, std::string& out) {
     requireFree(options.file, options.force);
     host::CatalogRows rows;
-    for (const std::string& file : options.catalogues) host::readerFor(file)->read(rows);
-    const DatabasePointer database =
-        host::makeDatabase(rows, options.dialect->kind, CString::fromUtf8(options.schema));
+    CString schema = CString::fromUtf8(options.schema);
+    for (const std::string& catalogue : options.catalogues) {
+        const auto reader = host::readerFor(catalogue, CString::fromUtf8(options.schema));
+        if (schema.IsEmpty()) schema = reader->schema();
+        reader->read(rows);
+    }
+    const DatabasePointer database = host::makeDatabase(rows, options.dialect->kind, schema);
     for (const std::string& note : rows.notes) std::fprintf(stderr, "zrsql: %s\n", note.c_str());
     if (database->Tables.IsEmpty() && database->Queries.IsEmpty())
         throw ProjectFailure(options.catalogues.front() + ": there is no table or view in it");

@@ -2,6 +2,8 @@
 
 #include <CLI/CLI.hpp>
 
+#include "host/catalog_reader.h"
+
 namespace zr::tool {
 
 namespace {
@@ -12,6 +14,12 @@ host::StorageForm formOf(const std::string& word, const std::string& file) {
     if (const auto form = host::formByName(file)) return *form;
     throw WrongUse(file +
                    ": the name tells no form; let it end in .json, .db, .sqlite or .sqlite3, or give --form");
+}
+
+const Dialect* dialectOfServer(const std::string& catalogue) {
+    const auto kind = host::kindOfServer(catalogue);
+    if (!kind) throw WrongUse("--dialect is required, but where the address of a server tells it");
+    return findDialect(*kind);
 }
 
 }  // namespace
@@ -53,13 +61,17 @@ void ProjectWords::addTo(CLI::App& app) {
     CLI::App* imported = project_->add_subcommand(
         "import", "Make a project of what a database tells of itself: tables, keys and views");
     imported
-        ->add_option("CATALOGUE", catalogue_,
-                     "An SQLite database, or a CSV or JSON dump of INFORMATION_SCHEMA or Oracle's ALL_ views")
+        ->add_option(
+            "CATALOGUE", catalogue_,
+            "An SQLite database, a CSV or JSON dump of INFORMATION_SCHEMA or Oracle's ALL_ views, or a "
+            "server, such as postgresql://USER@HOST:PORT/DATABASE?schema=NAME")
         ->required();
     imported->add_option("PROJECT", options_.file, "The project to make, a JSON or SQLite file")->required();
     commands_.emplace_back(imported, ProjectCommand::Import);
-    imported->add_option("-d,--dialect", dialect_, "Dialect of its queries: " + dialectNames(true))
-        ->required()
+    imported
+        ->add_option(
+            "-d,--dialect", dialect_,
+            "Dialect of its queries, which a server's address tells by itself: " + dialectNames(true))
         ->type_name("DIALECT");
     imported
         ->add_option("--also", options_.catalogues,
@@ -69,7 +81,9 @@ void ProjectWords::addTo(CLI::App& app) {
     imported->add_option("--schema", options_.schema, "Take this schema or owner only")->type_name("NAME");
     addForm(*imported);
     imported->footer(
-        "Example:\n  zrsql project import columns.csv shop.json -d mssql --also views.csv --schema dbo\n\n"
+        "Examples:\n  zrsql project import columns.csv shop.json -d mssql --also views.csv --schema dbo\n"
+        "  zrsql project import mysql://reader@db.example/shop shop.json\n\n"
+        "Passwords are taken from PGPASSWORD or ~/.pgpass, MYSQL_PWD or ~/.my.cnf.\n"
         "What can't be taken in is told on standard error, a line each, and the rest goes on.");
 
     CLI::App* table = add("add-table", "Add a table", ProjectCommand::AddTable);
@@ -144,6 +158,7 @@ std::optional<ProjectOptions> ProjectWords::read() const {
         options.catalogues.insert(options.catalogues.begin(), catalogue_);
     if (options.command == ProjectCommand::New || options.command == ProjectCommand::Import) {
         options.dialect = findDialect(dialect_);
+        if (dialect_.empty()) options.dialect = dialectOfServer(catalogue_);
         if (!options.dialect || options.dialect->kind == DB_NONE)
             throw WrongUse("there is no project in the dialect \"" + dialect_ + "\"; there are " +
                            dialectNames(true));
