@@ -36,11 +36,26 @@ std::string rowsOf(host::Database& database) {
     return rows;
 }
 
-/// Calls `add` with projects of each kind of content.
+/// Calls `add` with projects of each kind of content. Those of one thing are short enough for a fuzzer to
+/// change without cutting them.
 template <typename Add>
 void forEachProject(Add add) {
-    host::Database empty(DB_MSSQL);
+    using namespace host;
+    Database empty(DB_MSSQL);
     add(empty);
+    Database withQuery(DB_MYSQL);
+    withQuery.addQuery(std::make_unique<Query>(DB_MYSQL)).SetSQL(u"SELECT a FROM t");
+    add(withQuery);
+    Database withTable(DB_ORACLE);
+    Table& table = withTable.addTable(std::make_unique<Table>(DB_ORACLE));
+    setNames(table, u"t");
+    add(withTable);
+    setNames(table.addField(std::make_unique<Field>()), u"a");
+    add(withTable);
+    table.addIndex(std::make_unique<Index>()).addColumn(u"a");
+    add(withTable);
+    table.addForeignKey(std::make_unique<ForeignKey>());
+    add(withTable);
     add(*host::test::smallProject());
     for (unsigned seed = 1; seed <= kRandomProjects; ++seed) add(*host::test::randomProject(seed));
 }

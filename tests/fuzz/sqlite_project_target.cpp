@@ -2,6 +2,8 @@
 
 #include <sqlite3.h>
 
+#include <cstdio>
+#include <cstdlib>
 #include <sstream>
 
 #include "host/project.h"
@@ -65,6 +67,9 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     }();
     const std::string input(reinterpret_cast<const char*>(data), size);
     const bool isRows = !input.empty() && input.front() == zr::fuzz::kRowsMark;
+    // What SQLite left beside the file of the run before is none of this one's.
+    for (const char* beside : {"input.db-journal", "input.db-wal", "input.db-shm"})
+        std::remove(folder.path(beside).c_str());
     const std::string path = folder.write("input.db", isRows ? empty : input);
     if (isRows) zr::fuzz::writeRows(path, input.substr(1));
     std::unique_ptr<Database> project;
