@@ -14,7 +14,9 @@ namespace zr::fuzz {
 /// input.
 class ScratchFolder {
  public:
-    ScratchFolder() : path_(place() / ("zr_fuzz_" + std::to_string(::getpid()))) {
+    ScratchFolder() {
+        static int count = 0;
+        path_ = place() / ("zr_fuzz_" + std::to_string(::getpid()) + "_" + std::to_string(++count));
         std::filesystem::create_directories(path_);
     }
     ~ScratchFolder() {

@@ -26,13 +26,14 @@ namespace {
 // One row a line, the number of the section around it, name and content, with tabulators between them.
 void writeRows(const std::string& path, const std::string& rows) {
     sqlite3* handle = nullptr;
-    require(sqlite3_open(path.c_str(), &handle) == SQLITE_OK, "a file can be opened");
+    const int opened = sqlite3_open(path.c_str(), &handle);
+    require(opened == SQLITE_OK, sqlite3_errmsg(handle));
     sqlite3_exec(handle, "PRAGMA journal_mode = OFF; PRAGMA synchronous = OFF; BEGIN; DELETE FROM section",
                  nullptr, nullptr, nullptr);
     sqlite3_stmt* insert = nullptr;
-    require(sqlite3_prepare_v2(handle, "INSERT INTO section (parent, name, content) VALUES (?, ?, ?)", -1,
-                               &insert, nullptr) == SQLITE_OK,
-            "a row can be written");
+    const int prepared = sqlite3_prepare_v2(
+        handle, "INSERT INTO section (parent, name, content) VALUES (?, ?, ?)", -1, &insert, nullptr);
+    require(prepared == SQLITE_OK, sqlite3_errmsg(handle));
     std::istringstream in(rows);
     for (std::string line; std::getline(in, line);) {
         const std::size_t first = line.find('\t');
