@@ -1,11 +1,9 @@
 // Texts at and beyond what the recogniser takes: nesting, length, budget, texts that are no SQL.
 
 #include <gtest/gtest.h>
-#include <pthread.h>
 #include <sys/resource.h>
 #include <zrparsersql/diagnostics.h>
 
-#include <functional>
 #include <random>
 #include <string>
 #include <vector>
@@ -14,6 +12,7 @@
 #include "grammar/engine/recogniser.h"
 #include "tests/engine/contexts.h"
 #include "tests/grammar/tables_of.h"
+#include "tests/parser/small_stack.h"
 
 namespace zr::test {
 namespace {
@@ -50,24 +49,9 @@ engine::Recogniser::Result recognise(const std::vector<std::uint16_t>& types,
     return engine::Recogniser(table, types, options).run(table.statementRule, 0);
 }
 
-/// Runs `work` on a thread with a stack of 256 KB; more than that on the machine stack kills the program.
-void onASmallStack(std::function<void()> work) {
-    pthread_attr_t attributes;
-    ASSERT_EQ(pthread_attr_init(&attributes), 0);
-    ASSERT_EQ(pthread_attr_setstacksize(&attributes, 256 * 1024), 0);
-    pthread_t thread;
-    const auto call = [](void* what) -> void* {
-        (*static_cast<std::function<void()>*>(what))();
-        return nullptr;
-    };
-    ASSERT_EQ(pthread_create(&thread, &attributes, call, &work), 0);
-    pthread_join(thread, nullptr);
-    pthread_attr_destroy(&attributes);
-}
-
 /// Lexes, reads and frees `text` on a small stack, and wants it read to its end.
 void expectReadToTheEnd(const std::u16string& text) {
-    onASmallStack([&text] {
+    onSmallStack([&text] {
         Contexts c(text);
         const pANTLR3_BASE_TREE tree = c.parser->all_sql_query(c.parser).tree;
         ASSERT_NE(tree, nullptr);
@@ -112,7 +96,7 @@ TEST(NestingLimit, GrowsWithTheNestingOnly) {
 
 TEST(NestingLimit, AboveItOneErrorNodeIsTheTreeAndNothingIsTaken) {
     const std::u16string text = u"SELECT " + nested(u"(", u"a", u")", 100000) + u" FROM t";
-    onASmallStack([&text] {
+    onSmallStack([&text] {
         Contexts c(text);
         const pANTLR3_BASE_TREE tree = c.start();
         ASSERT_NE(tree, nullptr);

@@ -11,6 +11,7 @@
 
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "tests/faults/failing_heap.h"
 
@@ -44,18 +45,66 @@ std::string read(std::u16string_view text, long successes, Failure::Lasts lasts,
             if (const pANTLR3_COMMON_TOKEN_STREAM tokens =
                     antlr3CommonTokenStreamSourceNew(1025, lexer->pLexer->rec->state->tokSource)) {
                 if (auto* const parser = NewParser(tokens)) {
-                    const pANTLR3_BASE_TREE tree = parser->start_rule(parser).tree;
-                    happened = failing.happened();
-                    // Whoever reads the tree has memory again.
-                    const Failure none(1L << 40);
-                    if (tree) outcome = outline(tree);
+                    if (const pANTLR3_BASE_TREE tree = parser->start_rule(parser).tree) {
+                        const Pause pause;  // whoever reads the tree has memory again
+                        outcome = outline(tree);
+                    }
                     parser->free(parser);
                 }
                 tokens->free(tokens);
             }
             lexer->free(lexer);
         }
+        happened = failing.happened();
     }
     input->close(input);
     return outcome;
 }
+
+struct Grammar {
+    const char* name;
+    std::string (*read)(std::u16string_view text, long successes, Failure::Lasts lasts, bool& happened);
+    const char16_t* text;
+};
+
+const Grammar kGrammars[] = {
+    {"Mssql", &read<MSSQLLexerNew, MSSQLParserNew>,
+     u"SELECT TOP 5 a AS x, t.b + 'c d', dbo.g(1) FROM t INNER JOIN u ON t.h = u.i WHERE j IN (SELECT k FROM "
+     u"v)"},
+    {"MssqlRecovered", &read<MSSQLLexerNew, MSSQLParserNew>, u"SELECT TOP (1)) a ("},
+    {"Mssqlfrom", &read<MSSQLfromLexerNew, MSSQLfromParserNew>, u"t INNER JOIN u ON t.h = u.i"},
+    {"Mysql", &read<MySQLSelectLexerNew, MySQLSelectParserNew>,
+     u"SELECT DISTINCT a AS x, ABS(c) FROM t AS y WHERE j IN (SELECT k FROM v) ORDER BY a DESC LIMIT 5"},
+    {"Oracle", &read<OracleLexerNew, OracleParserNew>,
+     u"SELECT a AS x, t.b || c, UPPER(d) FROM t, (SELECT e FROM f) s WHERE t.g = s.e ORDER BY a"},
+    {"Postgresql", &read<PostgreSQLLexerNew, PostgreSQLParserNew>,
+     u"SELECT a AS x, t.b + 1 AS y FROM s.t AS t WHERE j IN (SELECT k FROM v) ORDER BY a LIMIT 5 ; tail"},
+    {"Msaccess", &read<MSAccessSQL_v3LexerNew, MSAccessSQL_v3ParserNew>,
+     u"SELECT [t].[a] AS x, Left(b, 2) AS y FROM t WHERE (((j) In (SELECT k FROM v))) ORDER BY a DESC"},
+};
+
+class ExhaustedContexts : public testing::TestWithParam<Grammar> {};
+
+// No tree or the right one: never one with a part missing.
+TEST_P(ExhaustedContexts, HaveTheWholeTreeOrNone) {
+    const Grammar& grammar = GetParam();
+    bool happened = false;
+    const std::string whole = grammar.read(grammar.text, 1L << 40, Failure::Lasts::Once, happened);
+    EXPECT_FALSE(happened);
+    EXPECT_FALSE(whole.empty());
+    for (const Failure::Lasts lasts : {Failure::Lasts::Once, Failure::Lasts::ToTheEnd}) {
+        const long allocations = failEach([&](long successes) {
+            bool failed = false;
+            const std::string outcome = grammar.read(grammar.text, successes, lasts, failed);
+            EXPECT_TRUE(outcome == whole || (failed && outcome.empty())) << successes << ": " << outcome;
+            return failed && !testing::Test::HasFailure();
+        });
+        EXPECT_GT(allocations, 5);
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Grammars, ExhaustedContexts, testing::ValuesIn(kGrammars),
+                         [](const auto& grammar) { return std::string(grammar.param.name); });
+
+}  // namespace
+}  // namespace zr::faults

@@ -27,6 +27,13 @@ bool Failure::happened() const {
     return plan.happened;
 }
 
+Pause::Pause() : wasArmed_(plan.isArmed) {
+    plan.isArmed = false;
+}
+Pause::~Pause() {
+    plan.isArmed = wasArmed_;
+}
+
 bool failsNow() {
     if (!plan.isArmed || (plan.happened && !plan.lasts)) return false;
     if (!plan.happened && plan.successesLeft-- > 0) return false;
