@@ -240,7 +240,7 @@ FullSearch::Outcome FullSearch::findEnds(std::uint32_t root) {
             if (works_.size() >= options_.maxDepth) return Outcome::TooDeep;
             start(child);
         }
-        if (steps_ > budget) return Outcome::OverBudget;
+        if (steps_ > budget || remembered() > options_.maxMemo) return Outcome::OverBudget;
     }
     return Outcome::Found;
 }
@@ -320,6 +320,7 @@ FullSearch::Arrivals& FullSearch::arrivalsAt(std::uint16_t node, std::uint32_t f
         if (arrivals_[i].node == node) return arrivals_[i];
     arrivals_.push_back({node, from, {}});
     arrivals_.back().bits.resize((text_.count() - from + 1) / 16 + 1);
+    arrivalWords_ += arrivals_.back().bits.size();
     return arrivals_.back();
 }
 
@@ -351,7 +352,8 @@ void FullSearch::finishEntry(const Work& work) {
     }
     ends_.resize(work.ends);
     slices_.resize(work.slices);
-    arrivals_.resize(work.arrivals);
+    for (; arrivals_.size() > work.arrivals; arrivals_.pop_back())
+        arrivalWords_ -= arrivals_.back().bits.size();
     if (entry.mayRecover && entry.ends.count == 0) recover(entry);
     entry.done = true;
 }

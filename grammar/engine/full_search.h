@@ -131,6 +131,11 @@ class FullSearch {
         return recovery_.on && entries_[entry].position == recovery_.start;
     }
 
+    /// As Options::maxMemo counts it; the words of bits are smaller than all else.
+    std::size_t remembered() const {
+        return entries_.size() + pool_.size() + items_.size() + ends_.size() + memo_.size() +
+               arrivalWords_ / 4;
+    }
     Outcome findEnds(std::uint32_t root);
     bool follow(std::uint32_t entry, Item item, bool returned, std::uint32_t& child);
     void spread(std::uint32_t entry, const Item& call, const Entry& called);
@@ -163,6 +168,7 @@ class FullSearch {
     std::vector<Place> ends_;
     std::vector<Slice> slices_;
     std::vector<Arrivals> arrivals_;
+    std::size_t arrivalWords_ = 0;
     std::vector<std::uint64_t> marks_;
     std::vector<Rest> rests_;  ///< by node behind a call
     std::uint64_t steps_ = 0;

@@ -517,7 +517,7 @@ Recogniser::Result Recogniser::search(std::uint16_t rule, std::uint32_t position
             }
             if (result.high == text_.count()) break;
         }
-        if (steps_ > budget) {
+        if (steps_ > budget || remembered() > options_->maxMemo) {
             result.overBudget = true;
             break;
         }

@@ -61,6 +61,10 @@ class Recogniser {
     /// Work done so far, in search steps; a benchmark figure.
     std::uint64_t steps() const { return steps_; }
     std::size_t entryCount() const { return entries_.size(); }
+    /// What the search at work has to remember, as Options::maxMemo counts it.
+    std::size_t remembered() const {
+        return entries_.size() + ends_.size() + states_.size() + frames_.size() + visits_.size();
+    }
 
  private:
     struct Entry {

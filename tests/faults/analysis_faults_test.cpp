@@ -163,8 +163,8 @@ TEST_P(Exhausted, AnEndNeedsNoMemory) {
 TEST(ExhaustedHeap, TheEndOfADeepDescriptorNeedsNoMemory) {
     constexpr int kDepth = 10'000;
     std::u16string sql;
-    for (int i = 0; i < kDepth; ++i) sql += u"SELECT a FROM t WHERE a = (b + ";
-    sql += u"c";
+    for (int i = 0; i < kDepth; ++i) sql += u"SELECT a FROM t WHERE b IN (";
+    sql += u"SELECT c FROM u";
     sql.append(kDepth, u')');
     auto query = std::make_unique<Analysed>(sql);
     EXPECT_NE(query->query.m_whereItem, nullptr);

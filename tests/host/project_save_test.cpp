@@ -117,13 +117,16 @@ TEST_P(SavedProject, KilledAtAnyMomentLosesNothingThatWasSaved) {
             }
         }
         close(ends[1]);
-        usleep(random() % 40'000);
+        int said = first - 1;
+        const auto hear = [&] { return read(ends[0], &said, sizeof said) == sizeof said; };
+        for (auto saves = random() % 3; saves > 0; --saves) ASSERT_TRUE(hear());
+        usleep(random() % 20'000);
         ASSERT_EQ(::kill(child, SIGKILL), 0);
         int status = 0;
         ASSERT_EQ(waitpid(child, &status, 0), child);
         EXPECT_TRUE(WIFSIGNALED(status));
-        int said = first - 1;
-        for (int round; read(ends[0], &round, sizeof round) == sizeof round;) said = round;
+        while (hear()) {
+        }
         close(ends[0]);
         const auto found = loadProject(path);
         const int round = roundOf(*found);
