@@ -94,6 +94,10 @@ struct ParserGlue {
         context.free = &release;
         context.adaptor = ANTLR3_TREE_ADAPTORNew(tokens->tstream->tokenSource->strFactory);
         context.vectors = antlr3VectorFactoryNew(0);
+        if (context.adaptor == nullptr || context.vectors == nullptr) {
+            release(&context);
+            return nullptr;
+        }
         holder->state = ParserState{&grammar, context.pParser, context.adaptor, Options{}};
         return &context;
     }

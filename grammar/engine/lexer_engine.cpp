@@ -52,7 +52,8 @@ void emit(const LexRuleRow& rule, pANTLR3_LEXER lexer, std::size_t length) {
     const pANTLR3_RECOGNIZER_SHARED_STATE state = lexer->rec->state;
     const pANTLR3_INPUT_STREAM in = lexer->input;
     const char16_t* start = position(in);
-    const pANTLR3_COMMON_TOKEN token = state->tokFactory->newToken(state->tokFactory);
+    const pANTLR3_COMMON_TOKEN token =
+        state->tokFactory ? state->tokFactory->newToken(state->tokFactory) : nullptr;
     if (token == nullptr) return;
     state->type = rule.token;
     state->channel = rule.hidden ? kHiddenChannel : ANTLR3_TOKEN_DEFAULT_CHANNEL;

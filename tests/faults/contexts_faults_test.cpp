@@ -1,6 +1,7 @@
 // The recognisers as hosts in C call them, with each allocation of this library failing in turn. What the
 // runtime allocates by itself is another matter: docs/limits.md.
 #include <gtest/gtest.h>
+#include <zrparsersql/diagnostics.h>
 #include <zrparsersql/input_stream.h>
 #include <zrparsersql/recognizers/MSAccessSQL_v3.h>
 #include <zrparsersql/recognizers/MSSQL.h>
@@ -84,6 +85,40 @@ const Grammar kGrammars[] = {
 };
 
 class ExhaustedContexts : public testing::TestWithParam<Grammar> {};
+
+// Whoever listens is told what there is memory to tell.
+TEST_P(ExhaustedContexts, LoseAReportRatherThanThrow) {
+    std::size_t reports = 0;
+    zrSetDiagnosticFunction(
+        [](void* count, const char16_t*, std::uint32_t) { ++*static_cast<std::size_t*>(count); }, &reports);
+    const std::u16string text = u"= \xD800 " + std::u16string(GetParam().text);
+    failEach([&](long successes) {
+        bool failed = false;
+        GetParam().read(text, successes, Failure::Lasts::ToTheEnd, failed);
+        return failed;
+    });
+    zrSetDiagnosticFunction(nullptr, nullptr);
+    EXPECT_GT(reports, 0U);
+}
+
+TEST(ExhaustedLexer, MatchesNoSingleRuleWithoutMemory) {
+    const std::u16string_view text = u"SELECT";
+    failEach([&](long successes) {
+        const pANTLR3_INPUT_STREAM input =
+            zrNewUtf16InPlaceStream(text.data(), static_cast<std::uint32_t>(text.size()));
+        const pMSSQLLexer lexer = MSSQLLexerNew(input);
+        bool happened = false;
+        {
+            const Failure failing(successes);
+            lexer->mSELECT_KEYWORD(lexer);
+            happened = failing.happened();
+        }
+        EXPECT_EQ(lexer->pLexer->rec->state->error == ANTLR3_TRUE, happened) << successes;
+        lexer->free(lexer);
+        input->close(input);
+        return happened && !testing::Test::HasFailure();
+    });
+}
 
 // No tree or the right one: never one with a part missing.
 TEST_P(ExhaustedContexts, HaveTheWholeTreeOrNone) {
