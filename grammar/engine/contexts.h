@@ -41,7 +41,7 @@ struct LexerGlue {
                            pANTLR3_RECOGNIZER_SHARED_STATE state, void (*bind)(Context&)) {
         auto* holder = static_cast<Holder*>(ANTLR3_CALLOC(1, sizeof(Holder)));
         if (holder == nullptr) return nullptr;
-        holder->state = LexerState{grammar.lexer, Options{}, 0};
+        holder->state = LexerState{grammar.lexer, Options{}, 0, {}};
         Context& context = holder->context;
         context.pLexer = newLexer(grammar, input, state);
         if (context.pLexer == nullptr) {

@@ -27,9 +27,10 @@ void LexedText::read(const Options& options) {
     const char16_t* const end = units + text_.size();
     const bool reports = zr::diagnosticsWanted();
     PlaceFinder places(text_);
+    LexerDeadEnds deadEnds;
     const auto offset = [units](const char16_t* at) { return static_cast<std::uint32_t>(at - units); };
     for (const char16_t* start = units; start < end && types_.size() <= options.maxTokens;) {
-        const LexerMatch match = longestMatch(table, start, end);
+        const LexerMatch match = longestMatch(table, start, end, deadEnds);
         if (match.rule == kNone16) {
             if (reports) reportDropped(places.at(offset(start)), *start);
             ++start;

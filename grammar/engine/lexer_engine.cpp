@@ -123,7 +123,10 @@ void nextToken(LexerState& holder, pANTLR3_LEXER lexer) {
     const pANTLR3_RECOGNIZER_SHARED_STATE state = lexer->rec->state;
     const pANTLR3_INPUT_STREAM in = lexer->input;
     const char16_t* const end = endOf(in);
-    if (position(in) == in->data) holder.tokens = 0;
+    if (position(in) == in->data) {
+        holder.tokens = 0;
+        holder.deadEnds = {};
+    }
     if (size(in) > holder.options.maxUnits || holder.tokens > holder.options.maxTokens) {
         ++lexer->rec->state->errorCount;
         reportTooLong();
@@ -136,7 +139,7 @@ void nextToken(LexerState& holder, pANTLR3_LEXER lexer) {
             state->token = &state->tokSource->skipToken;
             return;
         }
-        const LexerMatch match = longestMatch(*holder.table, start, end);
+        const LexerMatch match = longestMatch(*holder.table, start, end, holder.deadEnds);
         if (match.rule != kNone16) {
             state->tokenStartCharIndex = reinterpret_cast<ANTLR3_MARKER>(start);
             const LexRuleRow& rule = holder.table->rules[match.rule];

@@ -2,6 +2,7 @@
 
 #include <antlr3.h>
 
+#include "grammar/engine/lexer_match.h"
 #include "grammar/engine/options.h"
 #include "grammar/engine/tables.h"
 
@@ -13,6 +14,7 @@ struct LexerState {
     const LexerTable* table = nullptr;
     Options options;
     std::uint32_t tokens = 0;  ///< that were taken since the start of the text
+    LexerDeadEnds deadEnds;
 };
 
 /// The token dispatch behind the runtime's nextToken: takes the longest match over all rules, the first rule
