@@ -47,6 +47,11 @@ std::unique_ptr<Database> project(const char16_t* sql) {
     host::setNames(table.addField(std::make_unique<host::Field>()), u"a");
     table.addIndex(std::make_unique<host::Index>()).addColumn(u"a");
     host::setNames(table.addForeignKey(std::make_unique<host::ForeignKey>()), u"k");
+    auto* filter = new host::Filter(DB_MSSQL);
+    table.Filter = filter;
+    filter->SQLQuery = u"a > 1";
+    filter->Items.AddTail(new host::FilterItem(DB_MSSQL));
+    filter->Items.GetTail()->Value.SetWide(u"1", 1);
     host::Query& query = made->addQuery(std::make_unique<host::Query>(DB_MSSQL));
     host::setNames(query, u"q");
     query.SetSQL(sql);
