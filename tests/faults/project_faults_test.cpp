@@ -51,6 +51,7 @@ std::unique_ptr<Database> project(const char16_t* sql) {
     table.Filter = filter;
     filter->SQLQuery = u"a > 1";
     filter->Items.AddTail(new host::FilterItem(DB_MSSQL));
+    filter->Items.GetTail()->FieldID = u"a";
     filter->Items.GetTail()->Value.SetWide(u"1", 1);
     host::Query& query = made->addQuery(std::make_unique<host::Query>(DB_MSSQL));
     host::setNames(query, u"q");
