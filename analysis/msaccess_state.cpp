@@ -366,7 +366,8 @@ void MSAccessSQL_v3StateSelectQuery::followAlias(SelectItemField& reference) {
         const Work next = pending.back();
         pending.pop_back();
         if (next.copyInto) {
-            if (shared_->budget.takeCopyOf(*next.item)) next.copyInto->m_items.AddTail(next.item->Clone());
+            if (shared_->budget.takeCopyOf(*next.item))
+                append(&next.copyInto->m_items, std::unique_ptr<SelectItem>(next.item->Clone()));
             continue;
         }
         for (SelectItem* below : next.item->m_items) pending.push_back({below, nullptr});

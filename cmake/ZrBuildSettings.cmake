@@ -39,6 +39,11 @@ if(ZR_SANITIZE)
   add_link_options(-fsanitize=${ZR_SANITIZE})
 endif()
 
+if(ZR_FUZZ)
+  # What the fuzzer learns from: every piece tells which of its edges ran. The fuzzer itself comes with the targets.
+  add_compile_options(-fsanitize=fuzzer-no-link)
+endif()
+
 # zr_add_folders(FOLDER...): add_subdirectory() for each that is there.
 function(zr_add_folders)
   foreach(folder IN LISTS ARGN)

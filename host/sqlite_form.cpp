@@ -258,20 +258,26 @@ StoredTree readSqlite(const std::string& path) {
 }
 
 void writeSqlite(const std::string& path, const StoredSection& root) {
+    const std::filesystem::path file(path);
     std::error_code failed;
-    const auto oldSize = std::filesystem::file_size(path, failed);
+    const auto oldSize = std::filesystem::file_size(file, failed);
     const bool isNew = static_cast<bool>(failed);
+    // What was not there before is not there afterwards. Needs no memory, the lack of which may be the
+    // reason.
+    const auto removeIfEmpty = [&] {
+        if (isNew && std::filesystem::file_size(file, failed) == 0) std::filesystem::remove(file, failed);
+    };
     try {
         // What is no database gives way as a whole; a database is changed in place.
         if (!isNew && oldSize > 0 && !isSqliteFile(path))
             replaceFileBy(path, [&root](const std::string& beside) { writeInto(beside, root); });
         else
             writeInto(path, root);
-    } catch (const std::runtime_error& error) {
-        // What was not there before is not there afterwards.
-        if (isNew && std::filesystem::file_size(path, failed) == 0) std::filesystem::remove(path, failed);
-        if (dynamic_cast<const StorageError*>(&error))
-            throw FileError(path + ": can't be saved to: " + error.what());
+    } catch (const StorageError& error) {
+        removeIfEmpty();
+        throw FileError(path + ": can't be saved to: " + error.what());
+    } catch (...) {
+        removeIfEmpty();
         throw;
     }
 }

@@ -2,8 +2,18 @@
 
 #include "model/named_search.h"
 #include "model/nested_queries.h"
+#include "model/owned_append.h"
 #include "model/retired_model.h"
 #include "model/source_index.h"
+
+namespace {
+
+void endTablesAndQueries(CZRDatabaseInfo& database) {
+    for (CZRTableInfo* table : database.Tables) delete table;
+    for (CZRQueryInfo* query : database.Queries) delete query;
+}
+
+}  // namespace
 
 CZRDatabaseInfo::CZRDatabaseInfo() = default;
 
@@ -38,25 +48,30 @@ CZRDatabaseInfo::CZRDatabaseInfo(const CZRDatabaseInfo& other, int selectedOnly)
     const auto isLeftOut = [selectedOnly](const CZRObjectInfo* object) {
         return !object || (selectedOnly && object->GetSelected() == 0);
     };
-    for (const CZRTableInfo* table : other.Tables) {
-        if (isLeftOut(table)) continue;
-        CZRTableInfo* clone = table->Clone(selectedOnly);
-        Tables.AddTail(clone);
-        clone->SetDatabase(this);
+    try {
+        for (const CZRTableInfo* table : other.Tables) {
+            if (isLeftOut(table)) continue;
+            CZRTableInfo* clone = table->Clone(selectedOnly);
+            zr::appendOwned(Tables, clone);
+            clone->SetDatabase(this);
+        }
+        for (const CZRQueryInfo* query : other.Queries) {
+            if (isLeftOut(query)) continue;
+            CZRQueryInfo* clone = query->Clone(selectedOnly);
+            zr::appendOwned(Queries, clone);
+            // Nested descriptors too: none of them may look into the database they were copied from.
+            for (CZRQueryInfo* nested : zr::withNestedQueries(*clone)) nested->SetDatabase(this);
+        }
+        for (const auto& entry : other.UserFunctions) UserFunctions[entry.key] = entry.value;
+    } catch (...) {
+        // What is only half made has no destructor.
+        endTablesAndQueries(*this);
+        throw;
     }
-    for (const CZRQueryInfo* query : other.Queries) {
-        if (isLeftOut(query)) continue;
-        CZRQueryInfo* clone = query->Clone(selectedOnly);
-        Queries.AddTail(clone);
-        // Nested descriptors too: none of them may look into the database they were copied from.
-        for (CZRQueryInfo* nested : zr::withNestedQueries(*clone)) nested->SetDatabase(this);
-    }
-    for (const auto& entry : other.UserFunctions) UserFunctions[entry.key] = entry.value;
 }
 
 CZRDatabaseInfo::~CZRDatabaseInfo() {
-    for (CZRTableInfo* table : Tables) delete table;
-    for (CZRQueryInfo* query : Queries) delete query;
+    endTablesAndQueries(*this);
 }
 
 bool CZRDatabaseInfo::IsDerivedSource() const {

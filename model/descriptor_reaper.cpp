@@ -1,5 +1,7 @@
 #include "model/descriptor_reaper.h"
 
+#include <algorithm>
+#include <cstdint>
 #include <utility>
 
 #include "model/nested_queries.h"
@@ -9,22 +11,60 @@
 namespace zr {
 namespace {
 
-// Pushed from the back, so that the first entry is deleted first.
-template <class T>
-void moveReversed(CList<T*>& list, std::vector<T*>& to) {
-    for (auto entry = list.end(); entry != list.begin();)
-        if (*--entry) to.push_back(*entry);
-    list.RemoveAll();
+// The child that comes next: the last one of a list that was turned round, so that the first one goes first.
+SelectItem*& nextOf(SelectItem& item) {
+    return item.m_items.GetTail();
+}
+
+void dropNext(CList<SelectItem*>& items) {
+    items.RemoveAt(POSITION(static_cast<std::uintptr_t>(items.GetCount())));
 }
 
 }  // namespace
 
+// Goes down from the root and up again. Where it goes down, the place of the child in its parent's list takes
+// the parent's own parent, which is where it goes on up.
+void DescriptorReaper::take(SelectItem* item) {
+    SelectItem* parent = nullptr;
+    const auto arriveAt = [this](SelectItem& at) {
+        std::reverse(at.m_items.begin(), at.m_items.end());
+        if (CZRQueryInfo** slot = nestedQuerySlot(at)) take(std::exchange(*slot, nullptr));
+    };
+    if (item) arriveAt(*item);
+    while (item) {
+        if (!item->m_items.IsEmpty()) {
+            SelectItem* const child = std::exchange(nextOf(*item), parent);
+            if (child) {
+                arriveAt(*child);
+                parent = std::exchange(item, child);
+            } else {
+                dropNext(item->m_items);
+            }
+            continue;
+        }
+        delete item;
+        item = parent;
+        if (!item) break;
+        parent = nextOf(*item);
+        dropNext(item->m_items);
+    }
+}
+
 void DescriptorReaper::take(CList<SelectItem*>& items) {
-    moveReversed(items, items_);
+    // Whoever is asked for the list meanwhile finds it empty.
+    const CList<SelectItem*> taken = std::move(items);
+    items.RemoveAll();
+    for (SelectItem* item : taken) take(item);
+}
+
+void DescriptorReaper::take(CZRQueryInfo* query) {
+    if (query) query->nextWaiting_ = std::exchange(waiting_, query);
 }
 
 void DescriptorReaper::take(CList<CZRQueryInfo*>& queries) {
-    moveReversed(queries, queries_);
+    // Taken from the back, so that the first one goes first.
+    for (auto entry = queries.end(); entry != queries.begin();) take(*--entry);
+    queries.RemoveAll();
 }
 
 void DescriptorReaper::take(CZRAliasInfo* alias) {
@@ -43,11 +83,6 @@ void DescriptorReaper::take(CZRQueryUnionInfo* record) {
     delete record;
 }
 
-void DescriptorReaper::takeBelow(SelectItem& item) {
-    take(item.m_items);
-    if (CZRQueryInfo** slot = nestedQuerySlot(item)) take(std::exchange(*slot, nullptr));
-}
-
 void DescriptorReaper::takeContents(CZRQueryInfo& query) {
     for (CList<SelectItem*>* list : {&query.m_selectItems, &query.m_fromItems, &query.m_orderItems,
                                      &query.m_groupItems, &query.m_unionItems, &query.m_havingItems})
@@ -62,18 +97,10 @@ void DescriptorReaper::takeContents(CZRQueryInfo& query) {
 }
 
 void DescriptorReaper::drain() {
-    while (!items_.empty() || !queries_.empty()) {
-        if (!items_.empty()) {
-            SelectItem* item = items_.back();
-            items_.pop_back();
-            takeBelow(*item);
-            delete item;
-        } else {
-            CZRQueryInfo* query = queries_.back();
-            queries_.pop_back();
-            takeContents(*query);
-            delete query;
-        }
+    while (waiting_) {
+        CZRQueryInfo* const query = std::exchange(waiting_, waiting_->nextWaiting_);
+        takeContents(*query);
+        delete query;
     }
 }
 

@@ -1,7 +1,5 @@
 #pragma once
 
-#include <vector>
-
 #include "zrparsersql/containers.h"
 
 class CFieldObject;
@@ -14,23 +12,23 @@ namespace zr {
 
 class RetiredObjects;
 
-// Deletes select items and query descriptors with everything below them. Before an object is deleted its
-// children are taken out of it, so that no destructor finds anything left to descend into: trees of any depth
-// go without machine stack.
+// Deletes select items and query descriptors with everything below them, children ahead of what holds them,
+// so that no destructor finds anything left to descend into: trees of any depth go without machine stack.
+// They go without memory as well, since destructors run where there is none left: the way back up a tree is
+// kept in the lists that are about to go, and queries that wait for their end are linked with each other.
 class DescriptorReaper {
  public:
+    DescriptorReaper() = default;
+    DescriptorReaper(const DescriptorReaper&) = delete;
+    DescriptorReaper& operator=(const DescriptorReaper&) = delete;
     ~DescriptorReaper() { drain(); }
 
-    // Take over objects, to be deleted by drain. Null entries are allowed; lists are emptied.
+    // Take over objects. Items go at once, queries wait for drain. Null entries are allowed; lists are
+    // emptied.
     void take(CList<SelectItem*>& items);
-    void take(SelectItem* item) {
-        if (item) items_.push_back(item);
-    }
+    void take(SelectItem* item);
     void take(CList<CZRQueryInfo*>& queries);
-    void take(CZRQueryInfo* query) {
-        if (query) queries_.push_back(query);
-    }
-    // These have at most a tree below them, which is taken; they themselves are deleted at once.
+    void take(CZRQueryInfo* query);
     void take(CZRAliasInfo* alias);
     void take(CFieldObject* field);
     void take(CZRQueryUnionInfo* record);
@@ -38,13 +36,11 @@ class DescriptorReaper {
     // Takes what a descriptor holds, but not the descriptor.
     void takeContents(CZRQueryInfo& query);
 
+    // Deletes the queries, those first that were taken last.
     void drain();
 
  private:
-    void takeBelow(SelectItem& item);
-
-    std::vector<SelectItem*> items_;
-    std::vector<CZRQueryInfo*> queries_;
+    CZRQueryInfo* waiting_ = nullptr;
 };
 
 }  // namespace zr

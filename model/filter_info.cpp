@@ -2,6 +2,8 @@
 
 #include <new>
 
+#include "model/owned_append.h"
+
 namespace {
 
 // As the class promises its subclasses: this class's destructor, then the memory.
@@ -28,10 +30,12 @@ void CZRFilterItemInfo::SetAll(CString fieldID, int condition, const CZRFilterVa
     ConditionAdd = conditionAdd;
 }
 
-CZRFilterInfo::CZRFilterInfo(const CZRFilterInfo& other)
-    : SQLQuery(other.SQLQuery), UseSQLQuery(other.UseSQLQuery) {
+// Delegates, so that a copy that runs out of memory half-way ends like any other filter.
+CZRFilterInfo::CZRFilterInfo(const CZRFilterInfo& other) : CZRFilterInfo() {
+    SQLQuery = other.SQLQuery;
+    UseSQLQuery = other.UseSQLQuery;
     for (const CZRFilterItemInfo* item : other.Items)
-        if (item) Items.AddTail(item->Clone());
+        if (item) zr::appendOwned(Items, item->Clone(), &CZRFilterItemInfo::destroy);
 }
 
 CZRFilterInfo::~CZRFilterInfo() {

@@ -1,5 +1,7 @@
 #include "model/retired_objects.h"
 
+#include <new>
+
 #include "model/descriptor_reaper.h"
 #include "zrparsersql/query_info.h"
 
@@ -29,8 +31,18 @@ void RetiredObjects::handTo(DescriptorReaper& reaper) {
 
 void RetiredObjects::releaseFrom(CZRQueryInfo& query, DescriptorReaper& reaper) {
     // A descriptor's end empties the list of unions without ending the records; hosts rely on it.
-    if (query.retired_ || !query.m_unions.IsEmpty()) query.RetireUnions(query.m_unions);
-    if (query.retired_ && query.retired_.use_count() == 1) query.retired_->handTo(reaper);
+    if (query.retired_ && query.retired_.use_count() > 1) {
+        try {
+            query.RetireUnions(query.m_unions);
+        } catch (const std::bad_alloc&) {
+            // This is a destructor's work. The records stay, for whoever holds on, and nobody ends them.
+            query.m_unions.RemoveAll();
+        }
+    } else {
+        for (CZRQueryUnionInfo* record : query.m_unions) reaper.take(record);
+        query.m_unions.RemoveAll();
+        if (query.retired_) query.retired_->handTo(reaper);
+    }
     query.retired_.reset();
 }
 

@@ -1,3 +1,4 @@
+#include "model/owned_append.h"
 #include "model/retired_model.h"
 #include "model/stored_section.h"
 #include "zrparsersql/database_info.h"
@@ -109,7 +110,7 @@ void CZRDatabaseInfo::Load(CZRStorageNode& node, CZRDescriptorFactory& factory) 
         zr::forEachStoredChild(node, [&] {
             auto* object = create();
             if (!object) return;
-            list.AddTail(object);
+            zr::appendOwned(list, object);
             object->SetDatabase(this);
             object->Load(node, factory);
         });

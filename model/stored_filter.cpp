@@ -1,3 +1,4 @@
+#include "model/owned_append.h"
 #include "model/stored_section.h"
 #include "zrparsersql/filter_info.h"
 
@@ -18,7 +19,7 @@ void CZRFilterInfo::Load(CZRStorageNode& node, CZRDescriptorFactory& factory) {
     zr::forEachStoredChild(node, [&] {
         CZRFilterItemInfo* item = factory.CreateFilterItem(GetDBType());
         if (!item) return;
-        Items.AddTail(item);
+        zr::appendOwned(Items, item, &CZRFilterItemInfo::destroy);
         item->Load(node, factory);
     });
 }

@@ -1,3 +1,4 @@
+#include "model/owned_append.h"
 #include "model/stored_section.h"
 #include "zrparsersql/table_info.h"
 
@@ -67,7 +68,7 @@ void CZRTableInfo::Load(CZRStorageNode& node, CZRDescriptorFactory& factory) {
         zr::forEachStoredChild(node, [&] {
             auto* child = create();
             if (!child) return;
-            list.AddTail(child);
+            zr::appendOwned(list, child);
             child->SetOwner(this);
             child->Load(node, factory);
         });

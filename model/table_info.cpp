@@ -1,6 +1,10 @@
 #include "zrparsersql/table_info.h"
 
+#include <algorithm>
+#include <utility>
+
 #include "model/named_search.h"
+#include "model/owned_append.h"
 #include "zrparsersql/database_info.h"
 
 namespace {
@@ -33,14 +37,20 @@ CZRTableInfo::CZRTableInfo(const CZRTableInfo& other, int selectedOnly)
         for (const auto* object : from) {
             if (!object || (selectedOnly && object->GetSelected() == 0)) continue;
             auto* clone = object->Clone();
-            to.AddTail(clone);
+            zr::appendOwned(to, clone);
             clone->SetOwner(this);
         }
     };
-    cloneAll(other.Fields, Fields);
-    cloneAll(other.Indexes, Indexes);
-    cloneAll(other.ForeignKeys, ForeignKeys);
-    AttachFilterCopy(other.Filter);
+    try {
+        cloneAll(other.Fields, Fields);
+        cloneAll(other.Indexes, Indexes);
+        cloneAll(other.ForeignKeys, ForeignKeys);
+        AttachFilterCopy(other.Filter);
+    } catch (...) {
+        // What is only half made has no destructor.
+        Clear();
+        throw;
+    }
 }
 
 CZRTableInfo::~CZRTableInfo() {
@@ -129,20 +139,16 @@ void CZRTableInfo::AttachFilterCopy(const CZRFilterInfo* filter) {
     // Copied first: the filter given may be the table's own.
     CZRFilterInfo* copy = filter ? filter->Clone() : nullptr;
     CZRFilterInfo::destroy(Filter);
-    Filter = nullptr;
+    Filter = copy;
     if (!copy) return;
-    CList<CZRFilterItemInfo*> kept;
-    for (CZRFilterItemInfo* item : copy->Items) {
-        if (item && FindFieldBySrcName(item->FieldID))
-            kept.AddTail(item);
-        else
-            CZRFilterItemInfo::destroy(item);
-    }
-    copy->Items = std::move(kept);
-    if (copy->Items.IsEmpty() && copy->SQLQuery.IsEmpty())
-        CZRFilterInfo::destroy(copy);
-    else
-        Filter = copy;
+    CList<CZRFilterItemInfo*>& items = copy->Items;
+    for (CZRFilterItemInfo*& item : items)
+        if (item && !FindFieldBySrcName(item->FieldID))
+            CZRFilterItemInfo::destroy(std::exchange(item, nullptr));
+    const auto kept = std::remove(items.begin(), items.end(), nullptr);
+    for (auto dropped = items.end() - kept; dropped > 0; --dropped)
+        items.RemoveAt(POSITION(static_cast<std::uintptr_t>(items.GetCount())));
+    if (items.IsEmpty() && copy->SQLQuery.IsEmpty()) CZRFilterInfo::destroy(std::exchange(Filter, nullptr));
 }
 
 void CZRTableInfo::CopyFrom(CZRTableInfo& other, DBTypes dbType) {

@@ -361,8 +361,7 @@ class Emitter {
         o << "void bindLexer(" << lexer << "& ctx) {\n";
         for (std::size_t i = 0; i < lexer_.rules.size(); ++i)
             o << "    ctx." << lexerEntry(lexer_.rules[i]) << " = &LexerGlue::entry<" << i << ">;\n";
-        o << "    ctx.getGrammarFileName = [] { return zr::grammars::" << g_
-          << ".lexerFile; };\n}\n\n";
+        o << "    ctx.getGrammarFileName = [] { return zr::grammars::" << g_ << ".lexerFile; };\n}\n\n";
         o << "void bindParser(" << parser << "& ctx) {\n";
         for (std::size_t i = 0; i < parser_.rules.size(); ++i)
             o << "    ctx." << parserEntry(parser_.rules[i].name) << " = &ParserGlue::entry<" << i << ">;\n";

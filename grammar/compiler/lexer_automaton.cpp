@@ -71,6 +71,7 @@ class LexerBuilder {
                 for (auto c = e.text.rbegin(); c != e.text.rend(); ++c) next = unit(*c, e.anyCase, next);
                 return next;
             case LexElement::Kind::Set:
+                if (e.set.ranges.empty()) throw GrammarError(grammar_.file, e.line, "the set holds nothing");
                 return set(e.set, next);
             case LexElement::Kind::Group:
                 return alternatives(rule, e.alternatives, next);
@@ -83,6 +84,8 @@ class LexerBuilder {
         const LexRule& other = grammar_.rules[found->second];
         if (&other == &rule || std::find(open_.begin(), open_.end(), &other) != open_.end())
             throw GrammarError(grammar_.file, e.line, "lexer rule " + e.rule + " refers to itself");
+        if (other.alternatives.empty())
+            throw GrammarError(grammar_.file, e.line, "lexer rule " + e.rule + " never matches");
         open_.push_back(&other);
         const int result = alternatives(other, other.alternatives, next);
         open_.pop_back();

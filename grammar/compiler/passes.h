@@ -3,7 +3,7 @@
 #include "grammar/compiler/grammar_model.h"
 #include "grammar/compiler/program.h"
 
-/// The passes behind the readers, in the order in which main.cpp runs them.
+/// The passes behind the readers, in the order in which compile.cpp runs them.
 namespace zr::gc {
 
 /// Resolves rule names, finds the statement rule, unwraps bodies that are one optional, and refuses what

@@ -1,5 +1,6 @@
 #include "grammar/engine/contexts.h"
 
+#include <cstdlib>
 #include <new>
 #include <string_view>
 #include <vector>
@@ -27,6 +28,21 @@ void displayRecognitionError(pANTLR3_BASE_RECOGNIZER recogniser, pANTLR3_UINT8*)
     }
     reportUnreadable(placeOf(static_cast<ANTLR3_UINT32>(e->line), e->charPositionInLine), units);
 }
+
+/// The runtime uses what it allocates without looking at it. Where it is about to allocate, so much is asked
+/// for ahead of it and given back: when there is none left, it isn't called.
+bool isRoomFor(std::size_t bytes) {
+    // Volatile, or the compiler would see that nothing is done with it.
+    void* volatile const probe = std::malloc(bytes);
+    std::free(probe);
+    return probe != nullptr;
+}
+
+/// A context with what it needs to get going: its first pools of tokens, nodes and lists.
+constexpr std::size_t kContextBytes = std::size_t{1} << 20;
+
+/// Nodes and the lists of their children, at most, for each token.
+constexpr std::size_t kTreeBytesOfToken = 4 * sizeof(ANTLR3_COMMON_TREE);
 
 /// The on-channel tokens of the stream from its position on.
 struct Tokens {
@@ -114,6 +130,7 @@ class RuntimeTree {
 ZRRuleReturn readFromStream(const ParserState& state, std::uint16_t rule) {
     const pANTLR3_TOKEN_STREAM stream = state.parser->tstream;
     const Tokens tokens(stream);
+    if (!isRoomFor(kContextBytes + tokens.list.size() * kTreeBytesOfToken)) throw std::bad_alloc();
     RuntimeTree tree(state, stream, tokens);
     const auto read = readRule(*state.grammar, tokens.types, state.options, rule, tree);
     ZRRuleReturn value{nullptr, nullptr, read.root};
@@ -132,7 +149,7 @@ ZRRuleReturn readFromStream(const ParserState& state, std::uint16_t rule) {
 pANTLR3_LEXER newLexer(const GrammarTable& grammar, pANTLR3_INPUT_STREAM input,
                        pANTLR3_RECOGNIZER_SHARED_STATE state) {
     constexpr ANTLR3_UINT32 kSizeHint = 1025;
-    if (grammar.lexer->version != kTableVersion) return nullptr;
+    if (grammar.lexer->version != kTableVersion || !isRoomFor(kContextBytes)) return nullptr;
     const pANTLR3_LEXER lexer = antlr3LexerNewStream(kSizeHint, input, state);
     if (lexer == nullptr) return nullptr;
     lexer->rec->displayRecognitionError = &displayRecognitionError;
@@ -143,7 +160,7 @@ pANTLR3_PARSER newParser(const GrammarTable& grammar, pANTLR3_COMMON_TOKEN_STREA
                          pANTLR3_RECOGNIZER_SHARED_STATE state) {
     constexpr ANTLR3_UINT32 kSizeHint = 1025;
     constexpr ANTLR3_UINT32 kMemoDepth = 15;
-    if (grammar.parser->version != kTableVersion) return nullptr;
+    if (grammar.parser->version != kTableVersion || !isRoomFor(kContextBytes)) return nullptr;
     const pANTLR3_PARSER parser = antlr3ParserNewStream(kSizeHint, tokens->tstream, state);
     if (parser == nullptr) return nullptr;
     parser->rec->displayRecognitionError = &displayRecognitionError;

@@ -34,14 +34,14 @@ template <typename Context>
 struct LexerGlue {
     struct Holder {
         Context context;  // first, so that the two addresses are one
-        const GrammarTable* grammar;
+        LexerState state;
     };
 
     static Context* create(const GrammarTable& grammar, pANTLR3_INPUT_STREAM input,
                            pANTLR3_RECOGNIZER_SHARED_STATE state, void (*bind)(Context&)) {
         auto* holder = static_cast<Holder*>(ANTLR3_CALLOC(1, sizeof(Holder)));
         if (holder == nullptr) return nullptr;
-        holder->grammar = &grammar;
+        holder->state = LexerState{grammar.lexer, Options{}, 0, {}};
         Context& context = holder->context;
         context.pLexer = newLexer(grammar, input, state);
         if (context.pLexer == nullptr) {
@@ -57,16 +57,14 @@ struct LexerGlue {
 
     template <std::uint32_t Rule>
     static void entry(Context* context) {
-        matchRule(*grammarOf(context).lexer, Rule, context->pLexer);
+        matchRule(*stateOf(context).table, Rule, context->pLexer);
     }
 
  private:
-    static const GrammarTable& grammarOf(Context* context) {
-        return *reinterpret_cast<Holder*>(context)->grammar;
-    }
+    static LexerState& stateOf(Context* context) { return reinterpret_cast<Holder*>(context)->state; }
     static void dispatch(void* context) {
         auto* self = static_cast<Context*>(context);
-        nextToken(*grammarOf(self).lexer, self->pLexer);
+        nextToken(stateOf(self), self->pLexer);
     }
     static void release(Context* context) {
         context->pLexer->free(context->pLexer);
@@ -96,6 +94,10 @@ struct ParserGlue {
         context.free = &release;
         context.adaptor = ANTLR3_TREE_ADAPTORNew(tokens->tstream->tokenSource->strFactory);
         context.vectors = antlr3VectorFactoryNew(0);
+        if (context.adaptor == nullptr || context.vectors == nullptr) {
+            release(&context);
+            return nullptr;
+        }
         holder->state = ParserState{&grammar, context.pParser, context.adaptor, Options{}};
         return &context;
     }

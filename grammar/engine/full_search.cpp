@@ -4,9 +4,23 @@
 #include <bit>
 
 namespace zr::engine {
+namespace {
+
+/// What Options::maxMemo reckons with for each thing that a search remembers.
+constexpr std::size_t kMemoBytes = 32;
+
+}  // namespace
+
+std::size_t FullSearch::remembered() const {
+    return (words_.size() * sizeof(std::uint64_t) + columns_.size() * sizeof(std::uint64_t) +
+            byVertex_.size() * sizeof(SetId) + sets_.size() * sizeof(Set)) /
+           kMemoBytes;
+}
 
 FullSearch::Outcome FullSearch::run(std::uint16_t rule, std::uint32_t position, std::uint32_t bound) {
     constexpr std::size_t kFirstLook = 4;
+    if (Reach::bytesFor(table_, text_.count() - position) > kMemoBytes * options_.maxMemo)
+        return Outcome::OverBudget;
     reach_.follow(rule, position);
     const std::vector<std::uint32_t> ends = reach_.ends();
     auto count = static_cast<std::size_t>(std::upper_bound(ends.begin(), ends.end(), bound) - ends.begin());
@@ -69,7 +83,7 @@ bool FullSearch::findSets(std::uint32_t position, std::uint32_t end) {
             }
         }
         steps_ += 1 + (byVertex_.size() - vertexFrom_[here]) / 8;
-        if (steps_ > budget) return false;
+        if (steps_ > budget || remembered() > options_.maxMemo) return false;
     }
     return true;
 }

@@ -37,6 +37,8 @@ class FullSearch {
     Derivation& derivation() { return derivation_; }
     std::uint32_t reached() const { return reached_; }
     std::uint64_t steps() const { return steps_; }
+    /// What the search has to remember, as Options::maxMemo counts it.
+    std::size_t remembered() const;
 
  private:
     /// Positions as bits, words counted from the first one of the search. A set is never changed, so nodes

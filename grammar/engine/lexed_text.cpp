@@ -9,11 +9,15 @@
 
 namespace zr::engine {
 
-LexedText::LexedText(const LexerTable& table, std::u16string_view text) : table_(&table), text_(text) {
-    read();
+LexedText::LexedText(const LexerTable& table, std::u16string_view text, const Options& options)
+    : table_(&table), text_(text) {
+    if (text.size() <= options.maxUnits)
+        read(options);
+    else
+        reportTooLong();
 }
 
-void LexedText::read() {
+void LexedText::read(const Options& options) {
     // A guess that text as people write it rarely exceeds.
     constexpr std::size_t kUnitsOfToken = 5;
     tokens_.reserve(text_.size() / kUnitsOfToken + 8);
@@ -23,9 +27,10 @@ void LexedText::read() {
     const char16_t* const end = units + text_.size();
     const bool reports = zr::diagnosticsWanted();
     PlaceFinder places(text_);
+    LexerDeadEnds deadEnds;
     const auto offset = [units](const char16_t* at) { return static_cast<std::uint32_t>(at - units); };
-    for (const char16_t* start = units; start < end;) {
-        const LexerMatch match = longestMatch(table, start, end);
+    for (const char16_t* start = units; start < end && types_.size() <= options.maxTokens;) {
+        const LexerMatch match = longestMatch(table, start, end, deadEnds);
         if (match.rule == kNone16) {
             if (reports) reportDropped(places.at(offset(start)), *start);
             ++start;

@@ -4,6 +4,7 @@
 #include <string_view>
 #include <vector>
 
+#include "grammar/engine/options.h"
 #include "grammar/engine/tables.h"
 
 /// A text as a row of small tokens, for whoever needs no token of the runtime.
@@ -17,10 +18,11 @@ struct LexedToken {
 };
 
 /// All tokens of a text, the same as the runtime's token source would hand out one by one. The text is read
-/// in place and must outlive this object.
+/// in place and must outlive this object. Of a text with more units than the options allow there are none,
+/// and one with more tokens ends with the first that is too many.
 class LexedText {
  public:
-    LexedText(const LexerTable& table, std::u16string_view text);
+    LexedText(const LexerTable& table, std::u16string_view text, const Options& options = {});
 
     std::u16string_view text() const { return text_; }
     std::uint32_t count() const { return static_cast<std::uint32_t>(tokens_.size()); }
@@ -43,7 +45,7 @@ class LexedText {
     void dropTypes() { types_ = {}; }
 
  private:
-    void read();
+    void read(const Options& options);
     void add(const LexedToken& token);
 
     const LexerTable* table_;

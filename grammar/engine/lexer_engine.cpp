@@ -1,10 +1,12 @@
 #include "grammar/engine/lexer_engine.h"
 
 #include <algorithm>
+#include <new>
 #include <vector>
 
 #include "grammar/engine/diagnostics.h"
 #include "grammar/engine/lexer_match.h"
+#include "grammar/engine/reports.h"
 #include "grammar/engine/runtime_place.h"
 
 namespace zr::engine {
@@ -17,6 +19,10 @@ const char16_t* position(pANTLR3_INPUT_STREAM in) {
 }
 const char16_t* endOf(pANTLR3_INPUT_STREAM in) {
     return static_cast<const char16_t*>(in->data) + in->sizeBuf / sizeof(char16_t);
+}
+
+std::size_t size(pANTLR3_INPUT_STREAM in) {
+    return in->sizeBuf / sizeof(char16_t);
 }
 
 /// Moves the stream over `count` units with the line counting that the runtime's consume does.
@@ -46,7 +52,8 @@ void emit(const LexRuleRow& rule, pANTLR3_LEXER lexer, std::size_t length) {
     const pANTLR3_RECOGNIZER_SHARED_STATE state = lexer->rec->state;
     const pANTLR3_INPUT_STREAM in = lexer->input;
     const char16_t* start = position(in);
-    const pANTLR3_COMMON_TOKEN token = state->tokFactory->newToken(state->tokFactory);
+    const pANTLR3_COMMON_TOKEN token =
+        state->tokFactory ? state->tokFactory->newToken(state->tokFactory) : nullptr;
     if (token == nullptr) return;
     state->type = rule.token;
     state->channel = rule.hidden ? kHiddenChannel : ANTLR3_TOKEN_DEFAULT_CHANNEL;
@@ -68,34 +75,10 @@ void emit(const LexRuleRow& rule, pANTLR3_LEXER lexer, std::size_t length) {
     state->token = token;
 }
 
-}  // namespace
-
-void nextToken(const LexerTable& table, pANTLR3_LEXER lexer) {
-    const pANTLR3_RECOGNIZER_SHARED_STATE state = lexer->rec->state;
-    const pANTLR3_INPUT_STREAM in = lexer->input;
-    const char16_t* const end = endOf(in);
-    for (;;) {
-        const char16_t* const start = position(in);
-        if (start >= end) {
-            // Only dropped characters were left; the runtime asks again and finds the end.
-            state->token = &state->tokSource->skipToken;
-            return;
-        }
-        const LexerMatch match = longestMatch(table, start, end);
-        if (match.rule != kNone16) {
-            state->tokenStartCharIndex = reinterpret_cast<ANTLR3_MARKER>(start);
-            emit(table.rules[match.rule], lexer, static_cast<std::size_t>(match.end - start));
-            return;
-        }
-        dropUnit(lexer);
-    }
-}
-
-void matchRule(const LexerTable& table, std::uint32_t rule, pANTLR3_LEXER lexer) {
-    const pANTLR3_INPUT_STREAM in = lexer->input;
-    const char16_t* const start = position(in);
-    const char16_t* const end = endOf(in);
-    const char16_t* best = nullptr;
+/// Where the longest token of a rule from `start` on ends; null where there is none.
+const char16_t* longestMatchOf(const LexerTable& table, std::uint32_t rule, const char16_t* start,
+                               const char16_t* end) {
+    const char16_t* best = start;
     // All ways at once, unit by unit: the rule's own program has no more than a few hundred instructions.
     std::vector<std::int32_t> now, next;
     std::vector<std::uint32_t> mark(table.codeCount, 0);
@@ -131,10 +114,52 @@ void matchRule(const LexerTable& table, std::uint32_t rule, pANTLR3_LEXER lexer)
         if (at >= end) break;
         now.swap(next);
     }
-    if (best != nullptr && best > start) {
-        emit(table.rules[rule], lexer, static_cast<std::size_t>(best - start));
-        return;
+    return best > start ? best : nullptr;
+}
+
+}  // namespace
+
+void nextToken(LexerState& holder, pANTLR3_LEXER lexer) {
+    const pANTLR3_RECOGNIZER_SHARED_STATE state = lexer->rec->state;
+    const pANTLR3_INPUT_STREAM in = lexer->input;
+    const char16_t* const end = endOf(in);
+    if (position(in) == in->data) {
+        holder.tokens = 0;
+        holder.deadEnds = {};
     }
+    if (size(in) > holder.options.maxUnits || holder.tokens > holder.options.maxTokens) {
+        ++lexer->rec->state->errorCount;
+        reportTooLong();
+        in->nextChar = const_cast<char16_t*>(end);
+    }
+    for (;;) {
+        const char16_t* const start = position(in);
+        if (start >= end) {
+            // Only dropped characters were left; the runtime asks again and finds the end.
+            state->token = &state->tokSource->skipToken;
+            return;
+        }
+        const LexerMatch match = longestMatch(*holder.table, start, end, holder.deadEnds);
+        if (match.rule != kNone16) {
+            state->tokenStartCharIndex = reinterpret_cast<ANTLR3_MARKER>(start);
+            const LexRuleRow& rule = holder.table->rules[match.rule];
+            if (!rule.hidden) ++holder.tokens;
+            emit(rule, lexer, static_cast<std::size_t>(match.end - start));
+            return;
+        }
+        dropUnit(lexer);
+    }
+}
+
+void matchRule(const LexerTable& table, std::uint32_t rule, pANTLR3_LEXER lexer) {
+    const char16_t* const start = position(lexer->input);
+    const char16_t* match = nullptr;
+    try {
+        match = longestMatchOf(table, rule, start, endOf(lexer->input));
+    } catch (const std::bad_alloc&) {
+        // The contexts are C: no exception goes through them.
+    }
+    if (match != nullptr) return emit(table.rules[rule], lexer, static_cast<std::size_t>(match - start));
     lexer->rec->exConstruct(lexer->rec);
     lexer->rec->state->error = ANTLR3_TRUE;
     lexer->rec->state->failed = ANTLR3_TRUE;

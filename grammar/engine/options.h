@@ -21,8 +21,13 @@ struct Options {
     /// stands, and a notice goes to the diagnostics.
     std::uint64_t fullBaseSteps = 2000000;
     std::uint64_t fullStepsPerToken = 1000;
-    /// Tokens of one text.
-    std::uint32_t maxTokens = 20000000;
+    /// What one search may remember: places it was at, ends it found, steps of the way. Each takes some
+    /// thirty bytes. Past them as past the steps.
+    std::size_t maxMemo = 20000000;
+    /// UTF-16 units of one text, and tokens in it. A text beyond either has no reading, and no more than this
+    /// of it is cut into tokens.
+    std::uint32_t maxUnits = std::uint32_t{32} << 20;
+    std::uint32_t maxTokens = 2000000;
 };
 
 /// What a thread keeps at most of the memory of its last search, and of its last tree, for the next one. The

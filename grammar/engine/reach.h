@@ -27,6 +27,11 @@ class Reach {
     /// The table and the index must outlive this object.
     Reach(const ParserTable& table, TextIndex& text, const Recovery& recovery);
 
+    /// What looking at so many tokens takes, nearly all of it for the two tables of nodes.
+    static std::size_t bytesFor(const ParserTable& table, std::size_t tokens) {
+        return (tokens + 1) * ((table.stops + 63) / 64) * 2 * sizeof(std::uint64_t);
+    }
+
     /// Finds what `rule` can pass from `position` on.
     void follow(std::uint16_t rule, std::uint32_t position);
     /// Where the followed rule could end, in ascending order.

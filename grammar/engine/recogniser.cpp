@@ -36,6 +36,9 @@ struct Recogniser::Spare {
     std::vector<std::uint32_t> entriesAt;
     Derivation derivation;
     QuickSearch::Work quick;
+    const ParserTable* contextsOf = nullptr;
+    std::vector<Context> contexts;
+    std::vector<std::uint16_t> contextCache;
 
     std::size_t bytes() const {
         return entries.capacity() * sizeof(Entry) + ends.capacity() * sizeof(End) +
@@ -44,7 +47,8 @@ struct Recogniser::Spare {
                derivation.parts.capacity() * sizeof(Derivation::Part) +
                derivation.ends.capacity() * sizeof(End) + derivation.states.capacity() * sizeof(State) +
                quick.calls.capacity() * sizeof(QuickSearch::Call) +
-               quick.points.capacity() * sizeof(QuickSearch::Point);
+               quick.points.capacity() * sizeof(QuickSearch::Point) + contexts.capacity() * sizeof(Context) +
+               contextCache.capacity() * sizeof(std::uint16_t);
     }
 };
 
@@ -61,6 +65,9 @@ void Recogniser::exchange(Spare& with) {
     visits_.swap(with.visits);
     std::swap(derivation_, with.derivation);
     std::swap(quick_, with.quick);
+    std::swap(contextsOf_, with.contextsOf);
+    contexts_.swap(with.contexts);
+    contextCache_.swap(with.contextCache);
     entriesAt_.swap(with.entriesAt);
 }
 
@@ -95,6 +102,15 @@ std::uint32_t Recogniser::entryFor(std::uint16_t rule, std::uint32_t position, s
     entries_.push_back(entry);
     entriesAt_[position] = made;
     return made;
+}
+
+/// Contexts follow from the grammar alone: those of a thread's last text serve for the next one.
+void Recogniser::prepareContexts() {
+    if (contextsOf_ == table_) return;
+    contextsOf_ = table_;
+    contexts_.assign(1, Context{});
+    contexts_[0].mayEnd = true;
+    contextCache_.assign(table_->contextCount, kNone16);
 }
 
 /// The context of what a call runs, from the context of the rule around it.
@@ -513,9 +529,7 @@ Recogniser::Result Recogniser::narrowSearch(std::uint16_t rule, std::uint32_t po
 
 Recogniser::Result Recogniser::search(std::uint16_t rule, std::uint32_t position) {
     Result result;
-    contexts_.assign(1, Context{});
-    contexts_[0].mayEnd = true;
-    contextCache_.assign(table_->contextCount, kNone16);
+    prepareContexts();
     result.entry = entryFor(rule, position, 0);
     chain_.assign(1, result.entry);
     const bool seeksPlace = recovering_ && recoverPlace_ == kNone;
@@ -548,7 +562,7 @@ Recogniser::Result Recogniser::search(std::uint16_t rule, std::uint32_t position
             }
             if (result.high == text_.count()) break;
         }
-        if (steps_ > budget) {
+        if (steps_ > budget || remembered() > options_->maxMemo) {
             result.overBudget = true;
             break;
         }

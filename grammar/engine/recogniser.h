@@ -72,6 +72,10 @@ class Recogniser {
     /// Work done so far, in search steps; a benchmark figure.
     std::uint64_t steps() const { return steps_; }
     std::size_t entryCount() const { return entries_.size(); }
+    /// What the search at work has to remember, as Options::maxMemo counts it.
+    std::size_t remembered() const {
+        return entries_.size() + ends_.size() + states_.size() + frames_.size() + visits_.size();
+    }
 
  private:
     struct Entry {
@@ -124,6 +128,7 @@ class Recogniser {
     static Spare& spare();
     void exchange(Spare& with);
     std::uint32_t entryFor(std::uint16_t rule, std::uint32_t position, std::uint16_t context);
+    void prepareContexts();
     std::uint16_t contextOf(std::uint16_t call, std::uint16_t outer);
     bool isOpenEnd(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped);
     bool isCovered(const Entry& entry, std::uint32_t low, std::uint32_t high, std::uint8_t stopped);
@@ -167,6 +172,7 @@ class Recogniser {
     std::uint64_t steps_ = 0;
     std::uint32_t furthest_ = 0;  ///< the furthest place where the search met a reading that could end
     std::uint8_t endsEach_ = 0;   ///< ends that an entry may have, 0 for any number
+    const ParserTable* contextsOf_ = nullptr;  ///< the grammar that the contexts are of
     std::vector<Context> contexts_;
     std::vector<std::uint16_t> contextCache_;  ///< by context and call context
     Derivation derivation_;                    ///< of the searches that write one down

@@ -23,12 +23,15 @@ class PlaceFinder {
 };
 
 /// A unit that starts no token.
-void reportDropped(const TextPlace& place, char16_t unit);
+void reportDropped(const TextPlace& place, char16_t unit) noexcept;
 
 /// A token, given by its units, that nothing could go on with.
-void reportUnreadable(const TextPlace& place, std::u16string_view token);
+void reportUnreadable(const TextPlace& place, std::u16string_view token) noexcept;
 
 /// The same at the end of a text whose last line is `line`.
-void reportUnreadableEnd(std::uint32_t line);
+void reportUnreadableEnd(std::uint32_t line) noexcept;
+
+/// More units or tokens than the options allow.
+void reportTooLong() noexcept;
 
 }  // namespace zr::engine

@@ -7,6 +7,7 @@
 #include "grammar/engine/diagnostics.h"
 #include "grammar/engine/options.h"
 #include "grammar/engine/recogniser.h"
+#include "grammar/engine/reports.h"
 #include "grammar/engine/tables.h"
 #include "grammar/engine/tree_builder.h"
 
@@ -53,7 +54,10 @@ template <class Tree>
 RuleTree<typename Tree::Node> readRule(const GrammarTable& grammar, const std::vector<std::uint16_t>& types,
                                        const Options& options, std::uint16_t rule, Tree& tree) {
     const ParserTable& table = *grammar.parser;
-    if (types.size() > options.maxTokens) return {tree.error(0, 0), true, 0};
+    if (types.size() > options.maxTokens) {
+        reportTooLong();
+        return {tree.error(0, 0), true, 0};
+    }
     const RuleDerivation derivation(table, types, options, rule);
     const Recogniser::Result& result = derivation.result();
     if (!result.found) return {tree.error(0, 0), true, 0};

@@ -106,7 +106,7 @@ std::vector<SyntaxTree::Node> SyntaxTreeGrowth::laidOut(Node root) const {
 }
 
 SyntaxTree::SyntaxTree(const GrammarTable& grammar, std::u16string_view text, const Options& options)
-    : grammar_(&grammar), text_(*grammar.lexer, text) {
+    : grammar_(&grammar), text_(*grammar.lexer, text, options) {
     SyntaxTreeGrowth growth(text_);
     const auto read = readRule(grammar, text_.types(), options, grammar.parser->startRule, growth);
     nodes_ = growth.laidOut(read.root);

@@ -13,6 +13,8 @@ class CZRDatabaseInfo;
 class CZRQueryInfo;
 
 namespace zr {
+class DescriptorCopier;
+class DescriptorReaper;
 class RetiredObjects;
 }  // namespace zr
 
@@ -167,9 +169,11 @@ class ZR_SHARED_DECLARATION CZRQueryInfo : public CZRSourceInfo {
 
  private:
     friend class zr::DescriptorCopier;
+    friend class zr::DescriptorReaper;
     friend class zr::RetiredObjects;
 
     zr::RetiredObjects& retired();
 
     std::shared_ptr<zr::RetiredObjects> retired_;  // made when first needed
+    CZRQueryInfo* nextWaiting_ = nullptr;          // links queries that wait for their end
 };

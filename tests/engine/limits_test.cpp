@@ -1,19 +1,20 @@
 // Texts at and beyond what the recogniser takes: nesting, length, budget, texts that are no SQL.
 
 #include <gtest/gtest.h>
-#include <pthread.h>
 #include <sys/resource.h>
 #include <zrparsersql/diagnostics.h>
 
-#include <functional>
 #include <random>
 #include <string>
 #include <vector>
 
 #include "grammar/engine/contexts.h"
+#include "grammar/engine/lexed_text.h"
 #include "grammar/engine/recogniser.h"
+#include "grammar/engine/syntax_tree.h"
 #include "tests/engine/contexts.h"
 #include "tests/grammar/tables_of.h"
+#include "tests/parser/small_stack.h"
 
 namespace zr::test {
 namespace {
@@ -50,24 +51,9 @@ engine::Recogniser::Result recognise(const std::vector<std::uint16_t>& types,
     return engine::Recogniser(table, types, options).run(table.statementRule, 0);
 }
 
-/// Runs `work` on a thread with a stack of 256 KB; more than that on the machine stack kills the program.
-void onASmallStack(std::function<void()> work) {
-    pthread_attr_t attributes;
-    ASSERT_EQ(pthread_attr_init(&attributes), 0);
-    ASSERT_EQ(pthread_attr_setstacksize(&attributes, 256 * 1024), 0);
-    pthread_t thread;
-    const auto call = [](void* what) -> void* {
-        (*static_cast<std::function<void()>*>(what))();
-        return nullptr;
-    };
-    ASSERT_EQ(pthread_create(&thread, &attributes, call, &work), 0);
-    pthread_join(thread, nullptr);
-    pthread_attr_destroy(&attributes);
-}
-
 /// Lexes, reads and frees `text` on a small stack, and wants it read to its end.
 void expectReadToTheEnd(const std::u16string& text) {
-    onASmallStack([&text] {
+    onSmallStack([&text] {
         Contexts c(text);
         const pANTLR3_BASE_TREE tree = c.parser->all_sql_query(c.parser).tree;
         ASSERT_NE(tree, nullptr);
@@ -112,7 +98,7 @@ TEST(NestingLimit, GrowsWithTheNestingOnly) {
 
 TEST(NestingLimit, AboveItOneErrorNodeIsTheTreeAndNothingIsTaken) {
     const std::u16string text = u"SELECT " + nested(u"(", u"a", u")", 100000) + u" FROM t";
-    onASmallStack([&text] {
+    onSmallStack([&text] {
         Contexts c(text);
         const pANTLR3_BASE_TREE tree = c.start();
         ASSERT_NE(tree, nullptr);
@@ -150,6 +136,140 @@ TEST(LongChains, OfUnionsAreRead) {
 
 TEST(LongChains, OfJoinsAreRead) {
     expectReadToTheEnd(u"SELECT a FROM t" + repeated(u" INNER JOIN u ON t.a = u.a", 500));
+}
+
+// ---- length
+
+/// One reading through the contexts, with the bounds changed for both of them. Blanks are errors of the
+/// lexer.
+struct Outcome {
+    bool isRead;
+    std::size_t tokens;
+    ANTLR3_UINT32 lexerErrors, parserErrors;
+    bool operator==(const Outcome&) const = default;
+};
+
+Outcome readWithin(const std::u16string& text, const engine::Options& options) {
+    Contexts c(text);
+    lexerOptionsOf(c.lexer) = optionsOf(c.parser) = options;
+    const pANTLR3_BASE_TREE tree = c.start();
+    const bool isRead = tree->getType(tree) == static_cast<ANTLR3_UINT32>(MSSQL_SELECT_QUERY_);
+    EXPECT_TRUE(isRead || (tree->getType(tree) == 0 && tree->getChildCount(tree) == 0));
+    return {isRead, c.tokenCount(), c.lexerErrors(), c.parserErrors()};
+}
+
+/// The same without the runtime: whether the text is read.
+bool isReadWithin(const std::u16string& text, const engine::Options& options) {
+    const engine::SyntaxTree tree(mssqlTables(), text, options);
+    if (tree.type(tree.root()) == static_cast<std::uint32_t>(MSSQL_SELECT_QUERY_)) return true;
+    EXPECT_EQ(tree.nodeCount(), 1U) << "one error node";
+    return false;
+}
+
+TEST(LengthLimit, OfUnitsIsExact) {
+    const std::u16string text = u"SELECT abc FROM t WHERE x = 1";
+    engine::Options options;
+    options.maxUnits = static_cast<std::uint32_t>(text.size());
+    EXPECT_TRUE(isReadWithin(text, options));
+    EXPECT_EQ(readWithin(text, options), (Outcome{true, 8, 7, 0}));
+    --options.maxUnits;
+    EXPECT_FALSE(isReadWithin(text, options));
+    EXPECT_EQ(readWithin(text, options), (Outcome{false, 0, 1, 1})) << "no token is taken";
+}
+
+TEST(LengthLimit, OfTokensIsExact) {
+    const std::u16string text = u"SELECT abc FROM t WHERE x = 1";
+    engine::Options options;
+    options.maxTokens = 8;
+    EXPECT_TRUE(isReadWithin(text, options));
+    EXPECT_EQ(readWithin(text, options), (Outcome{true, 8, 7, 0}));
+    --options.maxTokens;
+    EXPECT_FALSE(isReadWithin(text, options));
+    EXPECT_EQ(readWithin(text, options), (Outcome{false, 8, 7, 1}));
+}
+
+TEST(LengthLimit, OfTokensKeepsThoseBeyondItFromBeingMade) {
+    const std::u16string text = u"SELECT abc FROM t" + repeated(u" WHERE x", 1000);
+    engine::Options options;
+    options.maxTokens = 10;
+    EXPECT_FALSE(isReadWithin(text, options));
+    EXPECT_EQ(readWithin(text, options), (Outcome{false, 11, 10 + 1, 1}));
+    EXPECT_EQ(engine::LexedText(*mssqlTables().lexer, text, options).count(), 11U);
+}
+
+TEST(LengthLimit, CountsEachTextOfALexerByItself) {
+    engine::Options options;
+    options.maxTokens = 4;
+    Contexts c(u"SELECT a FROM t");
+    lexerOptionsOf(c.lexer) = optionsOf(c.parser) = options;
+    const pANTLR3_BASE_TREE tree = c.start();
+    EXPECT_NE(tree->getType(tree), 0U);
+    c.input->reset(c.input);
+    c.tokens->reset(c.tokens);
+    EXPECT_EQ(c.tokenCount(), 4U);
+    EXPECT_EQ(c.lexerErrors(), 3U + 3U) << "the blanks of both, and nothing else";
+}
+
+TEST(LengthLimit, IsReported) {
+    const auto note = [](void* user, const char16_t* text, std::uint32_t length) {
+        *static_cast<bool*>(user) |= std::u16string_view(text, length) == u"the text is too long to be read";
+    };
+    engine::Options units, tokens;
+    units.maxUnits = 5;
+    tokens.maxTokens = 3;
+    for (const engine::Options& options : {units, tokens}) {
+        bool viaContexts = false, directly = false;
+        zrSetDiagnosticFunction(note, &viaContexts);
+        readWithin(u"SELECT a FROM t", options);
+        zrSetDiagnosticFunction(note, &directly);
+        isReadWithin(u"SELECT a FROM t", options);
+        zrSetDiagnosticFunction(nullptr, nullptr);
+        EXPECT_TRUE(viaContexts);
+        EXPECT_TRUE(directly);
+    }
+}
+
+// ---- memory
+
+/// Both searches need some: the first for a plain text, and all of them for one with many readings.
+TEST(MemoLimit, IsExact) {
+    for (const std::u16string& text :
+         {u"SELECT a FROM t WHERE x = 1" + repeated(u" AND (b = 2)", 20),
+          u"SELECT a FROM t WHERE " + nested(u"dbo.f(", u"a", u")", 40) + u" = 1"}) {
+        const std::vector<std::uint16_t> types = typesOf(text);
+        engine::Options options;
+        std::size_t over = 0, enough = 1U << 24;  // one is too little, the other is not
+        while (enough - over > 1) {
+            options.maxMemo = over + (enough - over) / 2;
+            (recognise(types, options).overBudget ? over : enough) = options.maxMemo;
+        }
+        options.maxMemo = enough;
+        const engine::Recogniser::Result at = recognise(types, options);
+        EXPECT_TRUE(at.found);
+        EXPECT_EQ(at.high, types.size());
+        options.maxMemo = over;
+        const engine::Recogniser::Result above = recognise(types, options);
+        EXPECT_TRUE(above.overBudget);
+        EXPECT_LE(above.high, types.size());
+    }
+}
+
+TEST(MemoLimit, OfNothingStillEnds) {
+    engine::Options options;
+    options.maxMemo = 0;
+    const engine::Recogniser::Result result = recognise(typesOf(u"SELECT a FROM t WHERE x = 1"), options);
+    EXPECT_TRUE(result.overBudget);
+    EXPECT_TRUE(readWithin(u"SELECT a FROM t", options).tokens > 0);
+}
+
+TEST(MemoLimit, OfTheDefaultIsFarFromWhatATextNeeds) {
+    const std::u16string text = u"SELECT a FROM t WHERE a = 1" + repeated(u" AND b = 2", 10000);
+    const std::vector<std::uint16_t> types = typesOf(text);
+    const engine::ParserTable& table = *mssqlTables().parser;
+    engine::Recogniser recogniser(table, types, engine::Options{});
+    EXPECT_TRUE(recogniser.run(table.statementRule, 0).found);
+    EXPECT_GT(recogniser.remembered(), types.size());
+    EXPECT_LT(recogniser.remembered(), types.size() * 100);
 }
 
 // ---- budget

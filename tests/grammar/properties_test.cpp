@@ -100,6 +100,19 @@ TEST_P(GrammarProperties, BlanksBetweenTokensDontMatter) {
     });
 }
 
+// Each of them was once a reason to go over all of the rest of the text.
+TEST_P(GrammarProperties, QuotesThatNothingClosesDontHoldTheLexerUp) {
+    constexpr std::size_t kTimes = 200'000;
+    for (const std::u16string_view quote : {u"[", u"'[", u"\"[", u"'\"["}) {
+        const std::u16string few = std::u16string(quote) + u"a [a [a [a ";
+        const std::size_t inFront = grammar().lex(few).size();
+        std::u16string many = few;
+        for (std::size_t i = 0; i < kTimes; ++i) many += u"[a ";
+        const std::size_t each = grammar().lex(few + u"[a ").size() - inFront;
+        EXPECT_EQ(grammar().lex(many).size(), inFront + kTimes * each);
+    }
+}
+
 INSTANTIATE_TEST_SUITE_P(Grammars, GrammarProperties, testing::Range(std::size_t{0}, kGrammarCount),
                          [](const auto& grammar) { return std::string(kGrammars[grammar.param].corpus); });
 

@@ -7,6 +7,7 @@
 
 #include <csignal>
 #include <filesystem>
+#include <random>
 
 #include "tests/host/projects.h"
 
@@ -84,6 +85,57 @@ TEST_P(SavedProject, InterruptedAnywhereIsTheOldOneOrTheNewOne) {
     EXPECT_GT(killed, 10);
     EXPECT_EQ(saveWithin(size * 4, true, *next, path, form()), End::Done);
     EXPECT_EQ(stored(*loadProject(path)), nextForm);
+}
+
+// The project that a child saves in its n-th round.
+std::unique_ptr<Database> projectOfRound(int round) {
+    auto database = largerProject();
+    CString sql;
+    sql.Format(u"SELECT %d", round);
+    database->Queries.GetHead()->SetSQL(sql);
+    return database;
+}
+
+int roundOf(Database& database) {
+    return std::stoi(database.Queries.GetHead()->GetSQL().toUtf8().substr(7));
+}
+
+// A child saves one project after the other, and says so of each behind it, until it is killed.
+TEST_P(SavedProject, KilledAtAnyMomentLosesNothingThatWasSaved) {
+    std::mt19937 random(1);
+    saveProject(*projectOfRound(0), path, form());
+    int rounds = 0;
+    for (int kill = 0; kill < 25; ++kill) {
+        int ends[2];
+        ASSERT_EQ(pipe(ends), 0);
+        const int first = roundOf(*loadProject(path)) + 1;
+        const pid_t child = fork();
+        if (child == 0) {
+            for (int round = first;; ++round) {
+                saveProject(*projectOfRound(round), path, form());
+                if (write(ends[1], &round, sizeof round) != sizeof round) _exit(1);
+            }
+        }
+        close(ends[1]);
+        int said = first - 1;
+        const auto hear = [&] { return read(ends[0], &said, sizeof said) == sizeof said; };
+        for (auto saves = random() % 3; saves > 0; --saves) ASSERT_TRUE(hear());
+        usleep(random() % 20'000);
+        ASSERT_EQ(::kill(child, SIGKILL), 0);
+        int status = 0;
+        ASSERT_EQ(waitpid(child, &status, 0), child);
+        EXPECT_TRUE(WIFSIGNALED(status));
+        while (hear()) {
+        }
+        close(ends[0]);
+        const auto found = loadProject(path);
+        const int round = roundOf(*found);
+        EXPECT_GE(round, said) << "what was said to be saved is there";
+        EXPECT_LE(round, said + 1);
+        EXPECT_EQ(stored(*found), stored(*projectOfRound(round)));
+        rounds += said - first + 1;
+    }
+    EXPECT_GT(rounds, 5);
 }
 
 TEST_P(SavedProject, ThatCannotBeWrittenStaysAsItIsAndLeavesNothingBeside) {

@@ -1,0 +1,35 @@
+#include "grammar/compiler/compile.h"
+
+#include <ostream>
+
+#include "grammar/compiler/readers.h"
+
+namespace zr::gc {
+
+void compile(const Inputs& inputs, const Output& output, std::ostream* report) {
+    const Vocabulary vocabulary = readVocabulary(inputs.tokens);
+    const LexerGrammar lexerGrammar = readLexer(inputs.lexer, vocabulary);
+    const LexerProgram lexerProgram = buildLexer(lexerGrammar);
+    ParserGrammar grammar = readParser(inputs.grammars, vocabulary);
+    resolve(grammar);
+    const Facts facts = collectFacts(grammar);
+    Program program = lower(grammar, facts);
+    std::string why;
+    const int closer = findCloser(grammar, facts, program, why);
+    if (closer >= 0) applyCloser(program, closer);
+    for (const char* name : {"LEFT_PAREN", "LEFT_PAREN_"})
+        if (const auto found = vocabulary.numberOf.find(name); found != vocabulary.numberOf.end())
+            program.opener = found->second;
+    analyse(program, grammar, facts, vocabulary.maxNumber);
+    numberNodes(program, facts, grammar.recoverRule);
+    if (report)
+        *report << grammar.name << ": " << grammar.rules.size() << " rules, " << program.nodes.size()
+                << " nodes, " << program.classes << " token classes, " << program.guards.size() << " guards, "
+                << program.tailLoops.size() << " tail loops, " << program.contexts.size() << " contexts, "
+                << lexerProgram.accept.size() << " lexer states, closer " << closer
+                << (why.empty() ? "" : "; refused as closer:" + why) << "\n";
+    if (!output.sourceFile.empty())
+        emit(vocabulary, lexerGrammar, lexerProgram, grammar, facts, program, output);
+}
+
+}  // namespace zr::gc
