@@ -23,8 +23,9 @@ bool QuickSearch::run(std::uint16_t rule, std::uint32_t position) {
             furthest = low_;
             bound = steps_ + options_.quickSteps;
         }
-        if (++steps_ > bound || !turnBack()) return false;
+        if (++steps_ > bound || remembered() > options_.maxMemo || !turnBack()) return false;
     }
+    if (remembered() > options_.maxMemo) return false;
     made_.endState = state_;
     return true;
 }

@@ -53,6 +53,11 @@ class QuickSearch {
     /// Where the derivation ends: always the end of the text, which closers may have been taken up to.
     std::uint32_t low() const { return low_; }
     std::uint64_t steps() const { return steps_; }
+    /// What the search has to remember, as Options::maxMemo counts it.
+    std::size_t remembered() const {
+        return made_.parts.size() + made_.ends.size() + made_.states.size() + work_.calls.size() +
+               work_.points.size();
+    }
 
  private:
     bool follow();

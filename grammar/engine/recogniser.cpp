@@ -431,6 +431,12 @@ void Recogniser::reset() {
     visits_.clear();
     visitTable_.clear();
     visitTableUsed_ = 0;
+    derivation_.parts.clear();
+    derivation_.ends.clear();
+    derivation_.states.clear();
+    hasDerivation_ = false;
+    quick_.calls.clear();
+    quick_.points.clear();
     steps_ = 0;
     furthest_ = 0;
 }

@@ -74,7 +74,9 @@ class Recogniser {
     std::size_t entryCount() const { return entries_.size(); }
     /// What the search at work has to remember, as Options::maxMemo counts it.
     std::size_t remembered() const {
-        return entries_.size() + ends_.size() + states_.size() + frames_.size() + visits_.size();
+        return entries_.size() + ends_.size() + states_.size() + frames_.size() + visits_.size() +
+               derivation_.parts.size() + derivation_.ends.size() + derivation_.states.size() +
+               quick_.calls.size() + quick_.points.size();
     }
 
  private:
