@@ -13,7 +13,6 @@ import urllib.request
 
 ELEMENT = "element-6066-11e4-a52e-4f735466cecf"
 TAB, ENTER, ESCAPE = "\ue004", "\ue007", "\ue00c"
-SHIFT = "\ue008"
 
 
 def missing_programs():
@@ -114,13 +113,11 @@ class Browser:
         element = self._call("POST", self._session + "/element", body)[ELEMENT]
         self._call("POST", f"{self._session}/element/{element}/click", {})
 
-    def press(self, keys, shift=False):
+    def press(self, keys):
         """Presses keys, one after the other, wherever the focus is."""
         actions = []
         for key in keys:
             actions += [{"type": "keyDown", "value": key}, {"type": "keyUp", "value": key}]
-        if shift:
-            actions = [{"type": "keyDown", "value": SHIFT}, *actions, {"type": "keyUp", "value": SHIFT}]
         keyboard = {"type": "key", "id": "keyboard", "actions": actions}
         self._call("POST", self._session + "/actions", {"actions": [keyboard]})
 

@@ -158,7 +158,7 @@ class Page {
     void appendReaders(const CZRSourceInfo& object) {
         const auto found = readers_.find(&object);
         if (found == readers_.end()) return;
-        out_ += "<p>Read by: ";
+        out_ += "<p class=\"readers\">Read by: ";
         bool isFirst = true;
         for (const CZRQueryInfo* reader : found->second) {
             if (!isFirst) out_ += ", ";
