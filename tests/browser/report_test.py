@@ -129,6 +129,16 @@ class Report(unittest.TestCase):
         self.assertEqual(self.run_script("return performance.getEntriesByType('resource').length"), 0)
         self.assertEqual(len(self.shown_names()), 9)
 
+    def test_an_error_of_the_page_would_be_seen(self):
+        self.run_script("setTimeout(() => { throw new Error('on purpose'); })")
+        self.run_script("console.error('told on purpose')")
+        told = []
+        deadline = time.monotonic() + 20
+        while len(told) < 2 and time.monotonic() < deadline:
+            told += [entry["message"] for entry in self.browser.complaints()]
+        self.assertIn("told on purpose", " ".join(told))
+        self.assertIn("Error: on purpose", " ".join(told))
+
     def test_tells_what_was_not_read(self):
         unread = self.run_script("return document.getElementById('h-unread').parentElement.innerText")
         self.assertIn("cut_off", unread)
