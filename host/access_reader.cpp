@@ -57,6 +57,12 @@ std::string_view trimmed(std::string_view text) {
     return text.substr(first, text.find_last_not_of(" \t\r,") - first + 1);
 }
 
+// A size is told for types that have none, too.
+std::string_view typeIn(std::string_view text) {
+    text = trimmed(text);
+    return text.starts_with("Memo") || text.starts_with("OLE") ? text.substr(0, text.find(" (")) : text;
+}
+
 // The rows of an exported table, by the names of its columns.
 class Export {
  public:
@@ -148,7 +154,7 @@ void AccessReader::readTables(CatalogRows& rows) const {
             CatalogRows::Column column;
             column.table = CString::fromUtf8(table);
             column.name = CString::fromUtf8(line.takeName('[', ']'));
-            column.type = CString::fromUtf8(trimmed(line.rest()));
+            column.type = CString::fromUtf8(typeIn(line.rest()));
             if (!column.name.IsEmpty()) rows.columns.push_back(std::move(column));
         }
     });

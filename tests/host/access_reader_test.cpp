@@ -140,6 +140,27 @@ std::vector<std::string> columnsOf(const CZRTableInfo& table) {
     return all;
 }
 
+std::vector<std::string> keysIn(const CatalogRows& rows) {
+    std::vector<std::string> all;
+    for (const CatalogRows::Key& key : rows.keys)
+        all.push_back(key.table.toUtf8() + " " + key.name.toUtf8() + " " + "PUF"[static_cast<int>(key.kind)] +
+                      " " + key.column.toUtf8() + " " + std::to_string(key.place) + " " +
+                      key.referencedTable.toUtf8() + "." + key.referencedColumn.toUtf8());
+    return all;
+}
+
+// "name: sources" of each result column.
+std::vector<std::string> originsIn(Database& database, const CString& query) {
+    ColumnTracer tracer(database);
+    std::vector<std::string> all;
+    for (const ResultColumn& column : tracer.columnsOf(*database.FindQueryBySrcName(query))) {
+        all.push_back(column.name.toUtf8() + ":");
+        for (const ColumnOrigin& origin : column.origins)
+            all.back() += " " + origin.source.toUtf8() + "." + origin.column.toUtf8();
+    }
+    return all;
+}
+
 TEST_F(AccessReading, TakesTablesWithTheTypesOfAccess) {
     standInForAll();
     const Database& database = make();
@@ -148,19 +169,13 @@ TEST_F(AccessReading, TakesTablesWithTheTypesOfAccess) {
                 ElementsAre("id: Long Integer -1 0", "full name: Text 50 0"));
     EXPECT_THAT(columnsOf(*database.FindTableBySrcName(u"Bestellungen ä")),
                 ElementsAre("id: Long Integer -1 0", "customer: Long Integer -1 0", "price: Numeric 18 4",
-                            "notes: Memo/Hyperlink 255 0", "paid, or not: Boolean -1 0"));
+                            "notes: Memo/Hyperlink -1 0", "paid, or not: Boolean -1 0"));
 }
 
 TEST_F(AccessReading, TakesKeysAndTheRelationshipsThatAreEnforced) {
     standInForAll();
     make();
-    std::vector<std::string> keys;
-    for (const CatalogRows::Key& key : rows.keys)
-        keys.push_back(key.table.toUtf8() + " " + key.name.toUtf8() + " " +
-                       "PUF"[static_cast<int>(key.kind)] + " " + key.column.toUtf8() + " " +
-                       std::to_string(key.place) + " " + key.referencedTable.toUtf8() + "." +
-                       key.referencedColumn.toUtf8());
-    EXPECT_THAT(keys,
+    EXPECT_THAT(keysIn(rows),
                 ElementsAre("customers by_name U full name 1 .", "customers by_name U id 2 .",
                             "customers pk_customers P id 1 .", "Bestellungen ä pk_Bestellungen ä P id 1 .",
                             "Bestellungen ä pk_Bestellungen ä P customer 2 .",
@@ -179,15 +194,8 @@ TEST_F(AccessReading, MakesQueriesOfTheirPartsThatCanBeFollowed) {
     EXPECT_THAT(rows.notes, ElementsAre("query raise: left out; it changes data"));
 
     analyseQueries(database);
-    ColumnTracer tracer(database);
-    std::vector<std::string> origins;
-    for (const ResultColumn& column : tracer.columnsOf(*named)) {
-        std::string all = column.name.toUtf8() + ":";
-        for (const ColumnOrigin& origin : column.origins)
-            all += " " + origin.source.toUtf8() + "." + origin.column.toUtf8();
-        origins.push_back(all);
-    }
-    EXPECT_THAT(origins, ElementsAre("dear: Bestellungen ä.price customers.full name", "id: customers.id"));
+    EXPECT_THAT(originsIn(database, u"named"),
+                ElementsAre("dear: Bestellungen ä.price customers.full name", "id: customers.id"));
 }
 
 TEST_F(AccessReading, RunsTheProgramsWithTheFileAsOneWordAndInUtf8) {
@@ -259,6 +267,32 @@ class AccessPrograms : public AccessReading {
             GTEST_SKIP() << "mdbtools is not installed (Debian: apt-get install mdbtools)";
     }
 };
+
+TEST_F(AccessPrograms, TellTheSameOfARealFile) {
+    file = ZR_ACCESS_DIR "/shop.mdb";
+    Database& database = make();
+    EXPECT_EQ(database.Tables.GetCount(), 3);
+    EXPECT_THAT(
+        columnsOf(*database.FindTableBySrcName(u"customers")),
+        ElementsAre("id: Long Integer -1 0", "name: Text 50 0", "Straße: Text 80 0", "vip: Boolean -1 0"));
+    EXPECT_THAT(columnsOf(*database.FindTableBySrcName(u"orders")),
+                ElementsAre("id: Long Integer -1 0", "year: Integer -1 0", "customer: Long Integer -1 0",
+                            "total: Currency -1 0", "note: Memo/Hyperlink -1 0"));
+    EXPECT_THAT(columnsOf(*database.FindTableBySrcName(u"order lines")),
+                ElementsAre("order: Long Integer -1 0", "year: Integer -1 0", "price: Numeric 18 4",
+                            "at: DateTime -1 0"));
+    EXPECT_THAT(keysIn(rows),
+                ElementsAre("customers pk_customers P id 1 .", "customers by name U name 1 .",
+                            "customers by name U Straße 2 .", "orders pk_orders P id 1 .",
+                            "orders pk_orders P year 2 .", "orders customersorders F customer 0 customers.id",
+                            "order lines ordersorder lines F order 0 orders.id",
+                            "order lines ordersorder lines F year 1 orders.year"));
+    analyseQueries(database);
+    EXPECT_THAT(originsIn(database, u"named orders"),
+                ElementsAre("id: orders.id", "wer: customers.name customers.Straße", "gross: orders.total"));
+    EXPECT_THAT(originsIn(database, u"all names"), ElementsAre("name: customers.name customers.Straße"));
+    EXPECT_THAT(rows.notes, ElementsAre("query forget: left out; it changes data"));
+}
 
 TEST_F(AccessPrograms, RefuseAFileThatIsCutOff) {
     EXPECT_THAT(complaint(), StartsWith(file + ": mdb-schema failed: "));
