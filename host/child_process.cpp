@@ -44,6 +44,7 @@ class Pipe {
 
 std::vector<char*> pointersTo(std::vector<std::string>& words) {
     std::vector<char*> pointers;
+    pointers.reserve(words.size() + 1);
     for (std::string& word : words) pointers.push_back(word.data());
     pointers.push_back(nullptr);
     return pointers;
