@@ -8,6 +8,7 @@
 #include "host/catalog_reader.h"
 #include "host/kinds.h"
 #include "input.h"
+#include "long_work.h"
 #include "project_report.h"
 #include "table_words.h"
 
@@ -159,7 +160,8 @@ void analyze(const ProjectOptions& options, std::string& out) {
     const DatabasePointer database = host::loadProject(options.file);
     const Dialect& dialect = dialectOf(*database, options.file);
     try {
-        host::analyseQueries(*database);
+        LongWork work("analysing " + options.file);
+        host::analyseQueries(*database, [&work](std::size_t done, std::size_t all) { work.step(done, all); });
     } catch (const host::CyclicQueries& ring) {
         throw ProjectFailure(options.file + ": " + ring.what());
     }
