@@ -157,10 +157,10 @@ void show(const ProjectOptions& options, std::string& out) {
 }
 
 void analyze(const ProjectOptions& options, std::string& out) {
+    LongWork work("analysing " + options.file);
     const DatabasePointer database = host::loadProject(options.file);
     const Dialect& dialect = dialectOf(*database, options.file);
     try {
-        LongWork work("analysing " + options.file);
         host::analyseQueries(*database, [&work](std::size_t done, std::size_t all) { work.step(done, all); });
     } catch (const host::CyclicQueries& ring) {
         throw ProjectFailure(options.file + ": " + ring.what());
@@ -175,7 +175,9 @@ void analyze(const ProjectOptions& options, std::string& out) {
     host::ColumnTracer tracer(*database);
     if (options.asJson) out += "{\"queries\":[";
     bool isFirst = true;
+    std::size_t done = 0;
     for (const CZRQueryInfo* query : shown) {
+        work.step(done++, shown.size());
         if (!isFirst) out += options.asJson ? "," : "\n";
         isFirst = false;
         if (options.asJson)
