@@ -35,12 +35,31 @@ Queries queriesReadBy(const CZRQueryInfo& query, Database& database, const Queri
     return read;
 }
 
+class Steps {
+ public:
+    Steps(const Database& database, const AnalysisProgress& progress)
+        : all_(static_cast<std::size_t>(database.Queries.GetCount()) * 2), progress_(progress) {}
+
+    void next() {
+        if (progress_) progress_(done_, all_);
+        ++done_;
+    }
+
+ private:
+    std::size_t done_ = 0;
+    const std::size_t all_;
+    const AnalysisProgress& progress_;
+};
+
 class ReadingOrder {
  public:
-    explicit ReadingOrder(Database& database) {
+    explicit ReadingOrder(Database& database, Steps& steps) {
         QueriesById byId;
         for (CZRQueryInfo* query : database.Queries) byId.emplace(query->GetID(), query);
-        for (CZRQueryInfo* query : database.Queries) readBy_[query] = queriesReadBy(*query, database, byId);
+        for (CZRQueryInfo* query : database.Queries) {
+            steps.next();
+            readBy_[query] = queriesReadBy(*query, database, byId);
+        }
     }
 
     const Queries& readBy(CZRQueryInfo* query) const { return readBy_.at(query); }
@@ -88,7 +107,7 @@ std::string ringText(const Ring& ring) {
     return text + ring.front()->GetSrcName().toUtf8();
 }
 
-void analyseInOrder(Database& database, const ReadingOrder& order) {
+void analyseInOrder(Database& database, const ReadingOrder& order, Steps& steps) {
     // The database sorts by what the descriptors tell of their sources.
     for (CZRQueryInfo* query : database.Queries) {
         query->m_sourceTables.RemoveAll();
@@ -98,22 +117,27 @@ void analyseInOrder(Database& database, const ReadingOrder& order) {
     database.SortQueries();
     for (CZRQueryInfo* query : database.Queries) query->m_sourceTables.RemoveAll();
 
-    for (CZRQueryInfo* query : database.Queries) BuildQueryInfo(query, database.GetDBType());
+    for (CZRQueryInfo* query : database.Queries) {
+        steps.next();
+        BuildQueryInfo(query, database.GetDBType());
+    }
 }
 
 }  // namespace
 
-void analyseQueries(Database& database) {
-    ReadingOrder order(database);
+void analyseQueries(Database& database, const AnalysisProgress& progress) {
+    Steps steps(database, progress);
+    ReadingOrder order(database, steps);
     if (const std::vector<Ring> rings = order.findRings(database); !rings.empty())
         throw CyclicQueries("queries read from each other in a ring: " + ringText(rings.front()));
-    analyseInOrder(database, order);
+    analyseInOrder(database, order, steps);
 }
 
-std::vector<Ring> analyseQueriesInRings(Database& database) {
-    ReadingOrder order(database);
+std::vector<Ring> analyseQueriesInRings(Database& database, const AnalysisProgress& progress) {
+    Steps steps(database, progress);
+    ReadingOrder order(database, steps);
     std::vector<Ring> rings = order.findRings(database);
-    analyseInOrder(database, order);
+    analyseInOrder(database, order, steps);
     return rings;
 }
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <stdexcept>
 #include <vector>
 
@@ -13,15 +14,19 @@ class CyclicQueries : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
+// Told before each query how many of all are done; what it raises ends the work. All are gone through twice,
+// first for what they read: each time counts.
+using AnalysisProgress = std::function<void(std::size_t done, std::size_t all)>;
+
 // Analyses the queries of a database, each behind those that it reads from, and leaves them in that order.
 // Raises CyclicQueries, with no query analysed, when there is no such order.
-void analyseQueries(Database& database);
+void analyseQueries(Database& database, const AnalysisProgress& progress = {});
 
 // Queries of which each reads from the next, and the last from the first.
 using Ring = std::vector<const CZRQueryInfo*>;
 
 // The same for a database that may have such rings: queries in one stand in some order. Gives the rings, at
 // least one for each set of queries that all read from each other; empty when there is none.
-std::vector<Ring> analyseQueriesInRings(Database& database);
+std::vector<Ring> analyseQueriesInRings(Database& database, const AnalysisProgress& progress = {});
 
 }  // namespace zr::host

@@ -4,6 +4,8 @@
 #include <map>
 #include <nlohmann/json.hpp>
 
+#include "host/csv.h"
+
 namespace zr::host {
 
 namespace {
@@ -94,61 +96,6 @@ bool take(CatalogRows& rows, const Row& row, const Row& names) {
     takeColumn(rows, row);
     return true;
 }
-
-// RFC 4180: cells in quotes may hold separators, quotes (doubled) and ends of lines.
-class Csv {
- public:
-    explicit Csv(std::string_view text) : text_(text) {
-        if (text_.starts_with("\xEF\xBB\xBF")) text_.remove_prefix(3);
-        const std::string_view first = text_.substr(0, text_.find('\n'));
-        for (const char candidate : {';', '\t'})
-            if (first.find(',') == first.npos && first.find(candidate) != first.npos) separator_ = candidate;
-    }
-
-    bool isAtEnd() const { return at_ >= text_.size(); }
-    std::size_t line() const { return line_; }
-    bool isBroken() const { return isBroken_; }
-
-    std::vector<std::string> next() {
-        std::vector<std::string> cells(1);
-        while (at_ < text_.size()) {
-            const char unit = text_[at_++];
-            if (unit == '"' && cells.back().empty()) {
-                takeQuoted(cells.back());
-            } else if (unit == separator_) {
-                cells.emplace_back();
-            } else if (unit == '\n') {
-                ++line_;
-                break;
-            } else if (unit != '\r') {
-                cells.back() += unit;
-            }
-        }
-        return cells;
-    }
-
- private:
-    void takeQuoted(std::string& cell) {
-        while (at_ < text_.size()) {
-            const char unit = text_[at_++];
-            if (unit == '\n') ++line_;
-            if (unit != '"') {
-                cell += unit;
-            } else if (at_ < text_.size() && text_[at_] == '"') {
-                cell += text_[at_++];
-            } else {
-                return;
-            }
-        }
-        isBroken_ = true;
-    }
-
-    std::string_view text_;
-    std::size_t at_ = 0;
-    std::size_t line_ = 1;
-    char separator_ = ',';
-    bool isBroken_ = false;
-};
 
 void readCsv(CatalogRows& rows, const std::string& path, std::string_view bytes) {
     Csv csv(bytes);

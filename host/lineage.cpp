@@ -139,9 +139,9 @@ struct Lineage::Walk {
     std::unordered_map<const CZRQueryInfo*, std::vector<const CZRSourceInfo*>> objects_;
 };
 
-Lineage::Lineage(Database& database, ColumnTracer::IsReadWhole isReadWhole)
+Lineage::Lineage(Database& database, ColumnTracer::IsReadWhole isReadWhole, const AnalysisProgress& progress)
     : database_(database),
-      rings_(analyseQueriesInRings(database)),
+      rings_(analyseQueriesInRings(database, progress)),
       tracer_(database, std::move(isReadWhole)) {}
 
 bool Lineage::isInRing(const CZRQueryInfo& query) const {

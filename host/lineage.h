@@ -50,7 +50,8 @@ struct Impact {
 // is to stay as it is for as long as the object lives. Not for several threads.
 class Lineage {
  public:
-    explicit Lineage(Database& database, ColumnTracer::IsReadWhole isReadWhole = {});
+    explicit Lineage(Database& database, ColumnTracer::IsReadWhole isReadWhole = {},
+                     const AnalysisProgress& progress = {});
 
     const std::vector<Ring>& rings() const { return rings_; }
     bool isInRing(const CZRQueryInfo& query) const;

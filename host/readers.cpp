@@ -1,5 +1,7 @@
 #include <algorithm>
+#include <filesystem>
 
+#include "host/access_reader.h"
 #include "host/catalog_url.h"
 #include "host/dump_reader.h"
 #include "host/file_replacement.h"
@@ -54,25 +56,34 @@ std::unique_ptr<CatalogReader> readerForServer(const std::string& word, const CS
     throw CatalogReadError(url.shown() + ": no server is read by such an address; there are " + known);
 }
 
+// A file of such a name that is something else is told as that, and not as a bad dump.
+bool hasAccessName(const std::string& path) {
+    const CString ending(std::filesystem::path(path).extension().string().c_str());
+    return std::filesystem::exists(path) && (ending.EqualsNoCase(u".mdb") || ending.EqualsNoCase(u".accdb"));
+}
+
 }  // namespace
 
 std::unique_ptr<CatalogReader> readerFor(const std::string& source, const CString& schema) {
     if (isUrl(source)) return readerForServer(source, schema);
     try {
         if (isSqliteFile(source)) return std::make_unique<SqliteReader>(source);
+        if (isAccessFile(source)) return std::make_unique<AccessReader>(source);
+        if (hasAccessName(source)) throw CatalogReadError(source + ": is no database of MS Access");
         return std::make_unique<DumpReader>(source, readFile(source));
     } catch (const FileError& error) {
         throw CatalogReadError(error.what());
     }
 }
 
-std::optional<DBTypes> kindOfServer(const std::string& source) {
+std::optional<DBTypes> kindOfSource(const std::string& source) {
+    if (!isUrl(source) && isAccessFile(source)) return DB_MSACCESS;
     const ServerKind* const kind = isUrl(source) ? kindOf(parseUrl(source).scheme) : nullptr;
     return kind ? std::optional(kind->kind) : std::nullopt;
 }
 
 std::vector<std::string> catalogReaders() {
-    std::vector<std::string> names = {"SQLite", "CSV", "JSON"};
+    std::vector<std::string> names = {"SQLite", "CSV", "JSON", "MS Access (where mdbtools is installed)"};
     for (const ServerKind& kind : serverKinds())
         if (kind.make) names.emplace_back(kind.name);
     return names;

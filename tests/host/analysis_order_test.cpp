@@ -54,6 +54,24 @@ TEST_F(AnalysisOrder, QueriesStandBehindThoseThatTheyReadFrom) {
         << "found through two queries in a table";
 }
 
+TEST_F(AnalysisOrder, TellsHowFarItIsAndCanBeEnded) {
+    add(u"b", u"SELECT id FROM a");
+    add(u"a", u"SELECT id FROM orders");
+    std::string steps;
+    const auto note = [&](std::size_t done, std::size_t all) {
+        steps += std::to_string(done) + "/" + std::to_string(all) + " ";
+    };
+    analyseQueries(*database, note);
+    EXPECT_EQ(steps, "0/4 1/4 2/4 3/4 ");
+    steps.clear();
+    analyseQueriesInRings(*database, note);
+    EXPECT_EQ(steps, "0/4 1/4 2/4 3/4 ");
+    const auto end = [](std::size_t done, std::size_t) {
+        if (done == 2) throw std::out_of_range("ended");
+    };
+    EXPECT_THROW(analyseQueries(*database, end), std::out_of_range);
+}
+
 TEST_F(AnalysisOrder, NestedQueriesAndBranchesOfUnionsCount) {
     add(u"d", u"SELECT id FROM orders UNION SELECT id FROM c");
     add(u"c", u"SELECT id FROM orders WHERE id IN (SELECT id FROM b)");

@@ -121,10 +121,10 @@ TEST(ServerSettings, TakeTheSchemaThatIsAskedForBesides) {
 }
 
 TEST(KindOfServer, IsToldByItsAddress) {
-    EXPECT_EQ(kindOfServer("postgres://db/x"), DB_POSTGRESQL);
-    EXPECT_EQ(kindOfServer("MariaDB://db/x"), DB_MYSQL);
-    EXPECT_EQ(kindOfServer("oracle://db/x"), std::nullopt);
-    EXPECT_EQ(kindOfServer("postgres"), std::nullopt);
+    EXPECT_EQ(kindOfSource("postgres://db/x"), DB_POSTGRESQL);
+    EXPECT_EQ(kindOfSource("MariaDB://db/x"), DB_MYSQL);
+    EXPECT_EQ(kindOfSource("oracle://db/x"), std::nullopt);
+    EXPECT_EQ(kindOfSource("postgres"), std::nullopt);
 }
 
 TEST(ServerSettings, HaveTimesOutOfTheBox) {

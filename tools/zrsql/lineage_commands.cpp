@@ -33,9 +33,17 @@ void writeReport(const LineageOptions& options, TracedProject& project, std::str
 }  // namespace
 
 void runLineage(const LineageOptions& options, std::string& out) {
-    TracedProject project(options.file);
-    if (options.command == LineageCommand::Lineage)
-        return appendLineage(out, options.format, project, queriesOf(options, project.database()));
+    LongWork work("following " + options.file);
+    TracedProject project(options.file, &work);
+    if (options.command == LineageCommand::Lineage) {
+        const auto queries = queriesOf(options, project.database());
+        std::size_t done = 0;
+        for (const CZRQueryInfo* query : queries) {
+            project.step(done++);
+            project.lineage().tracer().columnsOf(*query);  // what it finds is kept
+        }
+        return appendLineage(out, options.format, project, queries);
+    }
     if (options.command == LineageCommand::Report) return writeReport(options, project, out);
     const auto target = project.lineage().find(CString::fromUtf8(options.target));
     if (!target)

@@ -13,6 +13,7 @@
 #include "json_line.h"
 #include "json_text.h"
 #include "lineage_commands.h"
+#include "long_work.h"
 #include "options.h"
 #include "project_commands.h"
 #include "token_format.h"
@@ -24,6 +25,7 @@ namespace {
 
 constexpr int kUnreadable = 1;
 constexpr int kWrongUse = 2;
+constexpr int kInterrupted = 130;  // as shells tell a program that SIGINT ended
 
 std::unique_ptr<CZRDatabaseInfo> openDatabase(const Options& options) {
     if (options.catalog.empty()) return std::make_unique<host::Database>();
@@ -160,6 +162,9 @@ int main(int argc, char** argv) {
     } catch (const WrongUse& problem) {
         std::fprintf(stderr, "zrsql: %s\n", problem.what());
         return kWrongUse;
+    } catch (const Interrupted& interrupt) {
+        std::fprintf(stderr, "zrsql: %s\n", interrupt.what());
+        return kInterrupted;
     } catch (const std::exception& problem) {
         std::fprintf(stderr, "zrsql: %s\n", problem.what());
         return kUnreadable;

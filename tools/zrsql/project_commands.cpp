@@ -8,6 +8,7 @@
 #include "host/catalog_reader.h"
 #include "host/kinds.h"
 #include "input.h"
+#include "long_work.h"
 #include "project_report.h"
 #include "table_words.h"
 
@@ -156,10 +157,11 @@ void show(const ProjectOptions& options, std::string& out) {
 }
 
 void analyze(const ProjectOptions& options, std::string& out) {
+    LongWork work("analysing " + options.file);
     const DatabasePointer database = host::loadProject(options.file);
     const Dialect& dialect = dialectOf(*database, options.file);
     try {
-        host::analyseQueries(*database);
+        host::analyseQueries(*database, [&work](std::size_t done, std::size_t all) { work.step(done, all); });
     } catch (const host::CyclicQueries& ring) {
         throw ProjectFailure(options.file + ": " + ring.what());
     }
@@ -173,7 +175,9 @@ void analyze(const ProjectOptions& options, std::string& out) {
     host::ColumnTracer tracer(*database);
     if (options.asJson) out += "{\"queries\":[";
     bool isFirst = true;
+    std::size_t done = 0;
     for (const CZRQueryInfo* query : shown) {
+        work.step(done++, shown.size());
         if (!isFirst) out += options.asJson ? "," : "\n";
         isFirst = false;
         if (options.asJson)

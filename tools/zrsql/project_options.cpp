@@ -16,9 +16,11 @@ host::StorageForm formOf(const std::string& word, const std::string& file) {
                    ": the name tells no form; let it end in .json, .db, .sqlite or .sqlite3, or give --form");
 }
 
-const Dialect* dialectOfServer(const std::string& catalogue) {
-    const auto kind = host::kindOfServer(catalogue);
-    if (!kind) throw WrongUse("--dialect is required, but where the address of a server tells it");
+const Dialect* dialectOfSource(const std::string& catalogue) {
+    const auto kind = host::kindOfSource(catalogue);
+    if (!kind)
+        throw WrongUse(
+            "--dialect is required, but where the address of a server or a file of MS Access tells it");
     return findDialect(*kind);
 }
 
@@ -61,17 +63,18 @@ void ProjectWords::addTo(CLI::App& app) {
     CLI::App* imported = project_->add_subcommand(
         "import", "Make a project of what a database tells of itself: tables, keys and views");
     imported
-        ->add_option(
-            "CATALOGUE", catalogue_,
-            "An SQLite database, a CSV or JSON dump of INFORMATION_SCHEMA or Oracle's ALL_ views, or a "
-            "server, such as postgresql://USER@HOST:PORT/DATABASE?schema=NAME")
+        ->add_option("CATALOGUE", catalogue_,
+                     "An SQLite or MS Access database, a CSV or JSON dump of INFORMATION_SCHEMA or Oracle's "
+                     "ALL_ views, or a "
+                     "server, such as postgresql://USER@HOST:PORT/DATABASE?schema=NAME")
         ->required();
     imported->add_option("PROJECT", options_.file, "The project to make, a JSON or SQLite file")->required();
     commands_.emplace_back(imported, ProjectCommand::Import);
     imported
         ->add_option(
             "-d,--dialect", dialect_,
-            "Dialect of its queries, which a server's address tells by itself: " + dialectNames(true))
+            "Dialect of its queries, which a server's address and a file of MS Access tell by themselves: " +
+                dialectNames(true))
         ->type_name("DIALECT");
     imported
         ->add_option("--also", options_.catalogues,
@@ -158,7 +161,7 @@ std::optional<ProjectOptions> ProjectWords::read() const {
         options.catalogues.insert(options.catalogues.begin(), catalogue_);
     if (options.command == ProjectCommand::New || options.command == ProjectCommand::Import) {
         options.dialect = findDialect(dialect_);
-        if (dialect_.empty()) options.dialect = dialectOfServer(catalogue_);
+        if (dialect_.empty()) options.dialect = dialectOfSource(catalogue_);
         if (!options.dialect || options.dialect->kind == DB_NONE)
             throw WrongUse("there is no project in the dialect \"" + dialect_ + "\"; there are " +
                            dialectNames(true));

@@ -24,6 +24,7 @@ header.bar { position: sticky; top: 0; z-index: 1; background: var(--back); padd
   gap: .5rem; align-items: center; flex-wrap: wrap; border-bottom: 1px solid var(--line); }
 input[type=search] { flex: 1 1 16rem; padding: .4rem; font: inherit; color: inherit; background: var(--box);
   border: 1px solid var(--line); border-radius: 5px; }
+::placeholder { color: var(--soft); opacity: 1; }
 button { font: inherit; color: inherit; background: var(--box); border: 1px solid var(--line);
   border-radius: 5px; padding: .3rem .7rem; cursor: pointer; }
 .counts { display: flex; flex-wrap: wrap; gap: .6rem; padding: 0; list-style: none; }
@@ -32,7 +33,9 @@ button { font: inherit; color: inherit; background: var(--box); border: 1px soli
 table { border-collapse: collapse; width: 100%; margin: .5rem 0; }
 th, td { text-align: left; vertical-align: top; padding: .25rem .6rem; border-bottom: 1px solid var(--line);
   overflow-wrap: anywhere; }
-th { color: var(--soft); font-weight: 600; }
+th { color: var(--soft); font-weight: 600; overflow-wrap: normal; }
+td:first-child { min-width: 6rem; }
+h2 { scroll-margin-top: 4rem; }
 pre { background: var(--box); padding: .7rem; border-radius: 6px; overflow: auto; white-space: pre-wrap;
   max-height: 40rem; font: 13px/1.45 ui-monospace, monospace; tab-size: 4; }
 section details.object { border: 1px solid var(--line); border-radius: 6px; margin: .4rem 0; padding: .3rem .8rem;
@@ -43,7 +46,7 @@ summary { cursor: pointer; overflow-wrap: anywhere; } summary .soft, .soft { col
 .c-group { color: var(--group); } .c-having { color: var(--having); } .c-order { color: var(--order); }
 .c-union { color: var(--union); } .c-limit { color: var(--limit); }
 .unread { text-decoration: underline wavy var(--bad); opacity: .75; }
-#graph { width: 100%; height: 32rem; border: 1px solid var(--line); border-radius: 6px; background: var(--box);
+#graph { box-sizing: border-box; width: 100%; height: 32rem; border: 1px solid var(--line); border-radius: 6px; background: var(--box);
   cursor: grab; touch-action: none; }
 #graph rect { stroke: var(--line); } #graph a.query rect { fill: var(--query); }
 #graph a.table rect { fill: var(--table); } #graph text { font: 12px system-ui, sans-serif; fill: var(--text); }
@@ -79,16 +82,17 @@ function openTarget() {
 }
 addEventListener('hashchange', openTarget);
 
-// Search: names, columns and texts of queries and tables.
+// Search: names, columns and texts of queries and tables, but not who reads them.
 const objects = [...document.querySelectorAll('details.object')];
 const texts = new Map();
 const textOf = object => {
   if (!texts.has(object)) {
-    const parts = [...object.children].filter(part => !part.classList.contains('tree'));
+    const parts = [...object.children].filter(part => !part.matches('.tree, .readers, :has(> .look)'));
     texts.set(object, parts.map(part => part.textContent).join(' ').toLowerCase());
   }
   return texts.get(object);
 };
+const nameOf = object => object.querySelector('summary b').textContent.toLowerCase();
 const search = byId('search');
 let hits = [];
 let hitAt = -1;
@@ -111,7 +115,8 @@ search.addEventListener('keydown', event => {
   if (event.key !== 'Enter' || search.value.trim() === '') return;
   find();
   if (hits.length === 0) return;
-  location.hash = hits[0].id;
+  const wanted = search.value.trim().toLowerCase();
+  location.hash = (hits.find(hit => nameOf(hit) === wanted) || hits[0]).id;
 });
 byId('next').addEventListener('click', () => {
   if (hits.length === 0) return;
@@ -165,7 +170,11 @@ function lookAt(id) {
   const node = nodes.get(id);
   if (!node) return;
   const box = node.querySelector('rect');
-  view = [+box.getAttribute('x') - 500, +box.getAttribute('y') - 240, 1200, 500];
+  // In the middle and as large as the rest of the page.
+  const width = graph.clientWidth;
+  const height = graph.clientHeight;
+  view = [+box.getAttribute('x') + (+box.getAttribute('width') - width) / 2,
+          +box.getAttribute('y') + (+box.getAttribute('height') - height) / 2, width, height];
   show();
   showNear(id);
   node.focus();

@@ -38,7 +38,11 @@ class Page {
             "table.</span></p>\n";
         appendGraph(out_, project_, anchors_);
         out_ += "</section>\n<section aria-labelledby=\"h-queries\"><h2 id=\"h-queries\">Queries</h2>\n";
-        for (const CZRQueryInfo* query : project_.database().Queries) appendQuery(*query);
+        std::size_t done = 0;
+        for (const CZRQueryInfo* query : project_.database().Queries) {
+            project_.step(done++);
+            appendQuery(*query);
+        }
         out_ += "</section>\n<section aria-labelledby=\"h-tables\"><h2 id=\"h-tables\">Tables</h2>\n";
         for (const CZRTableInfo* table : project_.database().Tables) appendTable(*table);
         out_ += "</section>\n</main>\n<script>//<![CDATA[\n";
@@ -158,7 +162,7 @@ class Page {
     void appendReaders(const CZRSourceInfo& object) {
         const auto found = readers_.find(&object);
         if (found == readers_.end()) return;
-        out_ += "<p>Read by: ";
+        out_ += "<p class=\"readers\">Read by: ";
         bool isFirst = true;
         for (const CZRQueryInfo* reader : found->second) {
             if (!isFirst) out_ += ", ";

@@ -4,11 +4,15 @@
 
 namespace zr::tool {
 
-TracedProject::TracedProject(const std::string& file)
-    : database_(host::loadProject(file)),
+TracedProject::TracedProject(const std::string& file, LongWork* work)
+    : work_(work),
+      database_(host::loadProject(file)),
       dialect_(dialectOf(*database_, file)),
       lineage_(std::make_unique<host::Lineage>(
-          *database_, [this](const CZRQueryInfo& query) { return !readPlaceOf(query).stop; })) {}
+          *database_, [this](const CZRQueryInfo& query) { return !readPlaceOf(query).stop; },
+          [this](std::size_t done, std::size_t all) {
+              if (work_) work_->step(done, all);
+          })) {}
 
 const ReadPlace& TracedProject::readPlaceOf(const CZRQueryInfo& query) {
     const auto [place, isNew] = read_.try_emplace(&query);
