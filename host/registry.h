@@ -8,8 +8,9 @@ namespace zr::host {
 // User functions that an analysis meets are noted here, and the catalogue is only read. IDs and schema are
 // those of the catalogue, the other settings are not taken over.
 //
-// Owns none of the tables and queries: the catalogue outlives the object, and nobody changes it meanwhile.
-// Not to be loaded into.
+// For BuildQueryInfo alone: to follow columns (CZRQueryInfo::ResolveItems and the like) marks sources, and
+// wants a clone a thread. Owns none of the tables and queries: the catalogue outlives the object, and nobody
+// changes it meanwhile. Not to be loaded into.
 class Registry : public Database {
  public:
     explicit Registry(const CZRDatabaseInfo& catalogue);

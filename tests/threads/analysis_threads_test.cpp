@@ -81,20 +81,15 @@ std::unique_ptr<host::Database> catalogue() {
     return database;
 }
 
-// What an analysis finds, its columns followed to their sources, and the user functions that it met.
+// What an analysis finds, and the user functions that it met.
 std::string found(const Text& text, CZRDatabaseInfo& database, bool withUserFunctions) {
     if (withUserFunctions) database.UserFunctions.RemoveAll();
     CZRQueryInfo query;
     query.SetSQL(CString(text.sql));
     query.SetDatabase(&database);
     BuildQueryInfo(&query, text.kind);
-    query.ResolveAllItems();
     std::string result;
     appendQuery(result, query);
-    for (const auto& field : query.m_fields)
-        if (const CZRSourceFildInfo* column = query.FindField(field.value->m_table, field.value->m_field))
-            result += " " + column->GetSrcName().toUtf8();
-    result += " " + std::to_string(query.GetCorrect());
     if (withUserFunctions) appendTextMap(result, database.UserFunctions);
     return result;
 }

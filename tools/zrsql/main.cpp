@@ -12,7 +12,6 @@
 #include "analyst.h"
 #include "batch.h"
 #include "host/catalog.h"
-#include "host/registry.h"
 #include "input.h"
 #include "json_line.h"
 #include "json_text.h"
@@ -144,9 +143,10 @@ int runLines(const Options& options, const CZRDatabaseInfo& catalogue) {
     batch.output = stdout;
     batch.jobs = options.jobs;
     if (options.showsProgress || isTerminal) batch.progress = &progress;
-    // An analysis writes user functions into its database.
+    // An analysis writes user functions into its database, and a look-up of columns marks sources. Clones
+    // keep the IDs, so that all threads answer alike.
     batch.newWorker = [&]() -> LineWorker {
-        const auto database = std::make_shared<host::Registry>(catalogue);
+        const auto database = std::shared_ptr<CZRDatabaseInfo>(catalogue.Clone());
         return [&options, database](std::string_view line, std::uint64_t number, std::string& out) {
             return appendLineAnswer(out, options, *database, line, number);
         };
