@@ -29,8 +29,8 @@ class SourceIndex;
 // Owns its tables and queries. Threads: none of it is guarded, and a query's analysis writes UserFunctions
 // (CZRQueryInfo::AddUserFunction). Apart from that an analysis only reads it: queries of one database may be
 // analysed on several threads where no text calls a user function and nobody changes tables or queries
-// meanwhile. Resolving columns is no part of that: it marks sources. Texts from outside may; a thread that
-// analyses those has a database of its own, such as a clone.
+// meanwhile. Texts from outside may call some; a thread that analyses those has a database of its own, such
+// as a clone. So has one that resolves columns, which marks sources.
 class ZR_SHARED_DECLARATION CZRDatabaseInfo : public CZRObjectInfo {
  public:
     CString SchemaName;
