@@ -19,6 +19,8 @@ std::size_t sourceCount(const CZRDatabaseInfo& database) {
 }  // namespace
 
 std::shared_ptr<const SourceIndex> SourceIndex::of(CZRDatabaseInfo& database) {
+    // Analyses on several threads may look into one database.
+    const CriticalSectionGuard guard(database.sourceIndexLock_);
     if (!database.sourceIndex_ || !database.sourceIndex_->isCurrent(database))
         database.sourceIndex_ = std::make_shared<const SourceIndex>(database);
     return database.sourceIndex_;

@@ -15,6 +15,8 @@ class CZRQueryInfo;
 // A kind without a dialect, a null query and a text without a statement change nothing. Wrong SQL is not
 // reported: the query is left empty or partly filled. Never throws.
 //
-// Threads: runs on the caller's thread. Two calls on two queries are independent, unless the queries share a
-// database: the caller guards that.
+// Threads: runs on the caller's thread. Two calls on two queries are independent, also where the queries
+// share a database that nobody changes, unless a text calls a user function: that writes into the database
+// (CZRQueryInfo::AddUserFunction). For texts that may do so each thread has a database of its own, or the
+// caller guards the calls.
 ZR_API void BuildQueryInfo(CZRQueryInfo* query, DBTypes kind);

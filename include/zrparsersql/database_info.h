@@ -4,6 +4,7 @@
 #include <memory>
 
 #include "zrparsersql/containers.h"
+#include "zrparsersql/critical_section.h"
 #include "zrparsersql/object_info.h"
 #include "zrparsersql/query_info.h"
 #include "zrparsersql/table_info.h"
@@ -25,8 +26,11 @@ class SourceIndex;
 // Root of a model: tables and queries of one database, the options of a conversion, and the user functions
 // that the analysis met. Queries look up their sources through it.
 //
-// Owns its tables and queries. Threads: none of it is guarded; a query's analysis writes user functions into
-// it.
+// Owns its tables and queries. Threads: none of it is guarded, and a query's analysis writes UserFunctions
+// (CZRQueryInfo::AddUserFunction). Apart from that an analysis only reads it: queries of one database may be
+// analysed on several threads where no text calls a user function and nobody changes tables or queries
+// meanwhile. Texts from outside may call some; a thread that analyses those has a database of its own, such
+// as a clone. So has one that resolves columns, which marks sources.
 class ZR_SHARED_DECLARATION CZRDatabaseInfo : public CZRObjectInfo {
  public:
     CString SchemaName;
@@ -165,6 +169,7 @@ class ZR_SHARED_DECLARATION CZRDatabaseInfo : public CZRObjectInfo {
  private:
     friend class zr::SourceIndex;
 
+    CCriticalSection sourceIndexLock_;
     std::shared_ptr<const zr::SourceIndex>
         sourceIndex_;                            // for the look-ups of queries; made when first needed
     std::unique_ptr<zr::RetiredModel> retired_;  // what Load took out of the lists

@@ -118,6 +118,8 @@ class ZR_SHARED_DECLARATION CZRQueryInfo : public CZRSourceInfo {
     void SetQueryOption2(int value) { QueryOption2 = value; }
 
     // Notes a user function with its count of parameters in the database. Without a database nothing happens.
+    // An analysis calls it for each call of a user function, and it is not guarded: threads whose queries
+    // share a database may not come here at the same time.
     void AddUserFunction(CString name, int parameterCount);
 
     // Puts the ID of each source that the database knows into m_sourceTables, here and in all m_subQueries.

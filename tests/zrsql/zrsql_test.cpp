@@ -45,7 +45,8 @@ INSTANTIATE_TEST_SUITE_P(
                     std::vector<std::string>{"tree", "-d", "mssql", "--jsonl", "a", "x"},
                     std::vector<std::string>{"tree", "-d", "mssql", "--jsonl", "a", "-f", "b"},
                     std::vector<std::string>{"tree", "-d", "mssql", "--jobs", "2", "x"},
-                    std::vector<std::string>{"tree", "-d", "mssql", "--jsonl", "-", "--jobs", "0"},
+                    std::vector<std::string>{"tree", "-d", "mssql", "--jsonl", "-", "--jobs", "-1"},
+                    std::vector<std::string>{"tree", "-d", "mssql", "--jsonl", "-", "--jobs", "257"},
                     std::vector<std::string>{"tree", "-d", "mssql", "--jsonl", "-", "--jobs", "many"}));
 
 TEST(ZrsqlUse, HelpAndVersionAreNoFailure) {

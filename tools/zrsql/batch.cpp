@@ -1,147 +1,136 @@
 #include "batch.h"
 
+#include <sys/stat.h>
 #include <unistd.h>
 
-#include <chrono>
-#include <condition_variable>
-#include <deque>
-#include <memory>
+#include <algorithm>
+#include <exception>
 #include <mutex>
-#include <optional>
 #include <thread>
 #include <vector>
+
+#include "chunk_window.h"
+#include "interrupt_watch.h"
 
 namespace zr::tool {
 
 namespace {
 
-class Progress {
+constexpr std::size_t kChunksPerJob = 4;
+
+// What is left of a file from where it is read on.
+std::optional<std::uint64_t> sizeOf(int input) {
+    struct stat status {};
+    if (fstat(input, &status) != 0 || !S_ISREG(status.st_mode)) return std::nullopt;
+    const off_t place = lseek(input, 0, SEEK_CUR);
+    if (place < 0 || place > status.st_size) return std::nullopt;
+    return static_cast<std::uint64_t>(status.st_size - place);
+}
+
+// The first exception of several threads.
+class Problem {
  public:
-    void lineDone() {
-        ++lines_;
-        if (isShown_ && std::chrono::steady_clock::now() - lastShown_ > std::chrono::milliseconds(100))
-            show();
+    void note(std::exception_ptr problem) {
+        const std::lock_guard lock(mutex_);
+        if (!problem_) problem_ = std::move(problem);
     }
-    ~Progress() {
-        if (isShown_) {
-            show();
-            std::fputc('\n', stderr);
-        }
+    void rethrow() const {
+        if (problem_) std::rethrow_exception(problem_);
     }
 
  private:
-    void show() {
-        std::fprintf(stderr, "\r%zu lines", lines_);
-        std::fflush(stderr);
-        lastShown_ = std::chrono::steady_clock::now();
-    }
-
-    const bool isShown_ = isatty(STDERR_FILENO) != 0;
-    std::size_t lines_ = 0;
-    std::chrono::steady_clock::time_point lastShown_ = std::chrono::steady_clock::now();
+    std::mutex mutex_;
+    std::exception_ptr problem_;
 };
+
+void workOn(ChunkWindow::Slot& slot, const LineWorker& worker) {
+    std::string_view lines = slot.chunk.lines;
+    std::uint64_t number = slot.chunk.firstLine;
+    while (!lines.empty()) {
+        const std::string_view line = lines.substr(0, lines.find('\n'));
+        ++(worker(line, number++, slot.answers) ? slot.done : slot.failed);
+        slot.answers += '\n';
+        lines.remove_prefix(std::min(line.size() + 1, lines.size()));
+    }
+}
+
+void workAll(ChunkWindow& window, const LineWorker& worker, Problem& problem) {
+    while (ChunkWindow::Slot* slot = window.take()) {
+        try {
+            workOn(*slot, worker);
+        } catch (...) {
+            problem.note(std::current_exception());
+            slot->isBroken = true;
+            window.stop();
+        }
+        window.finish(*slot);
+    }
+}
 
 class Writer {
  public:
-    explicit Writer(std::FILE* output) : output_(output) {}
-    void write(std::string line) {
-        line += '\n';
-        std::fwrite(line.data(), 1, line.size(), output_);
-        std::fflush(output_);
-        progress_.lineDone();
-    }
+    explicit Writer(const Batch& batch) : batch_(batch) { state_.allBytes = sizeOf(batch.input); }
 
- private:
-    std::FILE* output_;
-    Progress progress_;
-};
-
-// The lines at work, in order. The reader puts them in at one end, workers take any, and the writer takes the
-// oldest when it is done.
-class Window {
- public:
-    explicit Window(std::size_t most) : most_(most) {}
-
-    void put(std::string line) {
-        std::unique_lock lock(mutex_);
-        changed_.wait(lock, [&] { return slots_.size() < most_; });
-        slots_.push_back(std::make_unique<Slot>(Slot{std::move(line), std::nullopt}));
-        changed_.notify_all();
-    }
-    void end() {
-        const std::lock_guard lock(mutex_);
-        ended_ = true;
-        changed_.notify_all();
-    }
-    void work(const LineWorker& worker) {
-        while (Slot* slot = take()) {
-            std::string answer = worker(slot->line);
-            const std::lock_guard lock(mutex_);
-            slot->answer = std::move(answer);
-            changed_.notify_all();
+    void writeAll(ChunkWindow& window) {
+        bool isBroken = false;
+        while (const auto slot = window.oldest()) {
+            isBroken = isBroken || slot->isBroken;
+            if (isBroken) continue;  // what comes behind would leave a gap
+            std::fwrite(slot->answers.data(), 1, slot->answers.size(), batch_.output);
+            if (std::fflush(batch_.output) != 0) window.stop();
+            state_.done += slot->done;
+            state_.failed += slot->failed;
+            state_.bytes += slot->chunk.lines.size();
+            look();
+            if (batch_.progress) batch_.progress->show(state_);
         }
     }
-    // The oldest answer, or nothing when all have been given.
-    std::optional<std::string> oldest() {
-        std::unique_lock lock(mutex_);
-        changed_.wait(lock, [&] { return slots_.empty() ? ended_ : slots_.front()->answer.has_value(); });
-        if (slots_.empty()) return std::nullopt;
-        std::optional<std::string> answer = std::move(slots_.front()->answer);
-        slots_.pop_front();
-        --taken_;
-        changed_.notify_all();
-        return answer;
+    BatchState end(bool interrupted) {
+        look();
+        state_.interrupted = interrupted;
+        if (batch_.progress) batch_.progress->end(state_);
+        return state_;
     }
 
  private:
-    struct Slot {
-        std::string line;
-        std::optional<std::string> answer;
-    };
-
-    Slot* take() {
-        std::unique_lock lock(mutex_);
-        changed_.wait(lock, [&] { return taken_ < slots_.size() || ended_; });
-        return taken_ < slots_.size() ? slots_[taken_++].get() : nullptr;
+    void look() {
+        state_.elapsed =
+            std::chrono::duration_cast<std::chrono::milliseconds>(std::chrono::steady_clock::now() - start_);
     }
 
-    const std::size_t most_;
-    std::mutex mutex_;
-    std::condition_variable changed_;
-    std::deque<std::unique_ptr<Slot>> slots_;
-    std::size_t taken_ = 0;  // the first of the slots that workers have taken
-    bool ended_ = false;
+    const Batch& batch_;
+    const std::chrono::steady_clock::time_point start_ = std::chrono::steady_clock::now();
+    BatchState state_;
 };
 
-void runInline(std::istream& input, Writer& writer, const LineWorker& worker) {
-    std::string line;
-    while (std::getline(input, line)) writer.write(worker(line));
-}
-
-void runThreads(std::istream& input, Writer& writer, unsigned jobs,
-                const std::function<LineWorker()>& newWorker) {
-    static constexpr std::size_t linesPerJob = 64;
-    Window window(jobs * linesPerJob);
-    std::vector<std::jthread> threads;
-    for (unsigned job = 0; job < jobs; ++job)
-        threads.emplace_back([&window, worker = newWorker()] { window.work(worker); });
-    threads.emplace_back([&window, &writer] {
-        while (auto answer = window.oldest()) writer.write(std::move(*answer));
-    });
-    std::string line;
-    while (std::getline(input, line)) window.put(std::move(line));
-    window.end();
-}
+// Whatever happens to the reader, the threads come to their end.
+struct Ender {
+    ChunkWindow& window;
+    ~Ender() { window.end(); }
+};
 
 }  // namespace
 
-void runBatch(std::istream& input, std::FILE* output, unsigned jobs,
-              const std::function<LineWorker()>& newWorker) {
-    Writer writer(output);
-    if (jobs <= 1)
-        runInline(input, writer, newWorker());
-    else
-        runThreads(input, writer, jobs, newWorker);
+BatchState runBatch(const Batch& batch) {
+    ChunkWindow window(batch.jobs * kChunksPerJob);
+    Problem problem;
+    Writer writer(batch);
+    const InterruptWatch interrupt([&window] { window.stop(); });
+    {
+        std::vector<std::jthread> threads;
+        const Ender atTheEnd{window};
+        for (unsigned job = 0; job < batch.jobs; ++job)
+            threads.emplace_back(
+                [&window, &problem, worker = batch.newWorker()] { workAll(window, worker, problem); });
+        threads.emplace_back([&writer, &window] { writer.writeAll(window); });
+        LineChunks chunks(batch.input, interrupt.descriptor());
+        while (auto chunk = chunks.next())
+            if (!window.put(std::move(*chunk))) break;
+        window.end();
+        threads.clear();
+    }
+    problem.rethrow();
+    return writer.end(interrupt.wasInterrupted());
 }
 
 }  // namespace zr::tool

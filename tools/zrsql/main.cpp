@@ -1,10 +1,13 @@
 // zrsql: shows what the library sees in a SQL text.
 
+#include <fcntl.h>
+#include <unistd.h>
+
 #include <cstdio>
 #include <exception>
-#include <fstream>
 #include <iostream>
 #include <memory>
+#include <optional>
 
 #include "analyst.h"
 #include "batch.h"
@@ -12,6 +15,7 @@
 #include "input.h"
 #include "json_line.h"
 #include "json_text.h"
+#include "line_chunks.h"
 #include "lineage_commands.h"
 #include "long_work.h"
 #include "options.h"
@@ -90,41 +94,73 @@ void appendAnswerMembers(std::string& out, const Options& options, CZRDatabaseIn
     }
 }
 
-std::string lineAnswer(const Options& options, CZRDatabaseInfo& database, std::string_view bytes) {
+bool appendLineAnswer(std::string& out, const Options& options, CZRDatabaseInfo& database,
+                      std::string_view bytes, std::uint64_t number) {
     const JsonLine line = readJsonLine(bytes);
-    const std::string head = "{\"id\":" + line.id + ",";
+    out += "{\"id\":" + line.id + ",";
+    const std::size_t head = out.size();
     std::string error = line.error;
     if (error.empty()) {
         try {
-            std::string out = head;
             appendAnswerMembers(out, options, database, CString(*line.sql));
-            return out += '}';
+            out += '}';
+            return true;
         } catch (const std::exception& problem) {
             error = problem.what();
         }
     }
-    std::string out = head + "\"error\":";
+    out.resize(head);
+    out += "\"error\":";
     appendUtf8String(out, error);
-    return out += '}';
+    out += ",\"line\":" + std::to_string(number) + "}";
+    return false;
 }
 
-void runLines(const Options& options, const CZRDatabaseInfo& prototype) {
-    // Clones keep the IDs, so that all threads answer alike.
-    const auto newWorker = [&]() -> LineWorker {
-        const std::shared_ptr<CZRDatabaseInfo> database(prototype.Clone());
-        return [&options, database](std::string_view line) { return lineAnswer(options, *database, line); };
-    };
-    std::ifstream file;
-    if (options.jsonLines != "-") {
-        file.open(options.jsonLines, std::ios::binary);
-        if (!file) throw InputError(options.jsonLines + ": can't be opened");
+// The input of --jsonl.
+class OpenInput {
+ public:
+    explicit OpenInput(const std::string& path)
+        : descriptor_(path == "-" ? STDIN_FILENO : open(path.c_str(), O_RDONLY | O_CLOEXEC)) {
+        if (descriptor_ < 0) throw InputError(path + ": can't be opened");
     }
-    std::istream& input = options.jsonLines == "-" ? std::cin : file;
-    runBatch(input, stdout, options.jobs, newWorker);
-    if (input.bad()) throw InputError(options.jsonLines + ": can't be read to its end");
+    ~OpenInput() {
+        if (descriptor_ != STDIN_FILENO) close(descriptor_);
+    }
+    OpenInput(const OpenInput&) = delete;
+    OpenInput& operator=(const OpenInput&) = delete;
+    int descriptor() const { return descriptor_; }
+
+ private:
+    int descriptor_;
+};
+
+// Gives the exit status.
+int runLines(const Options& options, const CZRDatabaseInfo& catalogue) {
+    const OpenInput input(options.jsonLines);
+    const bool isTerminal = isatty(STDERR_FILENO) != 0;
+    Progress progress(stderr, isTerminal);
+    Batch batch;
+    batch.input = input.descriptor();
+    batch.output = stdout;
+    batch.jobs = options.jobs;
+    if (options.showsProgress || isTerminal) batch.progress = &progress;
+    // An analysis writes user functions into its database, and a look-up of columns marks sources. Clones
+    // keep the IDs, so that all threads answer alike.
+    batch.newWorker = [&]() -> LineWorker {
+        const auto database = std::shared_ptr<CZRDatabaseInfo>(catalogue.Clone());
+        return [&options, database](std::string_view line, std::uint64_t number, std::string& out) {
+            return appendLineAnswer(out, options, *database, line, number);
+        };
+    };
+    try {
+        return runBatch(batch).interrupted ? kInterrupted : 0;
+    } catch (const ReadError&) {
+        throw InputError(options.jsonLines + ": can't be read to its end");
+    }
 }
 
-void run(const Options& options) {
+// Gives the exit status.
+int run(const Options& options) {
     if (options.project || options.lineage) {
         std::string told;
         if (options.project)
@@ -132,7 +168,7 @@ void run(const Options& options) {
         else
             runLineage(*options.lineage, told);
         std::fwrite(told.data(), 1, told.size(), stdout);
-        return;
+        return 0;
     }
     const auto database = openDatabase(options);
     if (!options.jsonLines.empty()) return runLines(options, *database);
@@ -140,6 +176,7 @@ void run(const Options& options) {
     std::string out;
     appendAnswer(out, options, *database, decodeText(bytes));
     std::fwrite(out.data(), 1, out.size(), stdout);
+    return 0;
 }
 
 }  // namespace
@@ -153,12 +190,12 @@ int main(int argc, char** argv) {
         int exitStatus = 0;
         const auto options = readOptions(argc, argv, exitStatus);
         if (!options) return exitStatus;
-        run(*options);
+        exitStatus = run(*options);
         if (std::fflush(stdout) != 0 || std::ferror(stdout)) {
             std::fputs("zrsql: standard output can't be written\n", stderr);
             return kUnreadable;
         }
-        return 0;
+        return exitStatus;
     } catch (const WrongUse& problem) {
         std::fprintf(stderr, "zrsql: %s\n", problem.what());
         return kWrongUse;

@@ -1,7 +1,9 @@
 #include "options.h"
 
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <iostream>
+#include <thread>
 
 #include "host/catalog_reader.h"
 
@@ -20,6 +22,7 @@ struct Words {
     std::string format;
     std::string catalog;
     unsigned jobs = 1;
+    bool showsProgress = false;
 };
 
 CLI::App* addCommand(CLI::App& app, Words& words, const std::string& name, const std::string& help) {
@@ -42,10 +45,14 @@ CLI::App* addCommand(CLI::App& app, Words& words, const std::string& name, const
             ->type_name("FILE")
             ->excludes(text)
             ->excludes(file);
-    command->add_option("--jobs", words.jobs, "Threads to work on the lines of --jsonl")
-        ->check(CLI::Range(1u, kMostJobs))
+    command->add_option("--jobs", words.jobs, "Threads to work on the lines of --jsonl; 0 is one a processor")
+        ->check(CLI::Range(0u, kMostJobs))
         ->needs(jsonLines)
         ->type_name("N");
+    command
+        ->add_flag("--progress", words.showsProgress,
+                   "Tell on standard error how far the lines of --jsonl are; a terminal is told anyway")
+        ->needs(jsonLines);
     return command;
 }
 
@@ -125,7 +132,8 @@ std::optional<Options> readOptions(int argc, char** argv, int& exitStatus) {
     options.treeFormat = treeFormat(words.format);
     options.asPicture = words.format == "pretty";
     options.catalog = words.catalog;
-    options.jobs = words.jobs;
+    options.jobs = words.jobs ? words.jobs : std::clamp(std::thread::hardware_concurrency(), 1u, kMostJobs);
+    options.showsProgress = words.showsProgress;
     return options;
 }
 

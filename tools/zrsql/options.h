@@ -20,9 +20,10 @@ struct Options {
     std::string file = "-";           // where the text is read from otherwise
     std::string jsonLines;            // not empty: a text a line, from there
     TreeFormat treeFormat = TreeFormat::Sexpr;
-    bool asPicture = false;  // analyze: for a person instead of JSON
-    std::string catalog;     // empty: none
-    unsigned jobs = 1;
+    bool asPicture = false;                 // analyze: for a person instead of JSON
+    std::string catalog;                    // empty: none
+    unsigned jobs = 1;                      // at least 1
+    bool showsProgress = false;             // where standard error is a terminal it is shown anyway
     std::optional<ProjectOptions> project;  // given: nothing of the above counts
     std::optional<LineageOptions> lineage;  // as well
 };
