@@ -107,10 +107,11 @@ std::uint32_t Recogniser::entryFor(std::uint16_t rule, std::uint32_t position, s
 /// Contexts follow from the grammar alone: those of a thread's last text serve for the next one.
 void Recogniser::prepareContexts() {
     if (contextsOf_ == table_) return;
-    contextsOf_ = table_;
+    contextsOf_ = nullptr;  // until all of them stand, whatever memory there is
     contexts_.assign(1, Context{});
     contexts_[0].mayEnd = true;
     contextCache_.assign(table_->contextCount, kNone16);
+    contextsOf_ = table_;
 }
 
 /// The context of what a call runs, from the context of the rule around it.
@@ -134,8 +135,8 @@ std::uint16_t Recogniser::contextOf(std::uint16_t call, std::uint16_t outer) {
     const auto found = std::find(contexts_.begin(), contexts_.end(), context);
     const auto id = static_cast<std::uint16_t>(found - contexts_.begin());
     if (found == contexts_.end()) {
+        contextCache_.resize((contexts_.size() + 1) * table_->contextCount, kNone16);
         contexts_.push_back(context);
-        contextCache_.resize(contexts_.size() * table_->contextCount, kNone16);
     }
     contextCache_[slot] = id;
     return id;
