@@ -69,9 +69,9 @@ class CatalogReader {
 };
 
 // The reader for the address of a server (postgresql://, mysql://, mariadb://), or for a file, by its
-// content: an SQLite database; a database of MS Access; a dump of INFORMATION_SCHEMA or of Oracle's ALL_ views as CSV or JSON. Raises
-// CatalogReadError when it can't be opened or is no part of this build. Of a server a schema that is given is
-// read alone; a file is read whole.
+// content: an SQLite database; a database of MS Access; a dump of INFORMATION_SCHEMA or of Oracle's ALL_
+// views as CSV or JSON. Raises CatalogReadError when it can't be opened or is no part of this build. Of a
+// server a schema that is given is read alone; a file is read whole.
 std::unique_ptr<CatalogReader> readerFor(const std::string& source, const CString& schema = {});
 
 // The kind of database that the address of a server or a file of MS Access tells; nothing for another file or
