@@ -59,6 +59,7 @@ class FullSearch {
         return setAt(searchedFrom(table_, table_.rules[rule].entry), position);
     }
     void join(SetId set);
+    void widenTo(std::uint32_t from, std::uint32_t to);
     void joinWord(std::uint32_t word, std::uint64_t bits);
     SetId joined(SetId like);
     SetId single(std::uint32_t position);

@@ -14,7 +14,7 @@ struct Options {
     /// 0 leaves that search out.
     std::uint32_t quickSteps = 64;
     /// Steps of the search that tries one reading behind the other: a fixed part and a part for each token.
-    /// Most text needs less than half of it; past it the other search is the cheaper one.
+    /// Most text needs less than half of it.
     std::uint64_t baseSteps = 400;
     std::uint64_t stepsPerToken = 20;
     /// Steps of the search that takes over then. Past them the furthest reading of a last, narrow search
