@@ -4,7 +4,7 @@
 ///     corpus_bench [--rounds N] [--dialect NAME] [FOLDER]
 ///     corpus_bench --once --dialect NAME --stage NAME [FOLDER]     for a profiler: one stage, no clock
 ///
-/// Without a folder the fixed queries of bench/fixed are taken. What goes by "tree" has lexing and
+/// Without a folder the queries of bench/plain_queries.jsonl are taken. What goes by "tree" has lexing and
 /// recognising in it, "facade" has "tree" in it, and "analyse" all.
 
 #include <time.h>
@@ -107,13 +107,19 @@ const Dialect kDialects[] = {
      &walkOf<CZRMSAccessSQL_v3Parcer, MSAccessSQL_v3StateSelectQuery>},
 };
 
+/// The queries of a folder's file of the dialect, or without a folder the plain ones, of which a dialect can
+/// have a form of its own.
 std::vector<Query> readQueries(const Dialect& dialect, const std::string& folder) {
+    const std::string path = folder.empty() ? ZR_PLAIN_QUERIES : folder + "/" + dialect.name + ".jsonl";
     std::vector<Query> queries;
-    std::ifstream file(folder + "/" + dialect.name + ".jsonl");
+    std::ifstream file(path);
+    if (!file) std::fprintf(stderr, "corpus_bench: %s can't be read\n", path.c_str());
     for (std::string line; std::getline(file, line);) {
         if (line.empty()) continue;
+        const nlohmann::json record = nlohmann::json::parse(line);
+        const char* const form = record.contains(dialect.name) ? dialect.name : "sql";
         Query query;
-        query.text = CString(nlohmann::json::parse(line).at("sql").get<std::string>().c_str());
+        query.text = CString(record.at(form).get<std::string>().c_str());
         const LexedText lexed(*dialect.grammar.lexer, query.text);
         query.tokens = lexed.seenCount();
         if (query.tokens == 0) continue;
@@ -232,7 +238,7 @@ __attribute__((noinline)) void measuredRun(const std::function<void()>& run) {
 int main(int argc, char** argv) {
     int rounds = 20;
     bool once = false;
-    std::string only, stageName, folder = ZR_FIXED_QUERIES;
+    std::string only, stageName, folder;
     for (int i = 1; i < argc; ++i) {
         const std::string word = argv[i];
         if (word == "--rounds" && i + 1 < argc)

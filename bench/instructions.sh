@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Instructions a token by dialect and stage over the fixed queries, counted by callgrind: the same on every
+# Instructions a token by dialect and stage over the plain queries, counted by callgrind: the same on every
 # machine with the same compiler, whatever else it does. bench/README.md keeps the figures.
 #
 #     bench/instructions.sh [BUILD_FOLDER]
