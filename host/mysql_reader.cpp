@@ -154,13 +154,7 @@ class MysqlReader : public CatalogReader {
                 schema + " ORDER BY TABLE_NAME, ORDINAL_POSITION",
             [&](const Cells& cells) {
                 if (!tables.contains(cells[1])) return;
-                CatalogRows::Column column;
-                column.schema = textIn(cells[0]);
-                column.table = textIn(cells[1]);
-                column.name = textIn(cells[2]);
-                column.type = textIn(cells[3]);
-                column.place = numberIn(cells[4]);
-                rows.columns.push_back(std::move(column));
+                rows.columns.push_back(columnIn(cells));
             });
     }
 
@@ -175,21 +169,7 @@ class MysqlReader : public CatalogReader {
             "WHERE k.TABLE_SCHEMA = " +
                 schema + " AND c.TABLE_SCHEMA = " + schema +
                 " ORDER BY k.TABLE_NAME, k.CONSTRAINT_NAME, k.ORDINAL_POSITION",
-            [&](const Cells& cells) {
-                using Kind = CatalogRows::Key::Kind;
-                CatalogRows::Key key;
-                key.kind = cells[0] == "PRIMARY KEY" ? Kind::Primary
-                           : cells[0] == "UNIQUE"    ? Kind::Unique
-                                                     : Kind::Foreign;
-                key.schema = textIn(cells[1]);
-                key.table = textIn(cells[2]);
-                key.name = textIn(cells[3]);
-                key.column = textIn(cells[4]);
-                key.place = numberIn(cells[5]);
-                key.referencedTable = textIn(cells[6]);
-                key.referencedColumn = textIn(cells[7]);
-                rows.keys.push_back(std::move(key));
-            });
+            [&](const Cells& cells) { rows.keys.push_back(keyIn(cells, "PRIMARY KEY", "UNIQUE")); });
     }
 
     static void readFunctions(Connection& connection, CatalogRows& rows, const std::string& schema) {
@@ -201,9 +181,7 @@ class MysqlReader : public CatalogReader {
             "AND "
             "r.ROUTINE_SCHEMA = " +
                 schema + " ORDER BY r.ROUTINE_NAME",
-            [&](const Cells& cells) {
-                rows.functions.push_back({textIn(cells[0]), textIn(cells[1]), numberIn(cells[2])});
-            });
+            [&](const Cells& cells) { rows.functions.push_back(functionIn(cells)); });
     }
 
     static void readViews(Connection& connection, CatalogRows& rows, const std::string& schema) {
@@ -219,7 +197,7 @@ class MysqlReader : public CatalogReader {
                                          ": left out; the server does not tell its text, for which the user "
                                          "needs the right SHOW VIEW");
                 else
-                    rows.views.push_back({textIn(cells[0]), textIn(cells[1]), textIn(cells[2])});
+                    rows.views.push_back(viewIn(cells));
             });
     }
 

@@ -206,15 +206,7 @@ class PostgresqlReader : public CatalogReader {
             "a.attisdropped "
             "WHERE c.relkind IN ('r', 'p', 'f') AND n.nspname = ANY ($1::pg_catalog.name[]) "
             "ORDER BY n.nspname, c.oid, a.attnum",
-            {schemas}, [&](const Cells& cells) {
-                CatalogRows::Column column;
-                column.schema = textIn(cells[0]);
-                column.table = textIn(cells[1]);
-                column.name = textIn(cells[2]);
-                column.type = textIn(cells[3]);
-                column.place = numberIn(cells[4]);
-                rows.columns.push_back(std::move(column));
-            });
+            {schemas}, [&](const Cells& cells) { rows.columns.push_back(columnIn(cells)); });
     }
 
     // Primary keys and all unique indexes over whole rows and plain columns; then foreign keys.
@@ -241,19 +233,7 @@ class PostgresqlReader : public CatalogReader {
             "JOIN pg_catalog.pg_attribute f ON f.attrelid = o.confrelid AND f.attnum = k.other "
             "WHERE o.contype = 'f' AND n.nspname = ANY ($1::pg_catalog.name[]) "
             "ORDER BY 2, 3, 1, 4, 6",
-            {schemas}, [&](const Cells& cells) {
-                using Kind = CatalogRows::Key::Kind;
-                CatalogRows::Key key;
-                key.kind = cells[0] == "p" ? Kind::Primary : cells[0] == "u" ? Kind::Unique : Kind::Foreign;
-                key.schema = textIn(cells[1]);
-                key.table = textIn(cells[2]);
-                key.name = textIn(cells[3]);
-                key.column = textIn(cells[4]);
-                key.place = numberIn(cells[5]);
-                key.referencedTable = textIn(cells[6]);
-                key.referencedColumn = textIn(cells[7]);
-                rows.keys.push_back(std::move(key));
-            });
+            {schemas}, [&](const Cells& cells) { rows.keys.push_back(keyIn(cells, "p", "u")); });
     }
 
     static void readFunctions(Connection& connection, CatalogRows& rows, const std::string& schemas) {
@@ -263,9 +243,7 @@ class PostgresqlReader : public CatalogReader {
             "JOIN pg_catalog.pg_namespace n ON n.oid = p.pronamespace "
             "WHERE p.prokind <> 'p' AND n.nspname = ANY ($1::pg_catalog.name[]) "
             "ORDER BY n.nspname, p.proname, p.pronargs",
-            {schemas}, [&](const Cells& cells) {
-                rows.functions.push_back({textIn(cells[0]), textIn(cells[1]), numberIn(cells[2])});
-            });
+            {schemas}, [&](const Cells& cells) { rows.functions.push_back(functionIn(cells)); });
     }
 
     // To print a view the server waits for whoever alters what it reads, so one view may fail alone: where
@@ -276,9 +254,7 @@ class PostgresqlReader : public CatalogReader {
             " FROM pg_catalog.pg_class c JOIN pg_catalog.pg_namespace n ON n.oid = c.relnamespace "
             "WHERE c.relkind IN ('v', 'm') AND n.nspname = ANY ($1::pg_catalog.name[]) ORDER BY n.nspname, "
             "c.oid";
-        const auto take = [&](const Cells& cells) {
-            rows.views.push_back({textIn(cells[0]), textIn(cells[1]), textIn(cells[2])});
-        };
+        const auto take = [&](const Cells& cells) { rows.views.push_back(viewIn(cells)); };
         connection.run("SAVEPOINT texts");
         try {
             connection.each("SELECT n.nspname, c.relname, pg_catalog.pg_get_viewdef(c.oid, true)" + from,
