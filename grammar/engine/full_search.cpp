@@ -78,8 +78,9 @@ bool FullSearch::findSets(std::uint32_t position, std::uint32_t end) {
                 byVertex_.push_back(set);
                 if (set == kEmpty || columnOf_[node] == kNone) continue;
                 const Behind column = behind(node);
-                (isSingle(set, p) ? column.onlyHere : column.elsewhere)[here / 64] |= std::uint64_t{1}
-                                                                                      << (here % 64);
+                const std::uint64_t bit = std::uint64_t{1} << (here % 64);
+                if (contains(set, p)) column.here[here / 64] |= bit;
+                if (!isSingle(set, p)) column.elsewhere[here / 64] |= bit;
             }
         }
         steps_ += 1 + (byVertex_.size() - vertexFrom_[here]) / 8;
@@ -169,7 +170,7 @@ FullSearch::SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p) {
         if (bits == 0) continue;
         if ((call.flags & kNonEmpty) && word == (p - from_) / 64)
             bits &= ~(std::uint64_t{1} << ((p - from_) % 64));
-        joinWord(word, bits & column.onlyHere[word]);
+        joinWord(word, bits & column.here[word]);
         for (std::uint64_t left = bits & column.elsewhere[word]; left != 0; left &= left - 1) {
             const SetId further =
                 setAt(call.run, from_ + word * 64 + static_cast<std::uint32_t>(std::countr_zero(left)));
@@ -383,9 +384,11 @@ FullSearch::SetId FullSearch::wantedBy(const Walk& walk, const NodeRow& call) {
         std::uint64_t bits = words_[set.offset + i];
         if ((call.flags & kNonEmpty) && word == (walk.position - from_) / 64)
             bits &= ~(std::uint64_t{1} << ((walk.position - from_) % 64));
-        if (word >= wanted.firstWord && word < wanted.firstWord + wanted.count)
-            joinWord(word, bits & column.onlyHere[word] & words_[wanted.offset + word - wanted.firstWord]);
-        for (std::uint64_t left = bits & column.elsewhere[word]; left != 0; left &= left - 1) {
+        const bool among = word >= wanted.firstWord && word < wanted.firstWord + wanted.count;
+        const std::uint64_t here =
+            among ? bits & column.here[word] & words_[wanted.offset + word - wanted.firstWord] : 0;
+        joinWord(word, here);
+        for (std::uint64_t left = bits & column.elsewhere[word] & ~here; left != 0; left &= left - 1) {
             const std::uint64_t bit = left & (~left + 1);
             const auto position = from_ + word * 64 + static_cast<std::uint32_t>(std::countr_zero(left));
             if (meet(setAt(call.run, position), walk.wanted)) joinWord(word, bit);

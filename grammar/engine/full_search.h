@@ -69,10 +69,10 @@ class FullSearch {
     bool meet(SetId one, SetId other) const;
     std::uint32_t last(SetId set) const;
 
-    /// For a node that stands behind a Call: where its rule can end at once and nowhere else, and where it
-    /// can go on to other places. Most rules mostly end behind a call, so ends pass on by the word.
+    /// For a node that stands behind a Call, as bits by position: where its rule can end at once, and where
+    /// it can go on to other places. Most rules mostly end behind a call, so ends pass on by the word.
     struct Behind {
-        std::uint64_t* onlyHere;
+        std::uint64_t* here;
         std::uint64_t* elsewhere;
     };
     Behind behind(std::uint16_t node);

@@ -41,33 +41,6 @@ bool QuickSearch::follow() {
     for (;;) {
         const NodeRow& node = table_.nodes[at_];
         switch (node.op) {
-            case Op::Token:
-                if (!text_.settle(low_, high_) || low_ >= text_.count() || text_.type(low_) != node.arg)
-                    return false;
-                high_ = ++low_;
-                stopped_ = 0;
-                break;
-            case Op::Set:
-                if (!text_.settle(low_, high_) || low_ >= text_.count() ||
-                    !text_.inSet(node.arg, text_.classAt(low_)))
-                    return false;
-                high_ = ++low_;
-                stopped_ = 0;
-                break;
-            case Op::Hard: {
-                const std::uint32_t run = text_.runEnd(low_);
-                if (low_ == run) return false;
-                ++low_;
-                high_ = std::min(high_ + 1, run);
-                stopped_ = 0;
-                break;
-            }
-            case Op::Soft:
-                high_ = std::min(high_ + 1, text_.runEnd(low_));
-                break;
-            case Op::SoftStar:
-                high_ = text_.runEnd(low_);
-                break;
             case Op::Choice: {
                 std::uint32_t mask = text_.viable(node, low_, high_);
                 if ((node.flags & kLoop) && ((stopped_ >> node.context) & 1)) mask &= ~1u;
@@ -90,9 +63,8 @@ bool QuickSearch::follow() {
                 if (call_ == kNone) return high_ == text_.count();
                 if (!comeBack()) return false;
                 continue;
-            case Op::Root:
-            case Op::ScopeBegin:
-            case Op::ScopeEnd:
+            default:
+                if (!text_.take(node, low_, high_, stopped_)) return false;
                 break;
         }
         at_ = node.run;

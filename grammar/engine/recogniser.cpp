@@ -273,33 +273,6 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
         const NodeRow& node = table_->nodes[at];
         if ((node.flags & kMerge) && !enterOnce(entryIndex, at, low, high, stopped)) return false;
         switch (node.op) {
-            case Op::Token:
-                if (!text_.settle(low, high) || low >= text_.count() || text_.type(low) != node.arg)
-                    return false;
-                high = ++low;
-                stopped = 0;
-                break;
-            case Op::Set:
-                if (!text_.settle(low, high) || low >= text_.count() ||
-                    !text_.inSet(node.arg, text_.classAt(low)))
-                    return false;
-                high = ++low;
-                stopped = 0;
-                break;
-            case Op::Hard: {
-                const std::uint32_t run = text_.runEnd(low);
-                if (low == run) return false;
-                ++low;
-                high = std::min(high + 1, run);
-                stopped = 0;
-                break;
-            }
-            case Op::Soft:
-                high = std::min(high + 1, text_.runEnd(low));
-                break;
-            case Op::SoftStar:
-                high = text_.runEnd(low);
-                break;
             case Op::Choice: {
                 const ChoiceRow& choice = table_->choices[node.arg];
                 std::uint32_t mask = text_.viable(node, low, high);
@@ -347,9 +320,8 @@ bool Recogniser::forward(std::uint32_t entryIndex, std::uint16_t at, std::uint32
             }
             case Op::End:
                 return addEnd(entryIndex, low, high, state, stopped);
-            case Op::Root:
-            case Op::ScopeBegin:
-            case Op::ScopeEnd:
+            default:
+                if (!text_.take(node, low, high, stopped)) return false;
                 break;
         }
         at = node.run;

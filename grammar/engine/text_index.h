@@ -64,6 +64,38 @@ class TextIndex {
         low = high;
         return true;
     }
+    /// Moves a place past what a node takes that is neither a Choice, a Call nor an End, and whatever stopped
+    /// there with it; says whether the node could take it.
+    bool take(const NodeRow& node, std::uint32_t& low, std::uint32_t& high, std::uint8_t& stopped) const {
+        switch (node.op) {
+            case Op::Token:
+            case Op::Set:
+                if (!settle(low, high) || low >= count_) return false;
+                if (node.op == Op::Token ? type(low) != node.arg : !inSet(node.arg, classes_[low]))
+                    return false;
+                high = ++low;
+                stopped = 0;
+                return true;
+            case Op::Hard: {
+                const std::uint32_t run = runEnd(low);
+                if (low == run) return false;
+                ++low;
+                high = high + 1 < run ? high + 1 : run;
+                stopped = 0;
+                return true;
+            }
+            case Op::Soft: {
+                const std::uint32_t run = runEnd(low);
+                high = high + 1 < run ? high + 1 : run;
+                return true;
+            }
+            case Op::SoftStar:
+                high = runEnd(low);
+                return true;
+            default:
+                return true;  // only shapes the tree
+        }
+    }
     /// The branches of a Choice that can go on at a place, as bits.
     std::uint32_t viable(const NodeRow& choice, std::uint32_t low, std::uint32_t high) const {
         const std::uint32_t* masks =

@@ -272,6 +272,54 @@ TEST(MemoLimit, OfTheDefaultIsFarFromWhatATextNeeds) {
     EXPECT_LT(recogniser.remembered(), types.size() * 100);
 }
 
+// ---- steps
+
+/// Search steps for each token of a text.
+double stepsPerToken(const std::u16string& text, bool wholly) {
+    const std::vector<std::uint16_t> types = typesOf(text);
+    const engine::ParserTable& table = *mssqlTables().parser;
+    engine::Recogniser recogniser(table, types, engine::Options{});
+    const engine::Recogniser::Result result = recogniser.run(table.statementRule, 0);
+    EXPECT_TRUE(result.found);
+    EXPECT_FALSE(result.overBudget);
+    EXPECT_EQ(result.high == types.size(), wholly);
+    return static_cast<double>(recogniser.steps()) / static_cast<double>(types.size());
+}
+
+TEST(Steps, OfPlainTextAreFew) {
+    EXPECT_LT(stepsPerToken(u"SELECT a, t.b FROM t WHERE x = 1 AND y > 2 ORDER BY a", true), 6);
+    EXPECT_LT(stepsPerToken(u"SELECT a FROM t WHERE x = 1" + repeated(u" AND t.b = 2", 10000), true), 6);
+    EXPECT_LT(stepsPerToken(u"SELECT a FROM t INNER JOIN u ON t.a = u.a UNION SELECT b FROM v", true), 6);
+}
+
+/// They would grow with the depth, or with its square, if each level looked for its ends by itself.
+TEST(Steps, OfTextsWithManyReadingsHardlyGrowWithTheDepth) {
+    const auto text = [](std::size_t depth, std::u16string_view tail, int shape) {
+        switch (shape) {
+            case 0:
+                return u"SELECT " + nested(u"dbo.f(", u"a", u")", depth) + u", b y FROM t" +
+                       std::u16string(tail);
+            case 1:
+                return u"SELECT a FROM t JOIN " +
+                       nested(u"(SELECT a FROM t JOIN ", u"(SELECT a FROM t) x ON a = b", u") x ON a = b",
+                              depth) +
+                       std::u16string(tail);
+            default:
+                return u"SELECT a FROM " + nested(u"(SELECT a FROM ", u"t", u") x", depth) +
+                       std::u16string(tail);
+        }
+    };
+    for (const int shape : {0, 1, 2})
+        for (const std::u16string_view tail : {u"", u" OVER ( PARTITION BY x ) , y FROM z"}) {
+            SCOPED_TRACE(shape);
+            const double few = stepsPerToken(text(30, tail, shape), tail.empty());
+            const double many = stepsPerToken(text(240, tail, shape), tail.empty());
+            EXPECT_LT(few, 80);
+            EXPECT_LT(many, 80);
+            EXPECT_LT(many, 2 * few + 10);
+        }
+}
+
 // ---- budget
 
 /// Budgets of so many steps for either search, whatever the text's length.
