@@ -1,10 +1,13 @@
 #pragma once
 
+#include <array>
 #include <cstdint>
 #include <vector>
 
 #include "grammar/engine/derivation.h"
+#include "grammar/engine/ends_behind.h"
 #include "grammar/engine/options.h"
+#include "grammar/engine/position_sets.h"
 #include "grammar/engine/reach.h"
 #include "grammar/engine/tables.h"
 #include "grammar/engine/text_index.h"
@@ -36,55 +39,37 @@ class FullSearch {
     /// The derivation that was found, and where it ends.
     Derivation& derivation() { return derivation_; }
     std::uint32_t reached() const { return reached_; }
-    std::uint64_t steps() const { return steps_; }
+    std::uint64_t steps() const { return steps_ + sets_.wordsJoined() / kWordsAStep; }
     /// What the search has to remember, as Options::maxMemo counts it.
     std::size_t remembered() const;
 
  private:
-    /// Positions as bits, words counted from the first one of the search. A set is never changed, so nodes
-    /// share it.
-    struct Set {
-        std::uint32_t firstWord, count;
-        std::size_t offset;  ///< in words_
-    };
-    using SetId = std::uint32_t;
-    static constexpr SetId kEmpty = 0;
+    static constexpr SetId kEmpty = PositionSets::kEmpty;
+    static constexpr std::uint64_t kWordsAStep = 8;
 
     bool findSets(std::uint32_t position, std::uint32_t end);
     SetId setFor(std::uint16_t node, std::uint32_t position);
     bool isSkipped(const NodeRow& call, std::uint32_t position) const;
     SetId setBehind(const NodeRow& call, std::uint32_t position);
+    std::uint64_t counted(const NodeRow& call, std::uint32_t position, std::uint32_t word,
+                          std::uint64_t bits) const;
     SetId setAt(std::uint16_t node, std::uint32_t position) const;
     SetId endsOf(std::uint16_t rule, std::uint32_t position) const {
         return setAt(searchedFrom(table_, table_.rules[rule].entry), position);
     }
-    void join(SetId set);
-    void widenTo(std::uint32_t from, std::uint32_t to);
-    void joinWord(std::uint32_t word, std::uint64_t bits);
-    SetId joined(SetId like);
-    SetId single(std::uint32_t position);
-    bool isSingle(SetId set, std::uint32_t position) const;
-    bool contains(SetId set, std::uint32_t position) const;
-    bool containsAll(SetId whole, SetId part) const;
-    bool meet(SetId one, SetId other) const;
-    std::uint32_t last(SetId set) const;
-
-    /// For a node that stands behind a Call, as bits by position: where its rule can end at once, and where
-    /// it can go on to other places. Most rules mostly end behind a call, so ends pass on by the word.
-    struct Behind {
-        std::uint64_t* here;
-        std::uint64_t* elsewhere;
+    /// The ends that a walk may come to: mostly very few, and far from each other.
+    struct Wanted {
+        static constexpr std::uint32_t kFew = 4;
+        std::array<std::uint32_t, kFew> few{};
+        std::uint32_t count = 0;  ///< in `few`; kFew + 1 where they are in `many`
+        SetId many = kEmpty;
     };
-    Behind behind(std::uint16_t node);
-    /// The last ends of a call in front of such a node, and what was found behind them.
-    struct Known {
-        SetId ends = kEmpty, behind = kEmpty;
-    };
+    bool leadsTo(SetId set, const Wanted& wanted) const;
 
     /// A rule whose path is being written down.
     struct Walk {
         std::uint32_t part;
-        SetId wanted;
+        Wanted wanted;
         std::uint16_t node;
         std::uint32_t position;
         std::uint32_t state;
@@ -92,9 +77,9 @@ class FullSearch {
 
     Outcome writeDown(std::uint16_t rule, std::uint32_t position);
     void comeBack(Walk& walk, std::uint32_t part, std::uint32_t end, std::uint32_t state);
-    void startWalk(std::uint16_t rule, std::uint32_t position, SetId wanted);
+    void startWalk(std::uint16_t rule, std::uint32_t position, const Wanted& wanted);
     bool walkOn(Walk& walk);
-    SetId wantedBy(const Walk& walk, const NodeRow& call);
+    Wanted wantedBy(const Walk& walk, const NodeRow& call);
     std::uint32_t addState(std::uint16_t node, std::uint32_t position, std::uint32_t before,
                            std::uint32_t part, std::uint32_t end);
 
@@ -104,18 +89,19 @@ class FullSearch {
     const Reach::Recovery recovery_;
     Reach reach_;
 
-    std::uint32_t from_ = 0, end_ = 0;
-    std::size_t setWords_ = 0;  ///< words of a set that holds all positions
-    std::vector<Set> sets_;
-    std::vector<std::uint64_t> words_;
+    std::uint32_t from_ = 0;
+    PositionSets sets_;
     std::vector<SetId> byVertex_;             ///< of the nodes that were kept, position by position
     std::vector<std::uint32_t> vertexFrom_;   ///< by position
     std::vector<std::uint8_t> vertexBefore_;  ///< by position and word of its row: nodes in the words before
-    std::vector<std::uint32_t> columnOf_;     ///< by node: its place among those that stand behind a Call
-    std::vector<std::uint64_t> columns_;
-    std::vector<Known> knownBehind_;             ///< by column
-    std::vector<std::uint64_t> joint_;           ///< the set being made
-    std::uint32_t jointFrom_ = 0, jointTo_ = 0;  ///< words of it that are in use
+    /// A node behind a Call, and the last ends of a call in front of it with all that is behind them.
+    struct Behind {
+        EndsBehind ends;
+        SetId knownEnds = kEmpty, knownBehind = kEmpty;
+    };
+    std::vector<std::uint32_t> behindOf_;  ///< by node: its place in behind_, or kNone
+    std::vector<Behind> behind_;
+    std::size_t behindBytes_ = 0;
 
     std::vector<Walk> walks_;
     Derivation derivation_;
