@@ -128,50 +128,7 @@ void secondTokens(Program& p, const Facts& facts) {
 void runLinks(Program& p) {
     for (Node& n : p.nodes) {
         if (n.next >= 0) n.run = p.skip(n.next);
-    }
-}
-
-/// Marks the nodes that more than one way can reach at one position.
-void mergePoints(Program& p) {
-    constexpr int kUnset = -2, kVariable = -1;
-    std::vector<int> inDegree(p.nodes.size(), 0), offset(p.nodes.size(), kUnset);
-    std::vector<int> work;
-    const auto successors = [&](const Node& n) {
-        std::vector<int> result;
-        if (n.op == Op::Choice)
-            for (int t : n.targets) result.push_back(p.skip(t));
-        else if (n.next >= 0)
-            result.push_back(p.skip(n.next));
-        return result;
-    };
-    for (int e : p.entry) {
-        const int first = p.skip(e);
-        ++inDegree[index(first)];
-        offset[index(first)] = 0;
-        work.push_back(first);
-    }
-    std::vector<bool> counted(p.nodes.size(), false);
-    while (!work.empty()) {
-        const int at = work.back();
-        work.pop_back();
-        const Node& n = p.nodes[index(at)];
-        const int step = n.op == Op::Token || n.op == Op::Set ? 1 : 0;
-        const bool variable = n.op == Op::Call || n.op == Op::Soft || n.op == Op::SoftStar;
-        for (int next : successors(n)) {
-            if (!counted[index(at)]) ++inDegree[index(next)];
-            int value = variable || offset[index(at)] == kVariable ? kVariable : offset[index(at)] + step;
-            int& known = offset[index(next)];
-            if (known != kUnset && known != value) value = kVariable;
-            if (known != value) {
-                known = value;
-                work.push_back(next);
-            }
-        }
-        counted[index(at)] = true;
-    }
-    for (std::size_t i = 0; i < p.nodes.size(); ++i) {
-        if (inDegree[i] > 1) p.nodes[i].merge = true;
-        if (p.nodes[i].op == Op::Call && offset[i] == kVariable) p.nodes[index(p.nodes[i].run)].merge = true;
+        if (n.op == Op::Call) p.nodes[index(n.run)].behindCall = true;
     }
 }
 
@@ -530,7 +487,6 @@ void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts,
     firstSets(program, facts);
     secondTokens(program, facts);
     runLinks(program);
-    mergePoints(program);
     guardCalls(program, facts);
     findTailLoops(program, grammar, facts);
     checkIsland(grammar, facts);

@@ -293,7 +293,7 @@ class Emitter {
                 }
             }
             o << "    {Op::" << op << ", Mark::" << marks[static_cast<int>(n.mark)] << ", "
-              << (n.merge ? 1 : 0) + (n.nonEmpty ? 2 : 0) + (n.isTailLoop ? 4 : 0) << ", " << arg << ", "
+              << (n.behindCall ? 1 : 0) + (n.nonEmpty ? 2 : 0) + (n.isTailLoop ? 4 : 0) << ", " << arg << ", "
               << (n.next < 0 ? 0xFFFF : n.next) << ", " << (n.run < 0 ? 0xFFFF : n.run) << ", "
               << (n.tailLoop >= 0 ? classSet(n.roundFirst)
                   : n.guard < 0   ? 0xFFFF

@@ -33,8 +33,8 @@ struct Node {
     int next = -1;
     std::vector<int> targets;  ///< Choice
     // filled by analyse()
-    int run = -1;        ///< next node that the recogniser stops at (Root and Scope nodes passed over)
-    bool merge = false;  ///< more than one way leads here: a state is entered once
+    int run = -1;             ///< next node that the recogniser stops at (Root and Scope nodes passed over)
+    bool behindCall = false;  ///< a call goes on here
     bool canEnd = false;
     std::set<int> first;
     int guard = -1;            ///< Call: index into guards, or -1

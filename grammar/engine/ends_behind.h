@@ -1,70 +1,102 @@
 #pragma once
 
 #include <array>
-#include <bit>
 #include <cstddef>
 #include <cstdint>
 #include <vector>
 
 #include "grammar/engine/position_sets.h"
 
-/// For one node that stands behind a Call: where its rule can come to from each position. Most rules mostly
-/// end behind a call, and a rule that ends at many places is asked about all of them at once, so this answers
-/// for 64 positions at a time.
+/// For nodes that stand behind a Call: from where their rules can come to which ends. Most rules mostly end
+/// behind a call, and a rule that ends at many places is asked about all of them at once, so this answers for
+/// 64 positions at a time.
 namespace zr::engine {
 
 class EndsBehind {
  public:
-    /// Forgets everything; the positions have so many words.
-    void start(std::uint32_t words);
-    /// Notes the ends from a position, which lies ahead of all that were noted before it.
-    void note(const PositionSets& sets, std::uint32_t position, SetId ends);
+    /// 64 positions.
+    struct Word {
+        std::uint64_t here = 0;       ///< where the rule can end at once
+        std::uint64_t elsewhere = 0;  ///< from where it can come to other places
+    };
+    /// The last ends of a call in front of a node, and all that is behind them.
+    struct Known {
+        SetId ends = PositionSets::kEmpty, behind = PositionSets::kEmpty;
+    };
 
-    /// The positions of a word where the rule can end at once.
-    std::uint64_t here(std::uint32_t word) const { return words_[word].here; }
-    /// Those from which it can go on to other places.
-    std::uint64_t elsewhere(std::uint32_t word) const { return words_[word].elsewhere; }
+    /// Forgets everything; nodes have numbers below `nodes`, and the sets are those of `sets`.
+    void start(const PositionSets& sets, std::size_t nodes);
+    void note(std::uint16_t node, std::uint32_t position, SetId ends);
 
-    /// Visits those of a word that are `among`, the last one first, each as a bit with the set of its ends.
-    template <typename Visit>
-    void forEach(std::uint32_t word, std::uint64_t among, Visit visit) const {
-        std::size_t next = words_[word].first;
-        for (std::uint64_t left = elsewhere(word); (left & among) != 0; ++next) {
-            const std::uint64_t bit = std::bit_floor(left);
-            left ^= bit;
-            if (among & bit) visit(bit, ends_[next]);
-        }
+    /// By word of the positions; null for a node that was never noted. Good until the next note().
+    const Word* words(std::uint16_t node) const {
+        const std::uint32_t place = placeOf_[node];
+        return place == kNone ? nullptr : words_.data() + place * std::size_t{sets_->wordCount()};
+    }
+    /// Of a node that was noted.
+    Known& known(std::uint16_t node) { return known_[placeOf_[node]]; }
+    std::size_t bytes() const { return words_.size() * sizeof(Word); }
+    std::size_t capacity() const {
+        return words_.capacity() * sizeof(Word) + known_.capacity() * sizeof(Known) +
+               placeOf_.capacity() * sizeof(std::uint32_t);
     }
 
-    /// The same the other way round, for 64 ends: from which positions of a range each can be reached.
-    class Inverse {
-     public:
-        /// The positions of a word of the range from which the rule comes to an end.
-        std::uint64_t startsFor(std::uint32_t word, std::uint32_t bitOfEnd) const {
-            return rows_[(word - starts_.from) * std::size_t{64} + bitOfEnd];
+ private:
+    static constexpr std::uint32_t kNone = 0xFFFFFFFF;
+
+    const PositionSets* sets_ = nullptr;
+    std::vector<std::uint32_t> placeOf_;  ///< by node
+    std::vector<Word> words_;
+    std::vector<Known> known_;
+};
+
+/// The same the other way round: from where a node comes to an end, for the ends that were asked for last.
+class StartsBefore {
+ public:
+    void start();
+
+    /// By word of `range`, and in there by end: the positions from which `node` comes to an end in the word
+    /// `ends`. `endsAt` gives the set of ends from a position. Good until the next call.
+    template <typename EndsAt>
+    const std::uint64_t* rows(const PositionSets& sets, std::uint16_t node, const EndsBehind::Word* behind,
+                              PositionSets::Range range, std::uint32_t ends, EndsAt endsAt) {
+        Block& block = blockFor(node, ends);
+        if (block.node != node || block.ends != ends || block.range.from > range.from ||
+            block.range.to < range.to) {
+            block.node = kNoNode;
+            block.rows.assign((range.to - range.from) * kBits, 0);
+            for (std::uint32_t word = range.from; word < range.to; ++word) {
+                std::uint64_t* rows = block.rows.data() + (word - range.from) * kBits;
+                for (std::uint64_t left = behind[word].elsewhere; left != 0; left &= left - 1) {
+                    const std::uint32_t position = sets.positionOf(word, left);
+                    rows[(position - sets.from()) % kBits] = sets.word(endsAt(position), ends);
+                }
+                transpose(rows);
+            }
+            block.node = node;
+            block.ends = ends;
+            block.range = range;
         }
+        return block.rows.data() + (range.from - block.range.from) * kBits;
+    }
 
-     private:
-        friend class EndsBehind;
-        std::uint32_t ends_ = kNoWord;
-        PositionSets::Range starts_{0, 0};
-        std::vector<std::uint64_t> rows_;  ///< by word of the range and end
-    };
-    /// Made when it is first asked for, and kept for the next ends nearby. Good until the next call.
-    const Inverse& inverse(const PositionSets& sets, PositionSets::Range starts, std::uint32_t wordOfEnds);
-
-    std::size_t bytes() const { return words_.size() * sizeof(Word) + ends_.size() * sizeof(SetId); }
+    std::size_t capacity() const;
 
  private:
-    static constexpr std::uint32_t kNoWord = 0xFFFFFFFF;
+    static constexpr std::size_t kBits = 64;
+    static constexpr std::uint16_t kNoNode = 0xFFFF;
 
-    struct Word {
-        std::uint64_t here = 0, elsewhere = 0;
-        std::size_t first = 0;  ///< in ends_, of its last position; those before follow
+    struct Block {
+        std::uint16_t node = kNoNode;
+        std::uint32_t ends = 0;
+        PositionSets::Range range{0, 0};
+        std::vector<std::uint64_t> rows;
     };
-    std::vector<Word> words_;
-    std::vector<SetId> ends_;
-    std::array<Inverse, 4> inverses_;
+
+    Block& blockFor(std::uint16_t node, std::uint32_t ends);
+    static void transpose(std::uint64_t* rows);
+
+    std::array<Block, 4> blocks_;
     std::size_t oldest_ = 0;
 };
 

@@ -6,29 +6,47 @@
 namespace zr::engine {
 namespace {
 
-/// What Options::maxMemo reckons with for each thing that a search remembers.
-constexpr std::size_t kMemoBytes = 32;
-
 /// So many of 64 positions are many.
 constexpr std::uint32_t kManyEnds = 8;
 
 }  // namespace
 
-std::size_t FullSearch::remembered() const {
-    return (sets_.bytes() + behindBytes_ + byVertex_.size() * sizeof(SetId)) / kMemoBytes;
+std::size_t FullSearch::bytes() const {
+    return reach_.bytes() + sets_.bytes() + behind_.bytes() + byVertex_.size() * sizeof(SetId);
 }
 
-FullSearch::Outcome FullSearch::run(std::uint16_t rule, std::uint32_t position, std::uint32_t bound) {
+std::size_t FullSearch::capacity() const {
+    return reach_.capacity() + sets_.capacity() + behind_.capacity() + starts_.capacity() +
+           byVertex_.capacity() * sizeof(SetId) + vertexFrom_.capacity() * sizeof(std::uint32_t) +
+           vertexBefore_.capacity() + walks_.capacity() * sizeof(Walk);
+}
+
+void FullSearch::start(const ParserTable& table, TextIndex& text, const Options& options,
+                       const Reach::Recovery& recovery, Derivation* derivation) {
+    table_ = &table;
+    text_ = &text;
+    options_ = &options;
+    recovery_ = recovery;
+    made_ = derivation;
+    steps_ = 0;
+    joinedBefore_ = sets_.wordsJoined();
+    reach_.start(table, text, recovery);
+}
+
+FullSearch::Outcome FullSearch::run(const ParserTable& table, TextIndex& text, const Options& options,
+                                    const Reach::Recovery& recovery, std::uint16_t rule,
+                                    std::uint32_t position, Derivation& derivation) {
     constexpr std::size_t kFirstLook = 4;
-    if (Reach::bytesFor(table_, text_.count() - position) > kMemoBytes * options_.maxMemo)
+    if (Reach::bytesFor(table, text.count() - position) > kMemoBytes * options.maxMemo)
         return Outcome::OverBudget;
+    start(table, text, options, recovery, &derivation);
     reach_.follow(rule, position);
-    const std::vector<std::uint32_t> ends = reach_.ends();
-    auto count = static_cast<std::size_t>(std::upper_bound(ends.begin(), ends.end(), bound) - ends.begin());
+    const std::vector<std::uint32_t>& ends = reach_.ends();
     // Reach mostly says where the reading ends, or a little too much: the last ends it names come first.
+    std::size_t count = ends.size();
     for (std::size_t look = std::min(kFirstLook, count); count != 0; count -= look, look = count) {
         const std::uint32_t last = ends[count - 1];
-        if (last < text_.count()) text_.cutAt(last);
+        if (last < text.count()) text.cutAt(last);
         reach_.keep(ends[count - look], last);
         if (!findSets(position, last)) return Outcome::OverBudget;
         const SetId found = endsOf(rule, position);
@@ -40,11 +58,27 @@ FullSearch::Outcome FullSearch::run(std::uint16_t rule, std::uint32_t position, 
     return Outcome::NotFound;
 }
 
+std::vector<std::uint32_t> FullSearch::allEnds(const ParserTable& table, TextIndex& text,
+                                               const Options& options, std::uint16_t rule,
+                                               std::uint32_t position) {
+    std::vector<std::uint32_t> found;
+    start(table, text, options, {}, nullptr);
+    if (Reach::bytesFor(table, text.count() - position) > kMemoBytes * options.maxMemo) return found;
+    reach_.follow(rule, position);
+    if (reach_.ends().empty()) return found;
+    reach_.keep(reach_.ends().front(), reach_.ends().back());
+    if (!findSets(position, reach_.ends().back())) return found;
+    const SetId ends = endsOf(rule, position);
+    for (const std::uint32_t end : reach_.ends())
+        if (sets_.contains(ends, end)) found.push_back(end);
+    return found;
+}
+
 // ---- sets of ends
 
 bool FullSearch::findSets(std::uint32_t position, std::uint32_t end) {
     const std::uint64_t budget =
-        steps() + options_.fullBaseSteps + options_.fullStepsPerToken * (end - position + 1);
+        steps() + options_->baseSteps + options_->stepsPerToken * (end - position + 1);
     const std::size_t rowWords = reach_.words();
     from_ = position;
     sets_.start(position, end);
@@ -52,18 +86,8 @@ bool FullSearch::findSets(std::uint32_t position, std::uint32_t end) {
     byVertex_.reserve(reach_.keptCount());
     vertexFrom_.assign(end - position + 1, 0);
     vertexBefore_.assign((end - position + 1) * rowWords, 0);
-    behindOf_.assign(table_.stops, kNone);
-    std::uint32_t nodes = 0;
-    for (std::uint32_t i = 0; i < table_.callsFrom[table_.ruleCount]; ++i)
-        if (std::uint32_t& place = behindOf_[table_.nodes[table_.calls[i]].run]; place == kNone)
-            place = nodes++;
-    behind_.resize(nodes);
-    behindBytes_ = 0;
-    for (Behind& behind : behind_) {
-        behind.ends.start(sets_.wordCount());
-        behind.knownEnds = behind.knownBehind = kEmpty;
-        behindBytes_ += behind.ends.bytes();
-    }
+    behind_.start(sets_, table_->stops);
+    starts_.start();
     for (std::uint32_t p = end + 1; p-- > position;) {
         const std::uint64_t* row = reach_.keptAt(p);
         const std::uint32_t here = p - position;
@@ -77,13 +101,11 @@ bool FullSearch::findSets(std::uint32_t position, std::uint32_t end) {
                     static_cast<std::uint16_t>(w * 64 + static_cast<unsigned>(std::countr_zero(left)));
                 const SetId set = setFor(node, p);
                 byVertex_.push_back(set);
-                if (set == kEmpty || behindOf_[node] == kNone) continue;
-                behind_[behindOf_[node]].ends.note(sets_, p, set);
-                behindBytes_ += sizeof(SetId);
+                if (set != kEmpty && (table_->nodes[node].flags & kBehindCall)) behind_.note(node, p, set);
             }
         }
         steps_ += 1 + (byVertex_.size() - vertexFrom_[here]) / 8;
-        if (steps() > budget || remembered() > options_.maxMemo) return false;
+        if (steps() > budget || remembered() > options_->maxMemo) return false;
     }
     return true;
 }
@@ -100,7 +122,7 @@ SetId FullSearch::setAt(std::uint16_t node, std::uint32_t position) const {
 /// The ends that the rule of a node can come to from a position, when those of all nodes further on, and of
 /// those at the same position that come without a token, are known.
 SetId FullSearch::setFor(std::uint16_t at, std::uint32_t p) {
-    const NodeRow& node = table_.nodes[at];
+    const NodeRow& node = table_->nodes[at];
     switch (node.op) {
         case Op::Token:
         case Op::Set:
@@ -109,7 +131,7 @@ SetId FullSearch::setFor(std::uint16_t at, std::uint32_t p) {
         case Op::Soft:
         case Op::SoftStar: {
             const SetId skipped = setAt(node.run, p);
-            if (!text_.isCloser(p)) return skipped;
+            if (!text_->isCloser(p)) return skipped;
             sets_.join(skipped);
             const SetId taken = setAt(node.op == Op::Soft ? node.run : at, p + 1);
             sets_.join(taken);
@@ -120,7 +142,7 @@ SetId FullSearch::setFor(std::uint16_t at, std::uint32_t p) {
             bool several = false;
             for (std::uint32_t mask = reach_.branches(node, p); mask != 0; mask &= mask - 1) {
                 const SetId set =
-                    setAt(branchTarget(table_, node, static_cast<std::uint32_t>(std::countr_zero(mask))), p);
+                    setAt(branchTarget(*table_, node, static_cast<std::uint32_t>(std::countr_zero(mask))), p);
                 if (set == kEmpty || set == first) continue;
                 if (first != kEmpty && !several) {
                     sets_.join(first);
@@ -148,28 +170,28 @@ bool FullSearch::isSkipped(const NodeRow& call, std::uint32_t p) const {
 SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p) {
     const SetId ends = endsOf(call.arg, p);
     if (ends == kEmpty) return kEmpty;
-    Behind& behind = behind_[behindOf_[call.run]];
+    const EndsBehind::Word* behind = behind_.words(call.run);
+    if (behind == nullptr) return kEmpty;
     // Rules inside each other mostly share the ends further on: only what is new is looked at.
-    const SetId seen = sets_.containsAll(ends, behind.knownEnds) ? behind.knownEnds : kEmpty;
-    if (seen != kEmpty) sets_.join(behind.knownBehind);
+    EndsBehind::Known& known = behind_.known(call.run);
+    const SetId seen = sets_.containsAll(ends, known.ends) ? known.ends : kEmpty;
+    if (seen != kEmpty) sets_.join(known.behind);
     SetId before = kEmpty;
     const PositionSets::Range range = sets_.range(ends);
     for (std::uint32_t word = range.from; word < range.to; ++word) {
         const std::uint64_t bits = counted(call, p, word, sets_.word(ends, word) & ~sets_.word(seen, word));
         if (bits == 0) continue;
-        sets_.joinWord(word, bits & behind.ends.here(word));
-        behind.ends.forEach(word, bits, [&](std::uint64_t, SetId further) {
+        sets_.joinWord(word, bits & behind[word].here);
+        for (std::uint64_t left = bits & behind[word].elsewhere; left != 0; left &= left - 1) {
+            const SetId further = setAt(call.run, sets_.positionOf(word, left));
             if (further != before) sets_.join(further);
             before = further;
-        });
+        }
     }
     steps_ += (range.to - range.from) / kWordsAStep;
     const SetId made = sets_.joined(ends);
     // An end that takes no token counts for some calls and not for others.
-    if (!sets_.contains(ends, p)) {
-        behind.knownEnds = ends;
-        behind.knownBehind = made;
-    }
+    if (!sets_.contains(ends, p)) known = {ends, made};
     return made;
 }
 
@@ -182,18 +204,22 @@ std::uint64_t FullSearch::counted(const NodeRow& call, std::uint32_t p, std::uin
 // ---- the walk down
 
 FullSearch::Outcome FullSearch::writeDown(std::uint16_t rule, std::uint32_t position) {
+    made_->parts.clear();
+    made_->ends.clear();
+    made_->states.clear();
+    walks_.clear();
     Wanted whole;
     whole.few[whole.count++] = reached_;
     startWalk(rule, position, whole);
     while (!walks_.empty()) {
         if (!walkOn(walks_.back())) {
-            if (walks_.size() >= options_.maxDepth) return Outcome::TooDeep;
+            if (walks_.size() >= options_->maxDepth) return Outcome::TooDeep;
             continue;
         }
         const Walk ended = walks_.back();
         walks_.pop_back();
         if (walks_.empty()) {
-            derivation_.endState = ended.state;
+            made_->endState = ended.state;
             break;
         }
         comeBack(walks_.back(), ended.part, ended.position, ended.state);
@@ -202,18 +228,18 @@ FullSearch::Outcome FullSearch::writeDown(std::uint16_t rule, std::uint32_t posi
 }
 
 void FullSearch::startWalk(std::uint16_t rule, std::uint32_t position, const Wanted& wanted) {
-    const auto part = static_cast<std::uint32_t>(derivation_.parts.size());
-    derivation_.parts.push_back({rule, position, false});
-    const std::uint16_t first = table_.rules[rule].entry;
+    const auto part = static_cast<std::uint32_t>(made_->parts.size());
+    made_->parts.push_back({rule, position, false});
+    const std::uint16_t first = table_->rules[rule].entry;
     const std::uint32_t state = addState(first, position, kNone, kNone, kNone);
-    walks_.push_back({part, wanted, searchedFrom(table_, first), position, state});
+    walks_.push_back({part, wanted, searchedFrom(*table_, first), position, state});
 }
 
 /// The call that a walk stands at has read as far as `end`.
 void FullSearch::comeBack(Walk& walk, std::uint32_t part, std::uint32_t end, std::uint32_t state) {
-    const NodeRow& call = table_.nodes[walk.node];
-    const auto made = static_cast<std::uint32_t>(derivation_.ends.size());
-    derivation_.ends.push_back({end, end, state, 0, kNone});
+    const NodeRow& call = table_->nodes[walk.node];
+    const auto made = static_cast<std::uint32_t>(made_->ends.size());
+    made_->ends.push_back({end, end, state, 0, kNone});
     walk.state = addState(call.next, end, walk.state, part, made);
     walk.node = call.run;
     walk.position = end;
@@ -221,37 +247,36 @@ void FullSearch::comeBack(Walk& walk, std::uint32_t part, std::uint32_t end, std
 
 std::uint32_t FullSearch::addState(std::uint16_t node, std::uint32_t position, std::uint32_t before,
                                    std::uint32_t part, std::uint32_t end) {
-    derivation_.states.push_back({position, position, before, part, end, node});
-    return static_cast<std::uint32_t>(derivation_.states.size()) - 1;
+    made_->states.push_back({position, position, before, part, end, node});
+    return static_cast<std::uint32_t>(made_->states.size()) - 1;
 }
 
 /// Goes on until the path ends, which gives true, or needs the path of a call first.
 bool FullSearch::walkOn(Walk& walk) {
     for (;;) {
-        const NodeRow& node = table_.nodes[walk.node];
+        const NodeRow& node = table_->nodes[walk.node];
         ++steps_;
         switch (node.op) {
             case Op::End:
                 return true;
             case Op::Choice: {
-                const ChoiceRow& choice = table_.choices[node.arg];
+                const ChoiceRow& choice = table_->choices[node.arg];
                 std::uint32_t mask = reach_.branches(node, walk.position);
                 std::uint16_t target = 0;
                 do {  // one of them leads on, or nobody had come here
-                    target =
-                        table_
-                            .targets[choice.firstTarget + static_cast<std::uint32_t>(std::countr_zero(mask))];
+                    target = table_->targets[choice.firstTarget +
+                                             static_cast<std::uint32_t>(std::countr_zero(mask))];
                     mask &= mask - 1;
                 } while (mask != 0 &&
-                         !leadsTo(setAt(searchedFrom(table_, target), walk.position), walk.wanted));
+                         !leadsTo(setAt(searchedFrom(*table_, target), walk.position), walk.wanted));
                 walk.state = addState(target, walk.position, walk.state, kNone, kNone);
-                walk.node = searchedFrom(table_, target);
+                walk.node = searchedFrom(*table_, target);
                 break;
             }
             case Op::Call: {
                 if (isSkipped(node, walk.position)) {
-                    const auto part = static_cast<std::uint32_t>(derivation_.parts.size());
-                    derivation_.parts.push_back({node.arg, walk.position, true});
+                    const auto part = static_cast<std::uint32_t>(made_->parts.size());
+                    made_->parts.push_back({node.arg, walk.position, true});
                     comeBack(walk, part, recovery_.to, kNone);
                     break;
                 }
@@ -262,7 +287,7 @@ bool FullSearch::walkOn(Walk& walk) {
             case Op::Soft:
             case Op::SoftStar: {
                 const std::uint16_t next = node.op == Op::Soft ? node.run : walk.node;
-                if (text_.isCloser(walk.position) && leadsTo(setAt(next, walk.position + 1), walk.wanted)) {
+                if (text_->isCloser(walk.position) && leadsTo(setAt(next, walk.position + 1), walk.wanted)) {
                     ++walk.position;
                     walk.node = next;
                 } else {
@@ -294,30 +319,33 @@ bool FullSearch::leadsTo(SetId set, const Wanted& wanted) const {
 FullSearch::Wanted FullSearch::wantedBy(const Walk& walk, const NodeRow& call) {
     const SetId ends = endsOf(call.arg, walk.position);
     const PositionSets::Range range = sets_.range(ends);
-    EndsBehind& behind = behind_[behindOf_[call.run]].ends;
+    const EndsBehind::Word* behind = behind_.words(call.run);
     const auto endsIn = [&](std::uint32_t word) {
         return counted(call, walk.position, word, sets_.word(ends, word));
     };
     // Of many ends mostly one or two lead on to what is wanted: it takes less to look from there.
     std::uint32_t others = 0;
     for (std::uint32_t word = range.from; word < range.to; ++word)
-        others += static_cast<std::uint32_t>(std::popcount(endsIn(word) & behind.elsewhere(word)));
+        others += static_cast<std::uint32_t>(std::popcount(endsIn(word) & behind[word].elsewhere));
     const bool isFew = walk.wanted.count <= Wanted::kFew;
     const bool backwards = isFew && others >= kManyEnds * (range.to - range.from);
     for (std::uint32_t i = 0; isFew && i < walk.wanted.count; ++i) {
         const std::uint32_t end = walk.wanted.few[i], wordOfEnd = sets_.wordOf(end);
-        sets_.joinWord(wordOfEnd, endsIn(wordOfEnd) & behind.here(wordOfEnd) & sets_.bitOf(end));
+        sets_.joinWord(wordOfEnd, endsIn(wordOfEnd) & behind[wordOfEnd].here & sets_.bitOf(end));
         if (!backwards) continue;
-        const EndsBehind::Inverse& inverse = behind.inverse(sets_, range, wordOfEnd);
-        for (std::uint32_t word = range.from; word < range.to; ++word)
-            sets_.joinWord(word, endsIn(word) & inverse.startsFor(word, (end - from_) % 64));
+        const std::uint64_t* rows =
+            starts_.rows(sets_, call.run, behind, range, wordOfEnd,
+                         [&](std::uint32_t position) { return setAt(call.run, position); });
+        rows += (end - from_) % 64;
+        for (std::uint32_t word = range.from; word < range.to; ++word, rows += 64)
+            sets_.joinWord(word, endsIn(word) & *rows);
     }
     for (std::uint32_t word = range.from; !backwards && word < range.to; ++word) {
         if (!isFew)
-            sets_.joinWord(word, endsIn(word) & behind.here(word) & sets_.word(walk.wanted.many, word));
-        behind.forEach(word, endsIn(word), [&](std::uint64_t bit, SetId further) {
-            if (leadsTo(further, walk.wanted)) sets_.joinWord(word, bit);
-        });
+            sets_.joinWord(word, endsIn(word) & behind[word].here & sets_.word(walk.wanted.many, word));
+        for (std::uint64_t left = endsIn(word) & behind[word].elsewhere; left != 0; left &= left - 1)
+            if (leadsTo(setAt(call.run, sets_.positionOf(word, left)), walk.wanted))
+                sets_.joinWord(word, left & (~left + 1));
     }
     steps_ += (range.to - range.from) / kWordsAStep;
     Wanted found;

@@ -27,25 +27,33 @@ class FullSearch {
 
     enum class Outcome { Found, NotFound, TooDeep, OverBudget };
 
-    /// The table and the index must outlive this object.
-    FullSearch(const ParserTable& table, TextIndex& text, const Options& options,
-               const Reach::Recovery& recovery)
-        : table_(table), text_(text), options_(options), recovery_(recovery), reach_(table, text, recovery) {}
+    /// Reads `rule` from `position` as far as any derivation reaches, and writes the derivation down. The
+    /// index is left cut somewhere behind that place. What the search remembers is kept for the next one.
+    Outcome run(const ParserTable& table, TextIndex& text, const Options& options,
+                const Reach::Recovery& recovery, std::uint16_t rule, std::uint32_t position,
+                Derivation& derivation);
 
-    /// Reads `rule` from `position` as far as any derivation reaches that ends at `bound` at most. The index
-    /// is left cut somewhere behind that place.
-    Outcome run(std::uint16_t rule, std::uint32_t position, std::uint32_t bound);
+    /// All ends that `rule` can come to from `position`, in ascending order; none past the options' bounds.
+    std::vector<std::uint32_t> allEnds(const ParserTable& table, TextIndex& text, const Options& options,
+                                       std::uint16_t rule, std::uint32_t position);
 
-    /// The derivation that was found, and where it ends.
-    Derivation& derivation() { return derivation_; }
+    /// Where the derivation ends.
     std::uint32_t reached() const { return reached_; }
-    std::uint64_t steps() const { return steps_ + sets_.wordsJoined() / kWordsAStep; }
+    std::uint64_t steps() const { return steps_ + (sets_.wordsJoined() - joinedBefore_) / kWordsAStep; }
     /// What the search has to remember, as Options::maxMemo counts it.
-    std::size_t remembered() const;
+    std::size_t remembered() const { return bytes() / kMemoBytes; }
+    std::size_t bytes() const;
+    /// The bytes of memory that it keeps.
+    std::size_t capacity() const;
 
  private:
     static constexpr SetId kEmpty = PositionSets::kEmpty;
     static constexpr std::uint64_t kWordsAStep = 8;
+    /// What Options::maxMemo reckons with for each thing that a search remembers.
+    static constexpr std::size_t kMemoBytes = 32;
+
+    void start(const ParserTable& table, TextIndex& text, const Options& options,
+               const Reach::Recovery& recovery, Derivation* derivation);
 
     bool findSets(std::uint32_t position, std::uint32_t end);
     SetId setFor(std::uint16_t node, std::uint32_t position);
@@ -55,7 +63,7 @@ class FullSearch {
                           std::uint64_t bits) const;
     SetId setAt(std::uint16_t node, std::uint32_t position) const;
     SetId endsOf(std::uint16_t rule, std::uint32_t position) const {
-        return setAt(searchedFrom(table_, table_.rules[rule].entry), position);
+        return setAt(searchedFrom(*table_, table_->rules[rule].entry), position);
     }
     /// The ends that a walk may come to: mostly very few, and far from each other.
     struct Wanted {
@@ -83,29 +91,23 @@ class FullSearch {
     std::uint32_t addState(std::uint16_t node, std::uint32_t position, std::uint32_t before,
                            std::uint32_t part, std::uint32_t end);
 
-    const ParserTable& table_;
-    TextIndex& text_;
-    const Options& options_;
-    const Reach::Recovery recovery_;
-    Reach reach_;
+    const ParserTable* table_ = nullptr;
+    TextIndex* text_ = nullptr;
+    const Options* options_ = nullptr;
+    Reach::Recovery recovery_;
+    Derivation* made_ = nullptr;
 
+    Reach reach_;
     std::uint32_t from_ = 0;
     PositionSets sets_;
     std::vector<SetId> byVertex_;             ///< of the nodes that were kept, position by position
     std::vector<std::uint32_t> vertexFrom_;   ///< by position
     std::vector<std::uint8_t> vertexBefore_;  ///< by position and word of its row: nodes in the words before
-    /// A node behind a Call, and the last ends of a call in front of it with all that is behind them.
-    struct Behind {
-        EndsBehind ends;
-        SetId knownEnds = kEmpty, knownBehind = kEmpty;
-    };
-    std::vector<std::uint32_t> behindOf_;  ///< by node: its place in behind_, or kNone
-    std::vector<Behind> behind_;
-    std::size_t behindBytes_ = 0;
+    EndsBehind behind_;
+    StartsBefore starts_;
 
     std::vector<Walk> walks_;
-    Derivation derivation_;
-    std::uint64_t steps_ = 0;
+    std::uint64_t steps_ = 0, joinedBefore_ = 0;
     std::uint32_t reached_ = 0;
 };
 

@@ -10,17 +10,14 @@ namespace zr::engine {
 struct Options {
     /// Rules at work inside each other. A parenthesis costs about four, a sub-query about ten.
     std::uint32_t maxDepth = 200000;
-    /// Rules called and ways that failed, in the search that remembers nothing, since it last got further;
-    /// 0 leaves that search out.
-    std::uint32_t quickSteps = 64;
-    /// Steps of the search that tries one reading behind the other: a fixed part and a part for each token.
-    /// Most text needs less than half of it.
-    std::uint64_t baseSteps = 400;
-    std::uint64_t stepsPerToken = 20;
-    /// Steps of the search that takes over then. Past them the furthest reading of a last, narrow search
-    /// stands, and a notice goes to the diagnostics.
-    std::uint64_t fullBaseSteps = 2000000;
-    std::uint64_t fullStepsPerToken = 1000;
+    /// Rules called and ways that failed, in the search that tries one reading behind the other, since it
+    /// last got further; 0 leaves that search out.
+    std::uint32_t quickSteps = 128;
+    /// Steps of the search that takes over then: a fixed part and a part for each token. Most text needs less
+    /// than a tenth of it. Where that isn't enough, only a first part of the text is read, and a notice goes
+    /// to the diagnostics.
+    std::uint64_t baseSteps = 2000000;
+    std::uint64_t stepsPerToken = 1000;
     /// What one search may remember: places it was at, ends it found, steps of the way. Each takes some
     /// thirty bytes. Past them as past the steps.
     std::size_t maxMemo = 20000000;

@@ -61,6 +61,10 @@ class PositionSets {
     /// Words that were gone through in making sets: the work it took.
     std::uint64_t wordsJoined() const { return wordsJoined_; }
     std::size_t bytes() const { return words_.size() * sizeof(std::uint64_t) + sets_.size() * sizeof(Set); }
+    std::size_t capacity() const {
+        return (words_.capacity() + joint_.capacity()) * sizeof(std::uint64_t) +
+               sets_.capacity() * sizeof(Set);
+    }
 
  private:
     struct Set {

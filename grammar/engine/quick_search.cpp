@@ -5,7 +5,8 @@
 
 namespace zr::engine {
 
-bool QuickSearch::run(std::uint16_t rule, std::uint32_t position) {
+QuickSearch::Outcome QuickSearch::run(std::uint16_t rule, std::uint32_t position) {
+    if (options_.quickSteps == 0) return Outcome::GaveUp;
     made_.parts.assign(1, {rule, position, false});
     made_.ends.clear();
     made_.states.clear();
@@ -23,11 +24,12 @@ bool QuickSearch::run(std::uint16_t rule, std::uint32_t position) {
             furthest = low_;
             bound = steps_ + options_.quickSteps;
         }
-        if (++steps_ > bound || remembered() > options_.maxMemo || !turnBack()) return false;
+        if (tooDeep_) return Outcome::TooDeep;
+        if (++steps_ > bound || remembered() > options_.maxMemo || !turnBack()) return Outcome::GaveUp;
     }
-    if (remembered() > options_.maxMemo) return false;
+    if (remembered() > options_.maxMemo) return Outcome::GaveUp;
     made_.endState = state_;
-    return true;
+    return Outcome::Found;
 }
 
 std::uint32_t QuickSearch::addState(std::uint16_t node, std::uint32_t before, std::uint32_t child,
@@ -110,7 +112,8 @@ bool QuickSearch::call(const NodeRow& node) {
     }
     if (!text_.guarded(node, low_)) return false;
     const std::uint32_t depth = call_ == kNone ? 1 : work_.calls[call_].depth + 1;
-    if (depth >= options_.maxDepth) return false;
+    tooDeep_ = depth >= options_.maxDepth;
+    if (tooDeep_) return false;
     ++steps_;
     const auto part = static_cast<std::uint32_t>(made_.parts.size());
     made_.parts.push_back({node.arg, low_, false});

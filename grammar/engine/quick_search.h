@@ -47,8 +47,11 @@ class QuickSearch {
                 Work& work)
         : table_(table), text_(text), options_(options), made_(derivation), work_(work) {}
 
-    /// Whether `rule` reads the text from `position` to its end. A "no" only says that nothing was found.
-    bool run(std::uint16_t rule, std::uint32_t position);
+    enum class Outcome { Found, GaveUp, TooDeep };
+
+    /// Looks for a reading of the text by `rule` from `position` to its end. That it gave up says nothing
+    /// about the text.
+    Outcome run(std::uint16_t rule, std::uint32_t position);
 
     /// Where the derivation ends: always the end of the text, which closers may have been taken up to.
     std::uint32_t low() const { return low_; }
@@ -78,6 +81,7 @@ class QuickSearch {
     std::uint32_t low_ = 0, high_ = 0;
     std::uint32_t state_ = kNone, call_ = kNone;
     std::uint64_t steps_ = 0;
+    bool tooDeep_ = false;
 };
 
 }  // namespace zr::engine

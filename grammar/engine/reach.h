@@ -10,8 +10,8 @@
 /// with their returns: a rule that ends may go on behind any call of it that was met further ahead. So this
 /// says "no" only where no reading passes, and takes time and memory linear in the text.
 ///
-/// follow() goes forward from the beginning, keep() back from an end; a node that is kept was met on both
-/// ways.
+/// follow() goes forward from the beginning and notes every way from one node to the next, keep() goes back
+/// along these from an end; a node that is kept was met on both.
 namespace zr::engine {
 
 class Reach {
@@ -24,12 +24,12 @@ class Reach {
         std::uint32_t to = kNone;
     };
 
-    /// The table and the index must outlive this object.
-    Reach(const ParserTable& table, TextIndex& text, const Recovery& recovery);
+    /// Makes ready for a text; the table and the index must outlive what is done with them.
+    void start(const ParserTable& table, TextIndex& text, const Recovery& recovery);
 
-    /// What looking at so many tokens takes, nearly all of it for the two tables of nodes.
+    /// What looking at so many tokens takes at least, nearly all of it for the nodes that are kept.
     static std::size_t bytesFor(const ParserTable& table, std::size_t tokens) {
-        return (tokens + 1) * ((table.stops + 63) / 64) * 2 * sizeof(std::uint64_t);
+        return (tokens + 1) * ((table.stops + 63) / 64) * sizeof(std::uint64_t);
     }
 
     /// Finds what `rule` can pass from `position` on.
@@ -41,7 +41,7 @@ class Reach {
 
     /// Whether a node was kept at a position.
     bool keeps(std::uint16_t node, std::uint32_t position) const {
-        return position <= end_ && has(kept_, node, position);
+        return position <= end_ && has(keptAt(position), node);
     }
     /// What was kept at a position, as bits by node, in words of which there are words().
     const std::uint64_t* keptAt(std::uint32_t position) const {
@@ -52,48 +52,61 @@ class Reach {
     std::uint32_t branches(const NodeRow& choice, std::uint32_t position) const;
     /// Whether a call may stand for tokens that can't be read.
     bool mayRecover(const NodeRow& call, std::uint32_t position) const {
-        return position == recovery_.place && call.arg == table_.recoverRule;
+        return position == recovery_.place && call.arg == table_->recoverRule;
     }
     /// Nodes kept at all positions together.
     std::size_t keptCount() const { return keptCount_; }
+    std::size_t bytes() const;
+    std::size_t capacity() const;
 
  private:
-    using Rows = std::vector<std::uint64_t>;
+    /// A way from a node to one that comes behind it.
+    struct Way {
+        std::uint16_t from, to;
+        bool operator==(const Way&) const = default;
+    };
 
-    bool has(const Rows& rows, std::uint16_t node, std::uint32_t position) const {
-        return (rows[(position - from_) * words_ + node / 64] >> (node % 64)) & 1;
+    static bool has(const std::uint64_t* row, std::uint16_t node) {
+        return ((row[node / 64] >> (node % 64)) & 1) != 0;
     }
-    void set(Rows& rows, std::uint16_t node, std::uint32_t position) const {
-        rows[(position - from_) * words_ + node / 64] |= std::uint64_t{1} << (node % 64);
+    static void set(std::uint64_t* row, std::uint16_t node) {
+        row[node / 64] |= std::uint64_t{1} << (node % 64);
     }
-    void meet(std::uint16_t node, std::uint32_t position);
+    void meet(std::uint16_t node);
+    void goOn(std::uint16_t from, std::uint16_t to);
     void pass(std::uint16_t node, std::uint32_t position);
-    bool leadsOn(std::uint16_t node, std::uint32_t position);
-    void noteReturns(std::uint16_t end, std::uint32_t position);
+    void passCall(std::uint16_t call, std::uint32_t position);
     bool mayCall(const NodeRow& call, std::uint32_t position);
     bool mayBeEmpty(const NodeRow& call) const;
     bool comesBack(std::uint16_t call, std::uint32_t position) const;
+    bool leadsOn(const Way& way, const std::uint64_t* row) const;
     template <typename Visit>
-    void forEachCall(std::uint16_t rule, Visit visit) const;
+    void forEachCallMet(std::uint16_t rule, Visit visit) const;
 
-    const ParserTable& table_;
-    TextIndex& text_;
-    const Recovery recovery_;
-    std::size_t words_;
+    const ParserTable* table_ = nullptr;
+    TextIndex* text_ = nullptr;
+    Recovery recovery_;
+    std::size_t words_ = 0;
     std::uint16_t rule_ = 0;
-    std::uint32_t from_ = 0;
-    std::uint32_t firstEnd_ = 0, end_ = 0;
-    Rows met_, kept_;  ///< by position: nodes as bits
+    std::uint32_t from_ = 0, end_ = 0;
+
+    // Ways at one position and to the next one, in the order in which they were found.
+    std::vector<Way> ways_, steps_;
+    std::vector<std::uint32_t> waysFrom_, stepsFrom_;  ///< by position
+    std::vector<Way> skips_;                           ///< over what can't be read
+    std::vector<std::uint32_t> ends_;                  ///< where the followed rule could end
+
+    std::vector<std::uint64_t> met_;         ///< nodes met at the position at hand, as bits
+    std::vector<std::uint16_t> open_;        ///< met there and not passed yet
+    std::vector<std::uint32_t> metAt_;       ///< by Call: where it was met first
+    std::vector<std::uint16_t> called_;      ///< by rule: the Call of it that was met last as a new one
+    std::vector<std::uint16_t> callBefore_;  ///< by Call: the one of the same rule met before it
+    std::vector<std::uint32_t> endedAt_;     ///< by rule: where it ended last
+    std::vector<std::uint16_t> endOf_;       ///< by rule: its End, once it was passed
+
+    std::vector<std::uint64_t> kept_;    ///< by position: nodes as bits
+    std::vector<std::uint8_t> returns_;  ///< by Call: something was kept behind it, further on
     std::size_t keptCount_ = 0;
-    std::vector<std::uint16_t> order_;      ///< the nodes met, position by position
-    std::vector<std::uint32_t> orderFrom_;  ///< by position
-    std::vector<std::uint16_t> open_;       ///< met here and not passed yet
-    std::vector<std::uint16_t> ahead_;      ///< met at the next position
-    std::vector<std::uint16_t> skipped_;    ///< met behind the recovery
-    std::vector<std::uint32_t> metAt_;      ///< by Call: where it was met first
-    std::vector<std::uint32_t> endedAt_;    ///< by rule: where it ended last
-    std::vector<std::uint8_t> returns_;     ///< by Call: something was kept behind it, further on
-    std::vector<std::uint32_t> ends_;       ///< where the followed rule could end
 };
 
 }  // namespace zr::engine

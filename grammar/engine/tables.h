@@ -85,9 +85,9 @@ struct NodeRow {
 };
 
 enum NodeFlags : std::uint8_t {
-    kMerge = 1,     ///< more than one way leads here: enter each state once
-    kLoop = 4,      ///< Choice of a tail loop that is the loop itself: its first branch is a round
-    kNonEmpty = 2,  ///< Call: only results that take a token count
+    kBehindCall = 1,  ///< a Call goes on here
+    kLoop = 4,        ///< Choice of a tail loop that is the loop itself: its first branch is a round
+    kNonEmpty = 2,    ///< Call: only results that take a token count
 };
 
 struct RuleRow {

@@ -33,7 +33,6 @@ void TextIndex::index() {
     candidates_.assign(table_->guardCount, {});
     barriers_.assign(table_->guardCount, {});
     nextOpener_.clear();
-    owedAt_.clear();
 }
 
 void TextIndex::indexGuard(std::uint16_t number) {
@@ -54,27 +53,6 @@ void TextIndex::indexGuard(std::uint16_t number) {
     nextOpener_[count_] = count_ + 2;
     for (std::uint32_t i = count_; i-- > 0;)
         nextOpener_[i] = inSet(table_->openerSet, classes_[i]) ? i : nextOpener_[i + 1];
-}
-
-std::uint32_t TextIndex::closersOwedAt(std::uint32_t position) {
-    if (table_->owing == kNone16) return kNone;
-    if (owedAt_.empty()) {
-        owedAt_.resize(count_ + 1);
-        for (std::uint32_t i = 0; i < count_; ++i)
-            owedAt_[i + 1] = owedAt_[i] + (inSet(table_->owing, classes_[i]) ? 1 : 0);
-    }
-    return owedAt_[position];
-}
-
-std::uint32_t skippedTo(const ParserTable& table, const TextIndex& text, std::uint32_t position) {
-    std::uint32_t depth = 0;
-    for (; position < text.fullCount(); ++position) {
-        const std::uint16_t type = text.type(position);
-        if (depth == 0 && text.inSet(table.recoverFollowSet, table.classOf[type])) break;
-        if (type == table.leftParen) ++depth;
-        if (type == table.rightParen && depth > 0) --depth;
-    }
-    return position;
 }
 
 }  // namespace zr::engine

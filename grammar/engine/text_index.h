@@ -114,10 +114,6 @@ class TextIndex {
         return static_cast<std::uint8_t>(stopped | (1u << choice.context));
     }
 
-    /// How many closers rules that started ahead of a position must take behind it, at most: one for each
-    /// opening parenthesis. kNone when the grammar doesn't tell.
-    std::uint32_t closersOwedAt(std::uint32_t position);
-
  private:
     void index();
     void indexGuard(std::uint16_t guard);
@@ -131,11 +127,6 @@ class TextIndex {
     std::vector<std::vector<std::uint32_t>> candidates_;  ///< by guard: next position that could satisfy it
     std::vector<std::vector<std::uint32_t>> barriers_;    ///< by guard: next position outside
     std::vector<std::uint32_t> nextOpener_;
-    std::vector<std::uint32_t> owedAt_;
 };
-
-/// Where skipping ends that starts at a position in place of the recover rule: the first token that can
-/// follow it at the same parenthesis depth, or the end of the full text.
-std::uint32_t skippedTo(const ParserTable& table, const TextIndex& text, std::uint32_t position);
 
 }  // namespace zr::engine

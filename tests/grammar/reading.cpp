@@ -207,7 +207,6 @@ SyntaxDump readBySets(std::u16string_view text) {
     Pipeline<G> pipeline(text);
     engine::Options& options = optionsOf(pipeline.parser());
     options.quickSteps = 0;
-    options.baseSteps = options.stepsPerToken = 0;
     copyTree(pipeline.parser()->start_rule(pipeline.parser()).tree, reading);
     return reading.statement;
 }
