@@ -3,6 +3,21 @@
 #include <algorithm>
 
 namespace zr::engine {
+namespace {
+
+/// Turns 64 rows of 64 bits so that bit c of row r becomes bit r of row c: halves are exchanged, then
+/// quarters in each half, down to single bits (Warren, Hacker's Delight, 7-3).
+void transpose(std::uint64_t* rows) {
+    std::uint64_t mask = 0x00000000FFFFFFFFu;
+    for (unsigned width = 32; width != 0; width /= 2, mask ^= mask << width)
+        for (unsigned row = 0; row < 64; row = ((row | width) + 1) & ~width) {
+            const std::uint64_t exchanged = ((rows[row] >> width) ^ rows[row | width]) & mask;
+            rows[row] ^= exchanged << width;
+            rows[row | width] ^= exchanged;
+        }
+}
+
+}  // namespace
 
 void EndsBehind::start(const PositionSets& sets, std::size_t nodes) {
     sets_ = &sets;
@@ -19,7 +34,9 @@ void EndsBehind::note(std::uint16_t node, std::uint32_t position, SetId ends) {
     }
     Word& word = words_[placeOf_[node] * std::size_t{sets_->wordCount()} + sets_->wordOf(position)];
     if (sets_->contains(ends, position)) word.here |= sets_->bitOf(position);
-    if (!sets_->isSingle(ends, position)) word.elsewhere |= sets_->bitOf(position);
+    if (sets_->isSingle(ends, position)) return;
+    word.elsewhere |= sets_->bitOf(position);
+    ++known_[placeOf_[node]].elsewhere;
 }
 
 void StartsBefore::start() {
@@ -39,16 +56,12 @@ std::size_t StartsBefore::capacity() const {
     return rows * sizeof(std::uint64_t);
 }
 
-/// Turns 64 rows of 64 bits so that bit c of row r becomes bit r of row c: halves are exchanged, then
-/// quarters in each half, down to single bits (Warren, Hacker's Delight, 7-3).
-void StartsBefore::transpose(std::uint64_t* rows) {
-    std::uint64_t mask = 0x00000000FFFFFFFFu;
-    for (unsigned width = 32; width != 0; width /= 2, mask ^= mask << width)
-        for (unsigned row = 0; row < 64; row = ((row | width) + 1) & ~width) {
-            const std::uint64_t exchanged = ((rows[row] >> width) ^ rows[row | width]) & mask;
-            rows[row] ^= exchanged << width;
-            rows[row | width] ^= exchanged;
-        }
+/// Turns ends by position into positions by end.
+void StartsBefore::Block::turn(std::uint32_t word) {
+    std::uint64_t* row = rows.data() + (word - range.from) * kBits;
+    transpose(row);
+    for (std::size_t bit = 0; bit < kBits; ++bit)
+        if (row[bit] != 0) used[bit] = {std::min(used[bit].from, word), word + 1};
 }
 
 }  // namespace zr::engine

@@ -7,7 +7,7 @@ namespace zr::engine {
 namespace {
 
 /// So many of 64 positions are many.
-constexpr std::uint32_t kManyEnds = 8;
+constexpr std::uint32_t kManyEnds = 2;
 
 }  // namespace
 
@@ -115,8 +115,7 @@ SetId FullSearch::setAt(std::uint16_t node, std::uint32_t position) const {
     const std::size_t w = node / 64;
     const std::uint64_t below = reach_.keptAt(position)[w] & ((std::uint64_t{1} << (node % 64)) - 1);
     const std::uint32_t here = position - from_;
-    return byVertex_[vertexFrom_[here] + vertexBefore_[here * reach_.words() + w] +
-                     static_cast<std::uint32_t>(std::popcount(below))];
+    return byVertex_[vertexFrom_[here] + vertexBefore_[here * reach_.words() + w] + countOnes(below)];
 }
 
 /// The ends that the rule of a node can come to from a position, when those of all nodes further on, and of
@@ -149,7 +148,7 @@ SetId FullSearch::setFor(std::uint16_t at, std::uint32_t p) {
                     several = true;
                 }
                 if (several) sets_.join(set);
-                if (first == kEmpty || sets_.wordsOf(set) > sets_.wordsOf(first)) first = set;
+                if (first == kEmpty || sets_.size(set) > sets_.size(first)) first = set;
             }
             return several ? sets_.joined(first) : first;
         }
@@ -174,13 +173,16 @@ SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p) {
     if (behind == nullptr) return kEmpty;
     // Rules inside each other mostly share the ends further on: only what is new is looked at.
     EndsBehind::Known& known = behind_.known(call.run);
-    const SetId seen = sets_.containsAll(ends, known.ends) ? known.ends : kEmpty;
-    if (seen != kEmpty) sets_.join(known.behind);
+    auto* last = &known.last[sets_.size(known.last[0].ends) > sets_.size(known.last[1].ends) ? 0 : 1];
+    bool grows = sets_.grows(ends, last->ends, gained_);
+    if (!grows) {
+        last = &known.last[last == &known.last[0] ? 1 : 0];
+        grows = sets_.grows(ends, last->ends, gained_);
+    }
+    if (grows) sets_.join(last->behind);
     SetId before = kEmpty;
-    const PositionSets::Range range = sets_.range(ends);
-    for (std::uint32_t word = range.from; word < range.to; ++word) {
-        const std::uint64_t bits = counted(call, p, word, sets_.word(ends, word) & ~sets_.word(seen, word));
-        if (bits == 0) continue;
+    for (const auto& [word, more] : gained_) {
+        const std::uint64_t bits = counted(call, p, word, more);
         sets_.joinWord(word, bits & behind[word].here);
         for (std::uint64_t left = bits & behind[word].elsewhere; left != 0; left &= left - 1) {
             const SetId further = setAt(call.run, sets_.positionOf(word, left));
@@ -188,10 +190,10 @@ SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p) {
             before = further;
         }
     }
-    steps_ += (range.to - range.from) / kWordsAStep;
+    steps_ += gained_.size() / kWordsAStep;
     const SetId made = sets_.joined(ends);
     // An end that takes no token counts for some calls and not for others.
-    if (!sets_.contains(ends, p)) known = {ends, made};
+    if (!sets_.contains(ends, p)) *last = {ends, made};
     return made;
 }
 
@@ -324,23 +326,23 @@ FullSearch::Wanted FullSearch::wantedBy(const Walk& walk, const NodeRow& call) {
         return counted(call, walk.position, word, sets_.word(ends, word));
     };
     // Of many ends mostly one or two lead on to what is wanted: it takes less to look from there.
-    std::uint32_t others = 0;
-    for (std::uint32_t word = range.from; word < range.to; ++word)
-        others += static_cast<std::uint32_t>(std::popcount(endsIn(word) & behind[word].elsewhere));
     const bool isFew = walk.wanted.count <= Wanted::kFew;
-    const bool backwards = isFew && others >= kManyEnds * (range.to - range.from);
+    const std::uint32_t many = kManyEnds * (range.to - range.from);
+    const std::uint32_t elsewhere = behind_.known(call.run).elsewhere;
+    const bool backwards = isFew && sets_.size(ends) >= many && elsewhere >= many;
+    const bool forwards = !backwards && !(isFew && elsewhere == 0);
     for (std::uint32_t i = 0; isFew && i < walk.wanted.count; ++i) {
         const std::uint32_t end = walk.wanted.few[i], wordOfEnd = sets_.wordOf(end);
         sets_.joinWord(wordOfEnd, endsIn(wordOfEnd) & behind[wordOfEnd].here & sets_.bitOf(end));
         if (!backwards) continue;
-        const std::uint64_t* rows =
-            starts_.rows(sets_, call.run, behind, range, wordOfEnd,
-                         [&](std::uint32_t position) { return setAt(call.run, position); });
-        rows += (end - from_) % 64;
-        for (std::uint32_t word = range.from; word < range.to; ++word, rows += 64)
-            sets_.joinWord(word, endsIn(word) & *rows);
+        const StartsBefore::Starts starts =
+            starts_.of(sets_, call.run, behind, range, end,
+                       [&](std::uint32_t position) { return setAt(call.run, position); });
+        const std::uint32_t to = std::min(range.to, starts.words.to);
+        for (std::uint32_t word = std::max(range.from, starts.words.from); word < to; ++word)
+            sets_.joinWord(word, endsIn(word) & starts.in(word));
     }
-    for (std::uint32_t word = range.from; !backwards && word < range.to; ++word) {
+    for (std::uint32_t word = range.from; forwards && word < range.to; ++word) {
         if (!isFew)
             sets_.joinWord(word, endsIn(word) & behind[word].here & sets_.word(walk.wanted.many, word));
         for (std::uint64_t left = endsIn(word) & behind[word].elsewhere; left != 0; left &= left - 1)

@@ -105,6 +105,7 @@ class FullSearch {
     std::vector<std::uint8_t> vertexBefore_;  ///< by position and word of its row: nodes in the words before
     EndsBehind behind_;
     StartsBefore starts_;
+    std::vector<PositionSets::Part> gained_;
 
     std::vector<Walk> walks_;
     std::uint64_t steps_ = 0, joinedBefore_ = 0;

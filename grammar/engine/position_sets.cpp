@@ -7,7 +7,7 @@ namespace zr::engine {
 
 void PositionSets::start(std::uint32_t from, std::uint32_t end) {
     from_ = from;
-    sets_.assign(1, {0, 0, 0});
+    sets_.assign(1, {0, 0, 0, 0});
     words_.clear();
     joint_.assign((end - from) / 64 + 1, 0);
     jointFrom_ = jointTo_ = 0;
@@ -43,7 +43,9 @@ SetId PositionSets::joined(SetId like) {
     if (known.from != jointFrom_ || known.count != jointTo_ - jointFrom_ ||
         !std::equal(from, to, words_.begin() + static_cast<std::ptrdiff_t>(known.offset))) {
         made = static_cast<SetId>(sets_.size());
-        sets_.push_back({jointFrom_, jointTo_ - jointFrom_, words_.size()});
+        std::uint32_t size = 0;
+        for (auto word = from; word != to; ++word) size += countOnes(*word);
+        sets_.push_back({jointFrom_, jointTo_ - jointFrom_, size, words_.size()});
         words_.insert(words_.end(), from, to);
     }
     drop();
@@ -77,15 +79,24 @@ bool PositionSets::isSingle(SetId id, std::uint32_t position) const {
     return set.count == 1 && set.from == wordOf(position) && words_[set.offset] == bitOf(position);
 }
 
-bool PositionSets::containsAll(SetId whole, SetId part) const {
-    const Set& w = sets_[whole];
-    const Set& p = sets_[part];
-    if (p.count == 0) return true;
-    if (p.from < w.from || p.from + p.count > w.from + w.count) return false;
-    std::uint64_t missing = 0;
-    for (std::uint32_t i = 0; i < p.count; ++i)
-        missing |= words_[p.offset + i] & ~words_[w.offset + p.from - w.from + i];
-    return missing == 0;
+bool PositionSets::grows(SetId id, SetId before, std::vector<Part>& gained) const {
+    const Range all = range(id), shared = range(before);
+    const std::uint64_t* mine = words_.data() + sets_[id].offset;
+    const std::uint64_t* theirs = words_.data() + sets_[before].offset;
+    bool grows = shared.from == shared.to || (shared.from >= all.from && shared.to <= all.to);
+    gained.clear();
+    for (std::uint32_t word = shared.from; grows && word < shared.to; ++word) {
+        const std::uint64_t now = mine[word - all.from], then = theirs[word - shared.from];
+        if (now == then) continue;
+        grows = (then & ~now) == 0;
+        gained.push_back({word, now & ~then});
+    }
+    if (!grows) gained.clear();
+    for (std::uint32_t word = all.from; word < all.to; ++word) {
+        if (grows && word == shared.from) word = shared.to;
+        if (word < all.to) gained.push_back({word, mine[word - all.from]});
+    }
+    return grows;
 }
 
 bool PositionSets::meet(SetId one, SetId other) const {

@@ -11,6 +11,15 @@ namespace zr::engine {
 
 using SetId = std::uint32_t;
 
+/// How many bits are set. The standard's own calls a library where a processor need not have an instruction
+/// for it (Warren, Hacker's Delight, 5-1).
+constexpr std::uint32_t countOnes(std::uint64_t bits) {
+    bits -= (bits >> 1) & 0x5555555555555555u;
+    bits = (bits & 0x3333333333333333u) + ((bits >> 2) & 0x3333333333333333u);
+    bits = (bits + (bits >> 4)) & 0x0F0F0F0F0F0F0F0Fu;
+    return static_cast<std::uint32_t>((bits * 0x0101010101010101u) >> 56);
+}
+
 class PositionSets {
  public:
     static constexpr SetId kEmpty = 0;
@@ -39,11 +48,17 @@ class PositionSets {
         const std::uint32_t here = position - from_;
         return ((word(set, here / 64) >> (here % 64)) & 1) != 0;
     }
-    bool containsAll(SetId whole, SetId part) const;
+    /// Positions in one word.
+    struct Part {
+        std::uint32_t word;
+        std::uint64_t bits;
+    };
+    /// Whether a set has all that another has; puts what it has more into `gained` then, else all of it.
+    bool grows(SetId set, SetId before, std::vector<Part>& gained) const;
     bool meet(SetId one, SetId other) const;
     std::uint32_t last(SetId set) const;
     Range range(SetId set) const { return {sets_[set].from, sets_[set].from + sets_[set].count}; }
-    std::uint32_t wordsOf(SetId set) const { return sets_[set].count; }
+    std::uint32_t size(SetId set) const { return sets_[set].size; }
     std::uint64_t word(SetId set, std::uint32_t word) const {
         const Set& s = sets_[set];
         return word - s.from < s.count ? words_[s.offset + (word - s.from)] : 0;
@@ -69,6 +84,7 @@ class PositionSets {
  private:
     struct Set {
         std::uint32_t from, count;
+        std::uint32_t size;  ///< positions
         std::size_t offset;  ///< in words_
     };
 
