@@ -72,8 +72,7 @@ void Reach::follow(std::uint16_t rule, std::uint32_t position) {
     meet(searchedFrom(*table_, table_->rules[rule].entry));
     for (std::uint32_t p = position; p <= end_; ++p) {
         const std::size_t ahead = stepsFrom_.empty() ? 0 : stepsFrom_.back();
-        waysFrom_.push_back(static_cast<std::uint32_t>(ways_.size()));
-        stepsFrom_.push_back(static_cast<std::uint32_t>(steps_.size()));
+        beginPosition();
         for (std::size_t i = ahead; i < stepsFrom_.back(); ++i) meet(steps_[i].to);
         if (p == recovery_.to)
             for (const Way& skip : skips_) meet(skip.to);
@@ -86,8 +85,7 @@ void Reach::follow(std::uint16_t rule, std::uint32_t position) {
         const bool skips = !skips_.empty() && p < recovery_.to;
         if (steps_.size() == stepsFrom_.back() && !skips) break;
     }
-    waysFrom_.push_back(static_cast<std::uint32_t>(ways_.size()));
-    stepsFrom_.push_back(static_cast<std::uint32_t>(steps_.size()));
+    beginPosition();
 }
 
 void Reach::meet(std::uint16_t node) {
@@ -99,6 +97,11 @@ void Reach::meet(std::uint16_t node) {
 void Reach::goOn(std::uint16_t from, std::uint16_t to) {
     ways_.push_back({from, to});
     meet(to);
+}
+
+void Reach::beginPosition() {
+    waysFrom_.push_back(static_cast<std::uint32_t>(ways_.size()));
+    stepsFrom_.push_back(static_cast<std::uint32_t>(steps_.size()));
 }
 
 void Reach::pass(std::uint16_t at, std::uint32_t p) {
@@ -153,16 +156,26 @@ void Reach::passCall(std::uint16_t at, std::uint32_t p) {
         called_[call.arg] = at;
     }
     if (endedAt_[call.arg] == p && comesBack(at, p)) goOn(endOf_[call.arg], call.run);
+    // Whether a call leads on that need not take a token depends on what is behind it at the same position,
+    // too.
+    if (mayBeEmpty(call)) ways_.push_back({at, call.run});
     goOn(at, searchedFrom(*table_, table_->rules[call.arg].entry));
 }
 
 // ---- back
 
-/// Whether the node that a way comes from is kept for what it goes to at the same position.
-bool Reach::leadsOn(const Way& way, const std::uint64_t* row) const {
-    if (!has(row, way.to)) return false;
-    const NodeRow& from = table_->nodes[way.from];
-    return from.op != Op::Call || returns_[way.from] || (mayBeEmpty(from) && has(row, from.run));
+/// Whether a node is kept for something that is kept behind it at the same position.
+bool Reach::leadsOn(std::uint16_t at, const std::uint64_t* row) const {
+    const NodeRow& node = table_->nodes[at];
+    if (node.op != Op::Call) return true;
+    return has(row, searchedFrom(*table_, table_->rules[node.arg].entry)) &&
+           (returns_[at] || (mayBeEmpty(node) && has(row, node.run)));
+}
+
+void Reach::keepNode(std::uint16_t node, std::uint64_t* row) {
+    if (has(row, node)) return;
+    set(row, node);
+    open_.push_back(node);
 }
 
 void Reach::keep(std::uint32_t first, std::uint32_t last) {
@@ -170,41 +183,47 @@ void Reach::keep(std::uint32_t first, std::uint32_t last) {
     kept_.assign((last - from_ + 1) * words_, 0);
     keptCount_ = 0;
     returns_.assign(table_->stops, 0);
+    wayTo_.assign(table_->stops, kNone);
     for (std::uint32_t p = last + 1; p-- > from_;) {
         const std::uint32_t here = p - from_;
         std::uint64_t* row = kept_.data() + here * words_;
-        const std::size_t ahead = keptCount_;
-        const auto keepNode = [&](std::uint16_t node) {
-            if (has(row, node)) return;
-            set(row, node);
-            ++keptCount_;
-        };
         for (std::uint32_t i = stepsFrom_[here]; p < last && i < stepsFrom_[here + 1]; ++i)
-            if (has(row + words_, steps_[i].to)) keepNode(steps_[i].from);
-        if (p >= first && std::binary_search(ends_.begin(), ends_.end(), p)) keepNode(endOf_[rule_]);
+            if (has(row + words_, steps_[i].to)) keepNode(steps_[i].from, row);
+        if (p >= first && std::binary_search(ends_.begin(), ends_.end(), p)) keepNode(endOf_[rule_], row);
         for (const Way& skip : skips_)
-            if (p == recovery_.place && keeps(skip.to, recovery_.to)) keepNode(skip.from);
-        std::size_t before;
-        do {  // what was met last comes first: mostly there is nothing left for a second time
-            before = keptCount_;
-            for (std::uint32_t i = waysFrom_[here + 1]; i-- > waysFrom_[here];)
-                if (!has(row, ways_[i].from) && leadsOn(ways_[i], row)) keepNode(ways_[i].from);
-            if (p == recovery_.place && recovery_.to == p)
-                for (const Way& skip : skips_)
-                    if (has(row, skip.to)) keepNode(skip.from);
-        } while (keptCount_ != before);
+            if (p == recovery_.place && keeps(skip.to, recovery_.to)) keepNode(skip.from, row);
         const bool skipped = p > recovery_.place && p < recovery_.to;
-        if (keptCount_ == ahead && p < first && !skipped) return;  // nothing gets past here
-        std::uint16_t ended = kNone16;                             // ways from one End stand together
-        for (std::uint32_t i = waysFrom_[here]; i < waysFrom_[here + 1]; ++i) {
-            const std::uint16_t from = ways_[i].from;
-            if (from == ended || table_->nodes[from].op != Op::End || !has(row, from)) continue;
-            ended = from;
-            forEachCallMet(table_->nodes[from].arg, [&](std::uint16_t call) {
-                if (has(row, table_->nodes[call].run)) returns_[call] = 1;
-            });
-        }
+        if (open_.empty() && p < first && !skipped) return;  // nothing gets past here
+        if (!open_.empty()) keepAt(p, row);
     }
+}
+
+/// Goes back along the ways at a position.
+void Reach::keepAt(std::uint32_t p, std::uint64_t* row) {
+    const Way* ways = ways_.data() + waysFrom_[p - from_];
+    const std::uint32_t count = waysFrom_[p - from_ + 1] - waysFrom_[p - from_];
+    ended_.clear();
+    wayBefore_.resize(count);
+    for (std::uint32_t i = 0; i < count; ++i) {
+        wayBefore_[i] = wayTo_[ways[i].to];
+        wayTo_[ways[i].to] = i;
+    }
+    while (!open_.empty()) {
+        const std::uint16_t node = open_.back();
+        open_.pop_back();
+        ++keptCount_;
+        if (table_->nodes[node].op == Op::End) ended_.push_back(table_->nodes[node].arg);
+        for (std::uint32_t way = wayTo_[node]; way != kNone; way = wayBefore_[way])
+            if (leadsOn(ways[way].from, row)) keepNode(ways[way].from, row);
+        if (p == recovery_.place && p == recovery_.to)
+            for (const Way& skip : skips_)
+                if (skip.to == node) keepNode(skip.from, row);
+    }
+    for (std::uint32_t i = 0; i < count; ++i) wayTo_[ways[i].to] = kNone;
+    for (const std::uint16_t rule : ended_)
+        forEachCallMet(rule, [&](std::uint16_t call) {
+            if (has(row, table_->nodes[call].run)) returns_[call] = 1;
+        });
 }
 
 }  // namespace zr::engine

@@ -79,7 +79,10 @@ class Reach {
     bool mayCall(const NodeRow& call, std::uint32_t position);
     bool mayBeEmpty(const NodeRow& call) const;
     bool comesBack(std::uint16_t call, std::uint32_t position) const;
-    bool leadsOn(const Way& way, const std::uint64_t* row) const;
+    void beginPosition();
+    bool leadsOn(std::uint16_t node, const std::uint64_t* row) const;
+    void keepNode(std::uint16_t node, std::uint64_t* row);
+    void keepAt(std::uint32_t position, std::uint64_t* row);
     template <typename Visit>
     void forEachCallMet(std::uint16_t rule, Visit visit) const;
 
@@ -107,6 +110,10 @@ class Reach {
     std::vector<std::uint64_t> kept_;    ///< by position: nodes as bits
     std::vector<std::uint8_t> returns_;  ///< by Call: something was kept behind it, further on
     std::size_t keptCount_ = 0;
+    // At the position at hand: the ways to a node, one behind the other.
+    std::vector<std::uint32_t> wayTo_;      ///< by node
+    std::vector<std::uint32_t> wayBefore_;  ///< by way
+    std::vector<std::uint16_t> ended_;      ///< rules
 };
 
 }  // namespace zr::engine

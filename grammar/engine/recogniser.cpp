@@ -10,12 +10,14 @@ namespace zr::engine {
 Recogniser::Recogniser(const ParserTable& table, const std::vector<std::uint16_t>& types,
                        const Options& options)
     : table_(&table), options_(&options), text_(table, types) {
-    std::swap(work_, spare());
+    work_ = std::move(spare());
+    if (!work_) work_ = std::make_unique<Work>();
 }
 
 Recogniser::~Recogniser() {
-    Work& kept = spare();
-    if (work_.bytes() > kept.bytes() && work_.bytes() <= kSpareBytes) std::swap(kept, work_);
+    if (!work_ || work_->bytes() > kSpareBytes) return;
+    std::unique_ptr<Work>& kept = spare();
+    if (!kept || work_->bytes() > kept->bytes()) kept = std::move(work_);
 }
 
 std::size_t Recogniser::Work::bytes() const {
@@ -24,13 +26,13 @@ std::size_t Recogniser::Work::bytes() const {
            quick.points.capacity() * sizeof(QuickSearch::Point) + full.capacity();
 }
 
-Recogniser::Work& Recogniser::spare() {
-    static thread_local Work mine;
+std::unique_ptr<Recogniser::Work>& Recogniser::spare() {
+    static thread_local std::unique_ptr<Work> mine;
     return mine;
 }
 
 Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
-    QuickSearch quick(*table_, text_, *options_, work_.derivation, work_.quick);
+    QuickSearch quick(*table_, text_, *options_, work_->derivation, work_->quick);
     const QuickSearch::Outcome outcome = quick.run(rule, position);
     steps_ += quick.steps();
     remembered_ = quick.remembered();
@@ -40,14 +42,14 @@ Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
     if (result.overLimit) return result;
     result.found = true;
     result.entry = 0;
-    result.endState = work_.derivation.endState;
+    result.endState = work_->derivation.endState;
     result.low = quick.low();
     result.high = text_.count();
     return result;
 }
 
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
-    const std::uint32_t place = recoveryPlace(*table_, text_, *options_, work_.full, rule, position);
+    const std::uint32_t place = recoveryPlace(*table_, text_, *options_, work_->full, rule, position);
     if (place == kNone) return {};
     return fullSearch(rule, position, {place, skippedTo(*table_, text_, place)});
 }
@@ -59,9 +61,9 @@ Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t posi
     Result result;
     for (;;) {
         const FullSearch::Outcome outcome =
-            work_.full.run(*table_, text_, *options_, recovery, rule, position, work_.derivation);
-        steps_ += work_.full.steps();
-        remembered_ = std::max(remembered_, work_.full.remembered());
+            work_->full.run(*table_, text_, *options_, recovery, rule, position, work_->derivation);
+        steps_ += work_->full.steps();
+        remembered_ = std::max(remembered_, work_->full.remembered());
         if (outcome == FullSearch::Outcome::OverBudget && text_.count() > position) {
             result.overBudget = true;
             text_.cutAt(position + (text_.count() - position) / 2);
@@ -72,8 +74,8 @@ Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t posi
         if (outcome != FullSearch::Outcome::Found) return result;
         result.found = true;
         result.entry = 0;
-        result.endState = work_.derivation.endState;
-        result.low = result.high = work_.full.reached();
+        result.endState = work_->derivation.endState;
+        result.low = result.high = work_->full.reached();
         return result;
     }
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <memory>
 #include <vector>
 
 #include "grammar/engine/derivation.h"
@@ -50,12 +51,12 @@ class Recogniser {
     Result recover(std::uint16_t rule, std::uint32_t position);
 
     // What the tree builder reads.
-    const State& state(std::uint32_t index) const { return work_.derivation.states[index]; }
-    std::uint16_t ruleOf(std::uint32_t entry) const { return work_.derivation.parts[entry].rule; }
-    std::uint32_t startOf(std::uint32_t entry) const { return work_.derivation.parts[entry].position; }
-    const End& end(std::uint32_t index) const { return work_.derivation.ends[index]; }
+    const State& state(std::uint32_t index) const { return work_->derivation.states[index]; }
+    std::uint16_t ruleOf(std::uint32_t entry) const { return work_->derivation.parts[entry].rule; }
+    std::uint32_t startOf(std::uint32_t entry) const { return work_->derivation.parts[entry].position; }
+    const End& end(std::uint32_t index) const { return work_->derivation.ends[index]; }
     /// Whether the entry stands for tokens that were skipped where its rule didn't parse.
-    bool isRecovered(std::uint32_t entry) const { return work_.derivation.parts[entry].recovered; }
+    bool isRecovered(std::uint32_t entry) const { return work_->derivation.parts[entry].recovered; }
 
     /// Work done so far, in search steps; a benchmark figure.
     std::uint64_t steps() const { return steps_; }
@@ -71,14 +72,14 @@ class Recogniser {
         FullSearch full;
         std::size_t bytes() const;
     };
-    static Work& spare();
+    static std::unique_ptr<Work>& spare();
 
     Result fullSearch(std::uint16_t rule, std::uint32_t position, const Reach::Recovery& recovery);
 
     const ParserTable* table_;
     const Options* options_;
     TextIndex text_;
-    Work work_;
+    std::unique_ptr<Work> work_;
     std::uint64_t steps_ = 0;
     std::size_t remembered_ = 0;
 };
