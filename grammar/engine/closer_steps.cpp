@@ -7,7 +7,7 @@ namespace {
 
 /// Settles, from the end backwards, where in a run of closers each step stands: the optional closers further
 /// in take as many as they can, which is the first derivation in written order.
-void locate(const ParserTable& table, const Recogniser& recogniser, std::vector<Step>& steps,
+void locate(const ParserTable& table, const Derivation& derivation, std::vector<Step>& steps,
             std::size_t from, std::uint32_t exact) {
     std::uint32_t after = exact;
     for (std::size_t i = steps.size(); i-- > from;) {
@@ -26,7 +26,7 @@ void locate(const ParserTable& table, const Recogniser& recogniser, std::vector<
                 step.at = std::min(step.high, after);
                 break;
             case Op::Call:
-                step.at = recogniser.startOf(step.child);
+                step.at = derivation.parts[step.part].position;
                 break;
             default:
                 step.at = after;
@@ -41,17 +41,12 @@ void locate(const ParserTable& table, const Recogniser& recogniser, std::vector<
 
 }  // namespace
 
-void settleSteps(const ParserTable& table, const Recogniser& recogniser,
+void settleSteps(const ParserTable& table, const Derivation& derivation,
                  const std::vector<std::uint16_t>& types, std::uint16_t node, std::uint32_t position,
-                 std::uint32_t exact, std::vector<std::uint32_t>& path, std::vector<Step>& steps) {
+                 std::uint32_t exact, Cursor cursor, std::vector<Step>& steps) {
     const auto runEndOf = [&](std::uint32_t at) {
         while (at < types.size() && types[at] == table.closer) ++at;
         return at;
-    };
-    const auto takeState = [&]() -> const Recogniser::State& {
-        const std::uint32_t next = path.back();
-        path.pop_back();
-        return recogniser.state(next);
     };
     const std::size_t base = steps.size();
     std::uint32_t low = position, high = position;
@@ -59,10 +54,10 @@ void settleSteps(const ParserTable& table, const Recogniser& recogniser,
         const NodeRow& row = table.nodes[node];
         if (row.op == Op::End) break;
         if (row.op == Op::Choice) {
-            node = takeState().node;
+            node = derivation.choices[cursor.choice++];
             continue;
         }
-        Step step{node, low, high, 0, Recogniser::kNone, Recogniser::kNone};
+        Step step{node, low, high, 0, 0, 0};
         switch (row.op) {
             case Op::Token:
             case Op::Set:
@@ -79,11 +74,12 @@ void settleSteps(const ParserTable& table, const Recogniser& recogniser,
                 high = runEndOf(low);
                 break;
             case Op::Call: {
-                const Recogniser::State& back = takeState();
-                step.child = back.child;
-                step.childEnd = back.childEnd;
-                low = back.low;
-                high = back.high;
+                const Derivation::Part& part = derivation.parts[cursor.part];
+                step.part = cursor.part;
+                step.choice = cursor.choice;
+                low = part.low;
+                high = part.high;
+                cursor = {part.choices, part.parts};
                 break;
             }
             default:
@@ -92,7 +88,7 @@ void settleSteps(const ParserTable& table, const Recogniser& recogniser,
         steps.push_back(step);
         node = row.next;
     }
-    locate(table, recogniser, steps, base, exact);
+    locate(table, derivation, steps, base, exact);
 }
 
 }  // namespace zr::engine

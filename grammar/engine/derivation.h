@@ -6,35 +6,36 @@
 /// How a derivation is written down: what a search leaves and the tree builder reads.
 namespace zr::engine {
 
-/// A point of a path that the walk back needs: a branch taken, or a call that came back.
-struct PathState {
-    std::uint32_t low, high;
-    std::uint32_t before;  ///< state before it on the path
-    std::uint32_t child;   ///< entry whose end leads here, or kNone for a branch
-    std::uint32_t childEnd;
-    std::uint16_t node;  ///< where the path goes on
-};
-
-/// One end of an entry. Inside a run of closing tokens several ends stand for one: every position from
-/// `low` to `high` can be the end, and who of the optional closers took which is settled afterwards.
-struct PathEnd {
-    std::uint32_t low, high;
-    std::uint32_t state;   ///< last state of the path that leads here; kNone for tokens that were skipped
-    std::uint8_t stopped;  ///< tail loops that stopped here although a round could start
-    std::uint32_t next;    ///< next end of the same entry
-};
-
-/// A derivation by itself, without what the search for it knew besides.
+/// The choices and calls of a derivation, both in the order in which somebody who follows it from the first
+/// token on comes to them. All else is in the grammar.
 struct Derivation {
+    /// A call of a rule, the first one of all the whole. Inside a run of closing tokens several ends stand
+    /// for one: every position from `low` to `high` can be the end, and who of the optional closers took
+    /// which is settled afterwards.
     struct Part {
-        std::uint16_t rule;
-        std::uint32_t position;
-        bool recovered;  ///< stands for tokens that were skipped where its rule didn't parse
+        std::uint32_t outer;     ///< the part that calls it; of the whole its own
+        std::uint32_t position;  ///< where it starts
+        std::uint32_t low, high;
+        std::uint32_t choices, parts;  ///< what comes behind it in either list
+        std::uint16_t node;            ///< the Call; of the whole 0xFFFF
+        bool recovered;                ///< stands for tokens that were skipped where its rule didn't parse
     };
-    std::vector<Part> parts;  ///< the first one is the whole
-    std::vector<PathEnd> ends;
-    std::vector<PathState> states;
-    std::uint32_t endState = 0xFFFFFFFF;  ///< last state of the whole
+    std::uint16_t rule = 0;              ///< of the whole
+    std::vector<std::uint16_t> choices;  ///< the node that a Choice goes on at
+    std::vector<Part> parts;
+
+    void start(std::uint16_t startRule, std::uint32_t position) {
+        rule = startRule;
+        choices.clear();
+        parts.assign(1, {0, position, position, position, 0, 1, 0xFFFF, false});
+    }
+    /// The part at work is over.
+    void end(std::uint32_t part, std::uint32_t low, std::uint32_t high) {
+        parts[part].low = low;
+        parts[part].high = high;
+        parts[part].choices = static_cast<std::uint32_t>(choices.size());
+        parts[part].parts = static_cast<std::uint32_t>(parts.size());
+    }
 };
 
 }  // namespace zr::engine

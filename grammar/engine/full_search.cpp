@@ -206,51 +206,35 @@ std::uint64_t FullSearch::counted(const NodeRow& call, std::uint32_t p, std::uin
 // ---- the walk down
 
 FullSearch::Outcome FullSearch::writeDown(std::uint16_t rule, std::uint32_t position) {
-    made_->parts.clear();
-    made_->ends.clear();
-    made_->states.clear();
-    walks_.clear();
     Wanted whole;
     whole.few[whole.count++] = reached_;
-    startWalk(rule, position, whole);
-    while (!walks_.empty()) {
+    made_->start(rule, position);
+    walks_.assign(1, {0, whole, searchedFrom(*table_, table_->rules[rule].entry), position});
+    for (;;) {
         if (!walkOn(walks_.back())) {
             if (walks_.size() >= options_->maxDepth) return Outcome::TooDeep;
             continue;
         }
         const Walk ended = walks_.back();
         walks_.pop_back();
-        if (walks_.empty()) {
-            made_->endState = ended.state;
-            break;
-        }
-        comeBack(walks_.back(), ended.part, ended.position, ended.state);
+        if (walks_.empty()) break;
+        comeBack(walks_.back(), ended.part, ended.position);
     }
+    made_->end(0, reached_, reached_);
     return Outcome::Found;
 }
 
-void FullSearch::startWalk(std::uint16_t rule, std::uint32_t position, const Wanted& wanted) {
-    const auto part = static_cast<std::uint32_t>(made_->parts.size());
-    made_->parts.push_back({rule, position, false});
-    const std::uint16_t first = table_->rules[rule].entry;
-    const std::uint32_t state = addState(first, position, kNone, kNone, kNone);
-    walks_.push_back({part, wanted, searchedFrom(*table_, first), position, state});
-}
-
 /// The call that a walk stands at has read as far as `end`.
-void FullSearch::comeBack(Walk& walk, std::uint32_t part, std::uint32_t end, std::uint32_t state) {
-    const NodeRow& call = table_->nodes[walk.node];
-    const auto made = static_cast<std::uint32_t>(made_->ends.size());
-    made_->ends.push_back({end, end, state, 0, kNone});
-    walk.state = addState(call.next, end, walk.state, part, made);
-    walk.node = call.run;
+void FullSearch::comeBack(Walk& walk, std::uint32_t part, std::uint32_t end) {
+    made_->end(part, end, end);
+    walk.node = table_->nodes[walk.node].run;
     walk.position = end;
 }
 
-std::uint32_t FullSearch::addState(std::uint16_t node, std::uint32_t position, std::uint32_t before,
-                                   std::uint32_t part, std::uint32_t end) {
-    made_->states.push_back({position, position, before, part, end, node});
-    return static_cast<std::uint32_t>(made_->states.size()) - 1;
+/// Writes down that a walk comes to a call.
+std::uint32_t FullSearch::addPart(const Walk& walk, bool recovered) {
+    made_->parts.push_back({walk.part, walk.position, 0, 0, 0, 0, walk.node, recovered});
+    return static_cast<std::uint32_t>(made_->parts.size()) - 1;
 }
 
 /// Goes on until the path ends, which gives true, or needs the path of a call first.
@@ -271,19 +255,19 @@ bool FullSearch::walkOn(Walk& walk) {
                     mask &= mask - 1;
                 } while (mask != 0 &&
                          !leadsTo(setAt(searchedFrom(*table_, target), walk.position), walk.wanted));
-                walk.state = addState(target, walk.position, walk.state, kNone, kNone);
+                made_->choices.push_back(target);
                 walk.node = searchedFrom(*table_, target);
                 break;
             }
             case Op::Call: {
-                if (isSkipped(node, walk.position)) {
-                    const auto part = static_cast<std::uint32_t>(made_->parts.size());
-                    made_->parts.push_back({node.arg, walk.position, true});
-                    comeBack(walk, part, recovery_.to, kNone);
+                const bool skipped = isSkipped(node, walk.position);
+                const std::uint32_t part = addPart(walk, skipped);
+                if (skipped) {
+                    comeBack(walk, part, recovery_.to);
                     break;
                 }
-                const Wanted wanted = wantedBy(walk, node);
-                startWalk(node.arg, walk.position, wanted);
+                walks_.push_back({part, wantedBy(walk, node),
+                                  searchedFrom(*table_, table_->rules[node.arg].entry), walk.position});
                 return false;
             }
             case Op::Soft:

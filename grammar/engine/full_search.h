@@ -80,16 +80,13 @@ class FullSearch {
         Wanted wanted;
         std::uint16_t node;
         std::uint32_t position;
-        std::uint32_t state;
     };
 
     Outcome writeDown(std::uint16_t rule, std::uint32_t position);
-    void comeBack(Walk& walk, std::uint32_t part, std::uint32_t end, std::uint32_t state);
-    void startWalk(std::uint16_t rule, std::uint32_t position, const Wanted& wanted);
+    void comeBack(Walk& walk, std::uint32_t part, std::uint32_t end);
+    std::uint32_t addPart(const Walk& walk, bool recovered);
     bool walkOn(Walk& walk);
     Wanted wantedBy(const Walk& walk, const NodeRow& call);
-    std::uint32_t addState(std::uint16_t node, std::uint32_t position, std::uint32_t before,
-                           std::uint32_t part, std::uint32_t end);
 
     const ParserTable* table_ = nullptr;
     TextIndex* text_ = nullptr;

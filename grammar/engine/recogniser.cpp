@@ -21,9 +21,9 @@ Recogniser::~Recogniser() {
 }
 
 std::size_t Recogniser::Work::bytes() const {
-    return derivation.parts.capacity() * sizeof(Derivation::Part) + derivation.ends.capacity() * sizeof(End) +
-           derivation.states.capacity() * sizeof(State) + quick.calls.capacity() * sizeof(QuickSearch::Call) +
-           quick.points.capacity() * sizeof(QuickSearch::Point) + full.capacity();
+    return derivation.parts.capacity() * sizeof(Derivation::Part) +
+           derivation.choices.capacity() * sizeof(std::uint16_t) +
+           points.capacity() * sizeof(QuickSearch::Point) + full.capacity();
 }
 
 std::unique_ptr<Recogniser::Work>& Recogniser::spare() {
@@ -32,7 +32,7 @@ std::unique_ptr<Recogniser::Work>& Recogniser::spare() {
 }
 
 Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
-    QuickSearch quick(*table_, text_, *options_, work_->derivation, work_->quick);
+    QuickSearch quick(*table_, text_, *options_, work_->derivation, work_->points);
     const QuickSearch::Outcome outcome = quick.run(rule, position);
     steps_ += quick.steps();
     remembered_ = quick.remembered();
@@ -41,16 +41,13 @@ Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
     result.overLimit = outcome == QuickSearch::Outcome::TooDeep;
     if (result.overLimit) return result;
     result.found = true;
-    result.entry = 0;
-    result.endState = work_->derivation.endState;
-    result.low = quick.low();
     result.high = text_.count();
     return result;
 }
 
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
     const std::uint32_t place = recoveryPlace(*table_, text_, *options_, work_->full, rule, position);
-    if (place == kNone) return {};
+    if (place == Reach::kNone) return {};
     return fullSearch(rule, position, {place, skippedTo(*table_, text_, place)});
 }
 
@@ -73,9 +70,7 @@ Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t posi
         result.overLimit = outcome == FullSearch::Outcome::TooDeep;
         if (outcome != FullSearch::Outcome::Found) return result;
         result.found = true;
-        result.entry = 0;
-        result.endState = work_->derivation.endState;
-        result.low = result.high = work_->full.reached();
+        result.high = work_->full.reached();
         return result;
     }
 }

@@ -20,19 +20,12 @@ namespace zr::engine {
 
 class Recogniser {
  public:
-    using End = PathEnd;
-    using State = PathState;
-
     struct Result {
         bool found = false;
         bool overLimit = false;   ///< nesting deeper than the options allow: no derivation is given
         bool overBudget = false;  ///< only a first part of the text could be searched
-        std::uint32_t entry = kNone;
-        std::uint32_t endState = kNone;
-        std::uint32_t low = 0, high = 0;
+        std::uint32_t high = 0;   ///< where the derivation ends
     };
-
-    static constexpr std::uint32_t kNone = 0xFFFFFFFF;
 
     /// `types` holds the token numbers of the on-channel tokens without end of file; it must outlive this
     /// object.
@@ -50,13 +43,8 @@ class Recogniser {
     /// place where the statement itself asks for it, may stand for anything up to a token that can follow it.
     Result recover(std::uint16_t rule, std::uint32_t position);
 
-    // What the tree builder reads.
-    const State& state(std::uint32_t index) const { return work_->derivation.states[index]; }
-    std::uint16_t ruleOf(std::uint32_t entry) const { return work_->derivation.parts[entry].rule; }
-    std::uint32_t startOf(std::uint32_t entry) const { return work_->derivation.parts[entry].position; }
-    const End& end(std::uint32_t index) const { return work_->derivation.ends[index]; }
-    /// Whether the entry stands for tokens that were skipped where its rule didn't parse.
-    bool isRecovered(std::uint32_t entry) const { return work_->derivation.parts[entry].recovered; }
+    /// What was found last.
+    const Derivation& derivation() const { return work_->derivation; }
 
     /// Work done so far, in search steps; a benchmark figure.
     std::uint64_t steps() const { return steps_; }
@@ -68,7 +56,7 @@ class Recogniser {
     /// fresh memory for each text costs more than the search of a short one.
     struct Work {
         Derivation derivation;
-        QuickSearch::Work quick;
+        std::vector<QuickSearch::Point> points;
         FullSearch full;
         std::size_t bytes() const;
     };

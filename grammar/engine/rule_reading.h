@@ -62,8 +62,8 @@ RuleTree<typename Tree::Node> readRule(const GrammarTable& grammar, const std::v
     const Recogniser::Result& result = derivation.result();
     if (!result.found) return {tree.error(0, 0), true, 0};
 
-    TreeBuilder<Tree> builder(table, derivation.recogniser(), types, tree);
-    std::vector<typename Tree::Node>& roots = builder.build(result);
+    TreeBuilder<Tree> builder(table, derivation.recogniser().derivation(), types, tree);
+    std::vector<typename Tree::Node>& roots = builder.build();
     std::uint32_t end = result.high;
     if (rule == table.startRule) {
         const auto count = static_cast<std::uint32_t>(types.size());

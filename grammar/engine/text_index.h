@@ -64,9 +64,9 @@ class TextIndex {
         low = high;
         return true;
     }
-    /// Moves a place past what a node takes that is neither a Choice, a Call nor an End, and whatever stopped
-    /// there with it; says whether the node could take it.
-    bool take(const NodeRow& node, std::uint32_t& low, std::uint32_t& high, std::uint8_t& stopped) const {
+    /// Moves a place past what a node takes that is neither a Choice, a Call nor an End; says whether the
+    /// node could take it.
+    bool take(const NodeRow& node, std::uint32_t& low, std::uint32_t& high) const {
         switch (node.op) {
             case Op::Token:
             case Op::Set:
@@ -74,14 +74,12 @@ class TextIndex {
                 if (node.op == Op::Token ? type(low) != node.arg : !inSet(node.arg, classes_[low]))
                     return false;
                 high = ++low;
-                stopped = 0;
                 return true;
             case Op::Hard: {
                 const std::uint32_t run = runEnd(low);
                 if (low == run) return false;
                 ++low;
                 high = high + 1 < run ? high + 1 : run;
-                stopped = 0;
                 return true;
             }
             case Op::Soft: {
@@ -104,14 +102,6 @@ class TextIndex {
         std::uint32_t mask = masks[table_->classOf[table_->closer]];
         if (high == runEnd(low)) mask |= masks[classes_[high]];
         return mask;
-    }
-    /// What a branch does to the record of tail loops that stopped: leaving one although a round could start
-    /// is noted.
-    std::uint8_t stoppedAfter(const NodeRow& choice, std::uint32_t branch, std::uint32_t low,
-                              std::uint32_t high, std::uint8_t stopped) const {
-        if (choice.context == kNone16 || branch == 0 || high != runEnd(low)) return stopped;
-        if (!inSet(choice.guard, classes_[high])) return stopped;
-        return static_cast<std::uint8_t>(stopped | (1u << choice.context));
     }
 
  private:

@@ -5,10 +5,11 @@
 #include <vector>
 
 #include "grammar/engine/closer_steps.h"
+#include "grammar/engine/derivation.h"
 #include "grammar/engine/options.h"
-#include "grammar/engine/recogniser.h"
+#include "grammar/engine/tables.h"
 
-/// Builds the tree along the derivation that the recogniser chose.
+/// Builds the tree along the derivation that the recogniser found.
 namespace zr::engine {
 
 /// `Tree` makes the nodes, the runtime's or the engine's own:
@@ -25,9 +26,9 @@ class TreeBuilder {
     using Node = typename Tree::Node;
 
     /// `types` are the tokens that the recogniser saw.
-    TreeBuilder(const ParserTable& table, const Recogniser& recogniser,
+    TreeBuilder(const ParserTable& table, const Derivation& derivation,
                 const std::vector<std::uint16_t>& types, Tree& tree)
-        : table_(table), recogniser_(recogniser), types_(types), tree_(tree) {
+        : table_(table), derivation_(derivation), types_(types), tree_(tree) {
         work_.swap(spare());
     }
     ~TreeBuilder() {
@@ -39,15 +40,16 @@ class TreeBuilder {
     TreeBuilder& operator=(const TreeBuilder&) = delete;
 
     /// The roots that the derivation yields, in order: one for a rule with a root, several for a list.
-    std::vector<Node>& build(const Recogniser::Result& result);
+    std::vector<Node>& build();
 
  private:
-    /// An entry whose path is being walked. As long as every place on it is one position, the path is
-    /// followed as it stands; where places become intervals, the rest of it is settled first.
+    /// A part that is being walked. As long as every place in it is one position, it is followed as it
+    /// stands; where places become intervals, the rest of it is settled first.
     struct Frame {
-        std::uint16_t node;  ///< where the path goes on; kNone16 once its steps are settled
+        std::uint16_t node;  ///< where it goes on; kNone16 once its steps are settled
         std::uint32_t at;    ///< position there
-        std::uint32_t end;   ///< where the entry ends
+        std::uint32_t end;   ///< where the part ends
+        std::uint32_t part;
         std::uint32_t nextStep, stepsBase;
     };
 
@@ -61,26 +63,22 @@ class TreeBuilder {
     /// What grows with a text; a thread keeps that of its last tree for the next one.
     struct Work {
         std::vector<Frame> frames;
-        std::vector<std::uint32_t> path;  ///< states still to come, of all frames, the next one last
         std::vector<Step> steps;
         std::vector<Scope> scopes;
         std::vector<Node> values;
 
         std::size_t bytes() const {
-            return frames.capacity() * sizeof(Frame) + path.capacity() * sizeof(std::uint32_t) +
-                   steps.capacity() * sizeof(Step) + scopes.capacity() * sizeof(Scope) +
-                   values.capacity() * sizeof(Node);
+            return frames.capacity() * sizeof(Frame) + steps.capacity() * sizeof(Step) +
+                   scopes.capacity() * sizeof(Scope) + values.capacity() * sizeof(Node);
         }
         void clear() {
             frames.clear();
-            path.clear();
             steps.clear();
             scopes.clear();
             values.clear();
         }
         void swap(Work& other) {
             frames.swap(other.frames);
-            path.swap(other.path);
             steps.swap(other.steps);
             scopes.swap(other.scopes);
             values.swap(other.values);
@@ -91,16 +89,11 @@ class TreeBuilder {
         return mine;
     }
 
-    void open(std::uint32_t entry, std::uint32_t endState, std::uint32_t end);
+    void open(std::uint32_t part, std::uint16_t rule, std::uint32_t end);
     void walk();
     void walkSettled();
     void settle();
-    void call(Mark mark, std::uint32_t from, std::uint32_t to, std::uint32_t child, std::uint32_t childEnd);
-    std::uint32_t takeState() {
-        const std::uint32_t state = work_.path.back();
-        work_.path.pop_back();
-        return state;
-    }
+    void call(const NodeRow& node, std::uint32_t from, std::uint32_t to);
     bool isCloserAt(std::uint32_t position) const {
         return position < types_.size() && types_[position] == table_.closer;
     }
@@ -116,17 +109,20 @@ class TreeBuilder {
     std::uint32_t valueCount() const { return static_cast<std::uint32_t>(work_.values.size()); }
 
     const ParserTable& table_;
-    const Recogniser& recogniser_;
+    const Derivation& derivation_;
     const std::vector<std::uint16_t>& types_;
     Tree& tree_;
     Work work_;
+    Cursor cursor_{0, 0};
     std::uint32_t dropped_ = 0;  ///< scopes at work whose tree is left out
 };
 
 template <class Tree>
-std::vector<typename Tree::Node>& TreeBuilder<Tree>::build(const Recogniser::Result& result) {
-    openScope(Mark::None, recogniser_.startOf(result.entry));
-    open(result.entry, result.endState, result.high);
+std::vector<typename Tree::Node>& TreeBuilder<Tree>::build() {
+    const Derivation::Part& whole = derivation_.parts[0];
+    cursor_ = {0, 1};
+    openScope(Mark::None, whole.position);
+    open(0, derivation_.rule, whole.high);
     while (!work_.frames.empty()) {
         if (work_.frames.back().node == kNone16)
             walkSettled();
@@ -137,13 +133,11 @@ std::vector<typename Tree::Node>& TreeBuilder<Tree>::build(const Recogniser::Res
 }
 
 template <class Tree>
-void TreeBuilder<Tree>::open(std::uint32_t entry, std::uint32_t endState, std::uint32_t end) {
-    for (std::uint32_t s = endState; s != Recogniser::kNone; s = recogniser_.state(s).before)
-        work_.path.push_back(s);
-    work_.frames.push_back({recogniser_.state(takeState()).node, recogniser_.startOf(entry), end, 0, 0});
+void TreeBuilder<Tree>::open(std::uint32_t part, std::uint16_t rule, std::uint32_t end) {
+    work_.frames.push_back({table_.rules[rule].entry, derivation_.parts[part].position, end, part, 0, 0});
 }
 
-/// Goes on with the entry opened last until it has ended or opened another one.
+/// Goes on with the part opened last until it has ended or opened another one.
 template <class Tree>
 void TreeBuilder<Tree>::walk() {
     Frame& frame = work_.frames.back();
@@ -154,7 +148,7 @@ void TreeBuilder<Tree>::walk() {
         const NodeRow& node = nodes[at];
         switch (node.op) {
             case Op::Choice:
-                at = recogniser_.state(takeState()).node;
+                at = derivation_.choices[cursor_.choice++];
                 continue;
             case Op::Token:
             case Op::Set:
@@ -177,16 +171,15 @@ void TreeBuilder<Tree>::walk() {
                 frame.at = position;
                 return settle();
             case Op::Call: {
-                const Recogniser::State& back = recogniser_.state(work_.path.back());
-                if (back.low != back.high) {
+                const Derivation::Part& part = derivation_.parts[cursor_.part];
+                if (part.low != part.high) {
                     frame.node = at;
                     frame.at = position;
                     return settle();
                 }
-                work_.path.pop_back();
                 frame.node = node.next;
-                frame.at = back.high;
-                return call(node.mark, position, back.high, back.child, back.childEnd);
+                frame.at = part.high;
+                return call(node, position, part.high);
             }
             case Op::End:
                 work_.frames.pop_back();
@@ -200,7 +193,7 @@ template <class Tree>
 void TreeBuilder<Tree>::settle() {
     Frame& frame = work_.frames.back();
     frame.stepsBase = frame.nextStep = static_cast<std::uint32_t>(work_.steps.size());
-    settleSteps(table_, recogniser_, types_, frame.node, frame.at, frame.end, work_.path, work_.steps);
+    settleSteps(table_, derivation_, types_, frame.node, frame.at, frame.end, cursor_, work_.steps);
     frame.node = kNone16;
 }
 
@@ -230,23 +223,25 @@ void TreeBuilder<Tree>::walkSettled() {
                 root(node);
                 break;
             case Op::Call:
-                return call(node.mark, step.at, step.high, step.child, step.childEnd);
+                cursor_ = {step.choice, step.part};
+                return call(node, step.at, step.high);
             default:
                 break;
         }
     }
     const std::uint32_t end = frame.end;
+    cursor_ = {derivation_.parts[frame.part].choices, derivation_.parts[frame.part].parts};
     work_.steps.resize(frame.stepsBase);
     work_.frames.pop_back();
     closeScope(end);
 }
 
+/// Enters the part that comes next.
 template <class Tree>
-void TreeBuilder<Tree>::call(Mark mark, std::uint32_t from, std::uint32_t to, std::uint32_t child,
-                             std::uint32_t childEnd) {
-    openScope(mark, from);
-    const std::uint32_t endState = recogniser_.end(childEnd).state;
-    if (endState != Recogniser::kNone) return open(child, endState, to);
+void TreeBuilder<Tree>::call(const NodeRow& node, std::uint32_t from, std::uint32_t to) {
+    const std::uint32_t part = cursor_.part++;
+    openScope(node.mark, from);
+    if (!derivation_.parts[part].recovered) return open(part, node.arg, to);
     work_.values.push_back(tree_.error(from, to));
     closeScope(from);
 }
