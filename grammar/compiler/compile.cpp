@@ -25,7 +25,6 @@ void compile(const Inputs& inputs, const Output& output, std::ostream* report) {
     if (report)
         *report << grammar.name << ": " << grammar.rules.size() << " rules, " << program.nodes.size()
                 << " nodes, " << program.classes << " token classes, " << program.guards.size() << " guards, "
-                << program.tailLoops.size() << " tail loops, " << program.contexts.size() << " contexts, "
                 << lexerProgram.accept.size() << " lexer states, closer " << closer
                 << (why.empty() ? "" : "; refused as closer:" + why) << "\n";
     if (!output.sourceFile.empty())

@@ -257,13 +257,7 @@ class Emitter {
                 seconds.push_back(found->second);
             }
         }
-        std::vector<int> contextSets;
-        for (const CallContext& c : program_.contexts) {
-            for (const auto& s : c.other) contextSets.push_back(classSet(s));
-            contextSets.push_back(classSet(c.any));
-        }
         const int recoverFollow = classSet(program_.recoverFollow);
-        const int owing = program_.owing.empty() ? 0xFFFF : classSet(program_.owing);
 
         std::vector<std::pair<std::size_t, std::size_t>> choices;
         std::vector<int> targets;
@@ -293,16 +287,9 @@ class Emitter {
                 }
             }
             o << "    {Op::" << op << ", Mark::" << marks[static_cast<int>(n.mark)] << ", "
-              << (n.behindCall ? 1 : 0) + (n.nonEmpty ? 2 : 0) + (n.isTailLoop ? 4 : 0) << ", " << arg << ", "
+              << (n.behindCall ? 1 : 0) + (n.nonEmpty ? 2 : 0) << ", " << arg << ", "
               << (n.next < 0 ? 0xFFFF : n.next) << ", " << (n.run < 0 ? 0xFFFF : n.run) << ", "
-              << (n.tailLoop >= 0 ? classSet(n.roundFirst)
-                  : n.guard < 0   ? 0xFFFF
-                                  : n.guard)
-              << ", " << std::max(n.required, 0) << ", "
-              << (n.op == Op::Choice ? (n.tailLoop < 0 ? 0xFFFF : n.tailLoop)
-                  : n.context < 0    ? 0xFFFF
-                                     : n.context)
-              << "},\n";
+              << (n.guard < 0 ? 0xFFFF : n.guard) << ", " << std::max(n.required, 0) << "},\n";
         }
         o << "};\n";
         o << "const RuleRow rules[] = {\n";
@@ -334,9 +321,6 @@ class Emitter {
         array(o, "GuardRow", "guards", guards,
               [&](const auto& g) { o << "{" << g[0] << ", " << g[1] << ", " << g[2] << "}"; });
         array(o, "std::uint16_t", "seconds", seconds, [&](int s) { o << s; });
-        array(o, "std::uint16_t", "contextSets", contextSets, [&](int s) { o << s; });
-        array(o, "std::uint8_t", "contextFlags", program_.contexts,
-              [&](const CallContext& c) { o << c.canEnd + 2 * c.closing; });
         const auto number = [&](const char* name) {
             const auto found = vocabulary_.numberOf.find(name);
             return found == vocabulary_.numberOf.end() ? 0 : found->second;
@@ -348,9 +332,8 @@ class Emitter {
           << vocabulary_.maxNumber << ", classSets, " << firstBase << ", " << openers << ", " << recoverFollow
           << ", guards, " << guards.size() << ", " << std::max(program_.closer, 0) << ", " << parser_.start
           << ", " << parser_.statement << ", " << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule)
-          << ", " << left << ", " << right << ", " << owing << ", " << parser_.keepTail << ", seconds, "
-          << program_.tailLoops.size() << ", contextSets, contextFlags, " << program_.contexts.size() << ", "
-          << program_.stops << ", calls, callsFrom};\n\n";
+          << ", " << left << ", " << right << ", " << parser_.keepTail << ", seconds, " << program_.stops
+          << ", calls, callsFrom};\n\n";
     }
 
     void contexts(std::ostream& o) const {

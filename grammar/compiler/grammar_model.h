@@ -123,13 +123,7 @@ struct ParserGrammar {
     int recoverRule = -1;         ///< mandatory part that an error node may stand in for, or -1
     std::vector<int> entryRules;  ///< rules that hosts call and no other rule does
     int islandRule = -1;          ///< rule that every nested statement goes through, or -1
-    /// See the notation: declining an optional part of `rule` at `token` counts as the loop of `loopRule`
-    /// stopping.
-    struct Declined {
-        int rule, token, loopRule;
-    };
-    std::vector<Declined> declined;
-    int islandToken = -1;  ///< the token it can't do without and that nothing else takes
+    int islandToken = -1;         ///< the token it can't do without and that nothing else takes
 };
 
 }  // namespace zr::gc

@@ -196,7 +196,6 @@ class Lowering {
                 break;
         }
         const int loop = add(Node(Op::Choice));
-        program_.loops.push_back(loop);
         const int round = once(e, loop, outer, true);
         node(loop).targets = {round, next};
         return e.repeat == Repeat::Star ? loop : round;

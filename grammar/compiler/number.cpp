@@ -103,8 +103,6 @@ void numberNodes(Program& p, const Facts& facts, int recoverRule) {
     }
     p.nodes = std::move(nodes);
     for (int& entry : p.entry) renumber(entry);
-    for (int& loop : p.loops) renumber(loop);
-    for (TailLoop& loop : p.tailLoops) renumber(loop.node);
 }
 
 }  // namespace zr::gc

@@ -32,14 +32,10 @@ Program lower(const ParserGrammar& grammar, const Facts& facts);
 /// the grammar doesn't allow it. Fills the reason why not.
 int findCloser(const ParserGrammar& grammar, const Facts& facts, const Program& program, std::string& why);
 
-/// Tokens of which a rule has taken one by itself for every closer that it must take: openers, and where a
-/// rule does without them what else it can't do without. Empty when the grammar has no such tokens.
-std::set<int> owingTokens(const Program& program);
-
 /// Turns plain optional nodes of the closer into Soft nodes.
 void applyCloser(Program& program, int closer);
 
-/// FIRST sets, merge points, guards, token classes: everything the tables hold that follows from the nodes.
+/// FIRST sets, guards, token classes: everything the tables hold that follows from the nodes.
 void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts, int maxToken);
 
 /// Puts the nodes that a search stops at first, each behind those that can come after it without a token in

@@ -37,12 +37,8 @@ struct Node {
     bool behindCall = false;  ///< a call goes on here
     bool canEnd = false;
     std::set<int> first;
-    int guard = -1;            ///< Call: index into guards, or -1
-    int required = -1;         ///< Call: a token that must still come behind it, or -1
-    int context = -1;          ///< Call: index into contexts
-    bool isTailLoop = false;   ///< Choice: the tail loop itself, not something declined like a round of it
-    int tailLoop = -1;         ///< Choice: index into tailLoops, or -1
-    std::set<int> roundFirst;  ///< Choice of a tail loop: what a round that it declines could start with
+    int guard = -1;     ///< Call: index into guards, or -1
+    int required = -1;  ///< Call: a token that must still come behind it, or -1
 };
 
 /// What must be in the text for a Call to be worth running: a token of `follow` right behind a token of
@@ -52,39 +48,17 @@ struct Guard {
     bool operator==(const Guard&) const = default;
 };
 
-/// A loop at the end of a recursive rule whose rounds start with a rule, such as the arguments of a call that
-/// needs neither commas nor its closing parenthesis. Where such a loop stops although a round could start,
-/// the same loop further out must not start one there: the inner one would have come first
-/// (docs/recogniser.md).
-struct TailLoop {
-    int node;             ///< its Choice: round, exit
-    std::set<int> first;  ///< what a round starts with
-};
-
-/// What the rule around a Call can take right behind it.
-struct CallContext {
-    std::vector<std::set<int>> other;  ///< by tail loop: something other than that loop
-    std::set<int> any;                 ///< anything in it
-    bool canEnd;                       ///< the rule around the call can end behind it
-    bool closing;                      ///< a closer that must stand can come behind it
-    bool operator==(const CallContext&) const = default;
-};
-
 struct Program {
     std::vector<Node> nodes;
     int stops = 0;           ///< nodes that a search stops at: they stand first, see numberNodes()
     std::vector<int> entry;  ///< by rule: first node
     std::vector<std::set<int>> sets;
     std::vector<Guard> guards;
-    std::vector<int> loops;  ///< Choice nodes of all repetitions
-    std::vector<TailLoop> tailLoops;
-    std::vector<CallContext> contexts;
     /// By rule, by token that it starts with: what can come second, kEof standing for "anything, the rule may
     /// be over". Told apart no finer than token classes are.
     std::vector<std::map<int, std::set<int>>> second;
     int closer = -1;
-    int opener = -1;      ///< the left parenthesis
-    std::set<int> owing;  ///< see owingTokens()
+    int opener = -1;  ///< the left parenthesis
     std::set<int> recoverFollow;
     std::vector<int> classOf;  ///< by token number
     int classes = 0;

@@ -21,10 +21,10 @@ class ParserReader {
     }
 
     struct Words {
-        std::string rule, token, loopRule, file;
+        std::string rule, file;
         int line;
     };
-    std::vector<Words> declined, entries;
+    std::vector<Words> entries;
     std::string start, recover, island, islandToken;
     int startLine = 0, recoverLine = 0, islandLine = 0;
 
@@ -55,11 +55,8 @@ class ParserReader {
         } else if (word == "recover") {
             recover = in_.expectName();
             recoverLine = line;
-        } else if (word == "declined") {
-            Words words{in_.expectName(), in_.expectName(), in_.expectName(), in_.file(), line};
-            declined.push_back(std::move(words));
         } else if (word == "entry") {
-            entries.push_back({in_.expectName(), "", "", in_.file(), line});
+            entries.push_back({in_.expectName(), in_.file(), line});
         } else if (word == "island") {
             island = in_.expectName();
             islandToken = in_.next().text;
@@ -211,11 +208,10 @@ ParserGrammar readParser(const std::vector<std::string>& paths, const Vocabulary
         std::string name, token, file;
         int line = 0;
     } start, recover, island;
-    std::vector<ParserReader::Words> declined, entries;
+    std::vector<ParserReader::Words> entries;
     for (const std::string& path : paths) {
         ParserReader reader(Cursor(path, scan(path, readFile(path))), vocabulary, grammar);
         reader.read();
-        declined.insert(declined.end(), reader.declined.begin(), reader.declined.end());
         entries.insert(entries.end(), reader.entries.begin(), reader.entries.end());
         if (!reader.start.empty()) start = {reader.start, "", path, reader.startLine};
         if (!reader.recover.empty()) recover = {reader.recover, "", path, reader.recoverLine};
@@ -231,13 +227,6 @@ ParserGrammar readParser(const std::vector<std::string>& paths, const Vocabulary
     grammar.start = find(start, "start");
     if (!recover.name.empty()) grammar.recoverRule = find(recover, "recover");
     for (const auto& e : entries) grammar.entryRules.push_back(find({e.rule, "", e.file, e.line}, "entry"));
-    for (const auto& d : declined) {
-        const auto number = vocabulary.numberOf.find(d.token);
-        if (number == vocabulary.numberOf.end())
-            throw GrammarError(d.file, d.line, "token " + d.token + " is not in the vocabulary");
-        grammar.declined.push_back({find({d.rule, "", d.file, d.line}, "declined"), number->second,
-                                    find({d.loopRule, "", d.file, d.line}, "declined")});
-    }
     if (!island.name.empty()) {
         grammar.islandRule = find(island, "island");
         const auto number = vocabulary.numberOf.find(island.token);

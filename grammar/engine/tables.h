@@ -7,7 +7,7 @@
 /// engine never runs tables of another layout.
 namespace zr::engine {
 
-constexpr std::uint32_t kTableVersion = 6;
+constexpr std::uint32_t kTableVersion = 7;
 
 constexpr std::uint16_t kNone16 = 0xFFFF;
 
@@ -74,19 +74,16 @@ enum class Mark : std::uint8_t { None, Drop, Root };
 struct NodeRow {
     Op op;
     Mark mark;
-    std::uint8_t flags;  ///< NodeFlags
-    std::uint16_t arg;   ///< token number, set, rule (of a Call or an End), choice
-    std::uint16_t next;  ///< next node of the path
-    std::uint16_t run;   ///< next node that the recogniser stops at
-    std::uint16_t
-        guard;  ///< Call: guard or kNone16; Choice of a tail loop: class set that a round starts with
+    std::uint8_t flags;      ///< NodeFlags
+    std::uint16_t arg;       ///< token number, set, rule (of a Call or an End), choice
+    std::uint16_t next;      ///< next node of the path
+    std::uint16_t run;       ///< next node that the recogniser stops at
+    std::uint16_t guard;     ///< Call: guard or kNone16
     std::uint16_t required;  ///< Call: a token number that must still come, 0 for none
-    std::uint16_t context;   ///< Call: context; Choice: tail loop; or kNone16
 };
 
 enum NodeFlags : std::uint8_t {
     kBehindCall = 1,  ///< a Call goes on here
-    kLoop = 4,        ///< Choice of a tail loop that is the loop itself: its first branch is a round
     kNonEmpty = 2,    ///< Call: only results that take a token count
 };
 
@@ -129,18 +126,9 @@ struct ParserTable {
     std::uint16_t startRule, statementRule;
     std::uint16_t recoverRule;            ///< rule or kNone16
     std::uint16_t leftParen, rightParen;  ///< token numbers for "the same parenthesis depth", 0 for none
-    /// Class set of tokens of which a rule took one by itself for every closer that it must take, or kNone16.
-    std::uint16_t owing;
     std::uint8_t keepTail;
     /// [rule * classes + class of the first token]: class set of what can come second, kNone16 for anything.
     const std::uint16_t* seconds;
-    std::uint32_t loopCount;  ///< tail loops, at most 8
-    // By call context: for each tail loop the class set of what something else than the loop can take there,
-    // then that of what anything of the rule around the call can take; and whether that rule can end behind
-    // the call (1) and a closer that must stand can come (2).
-    const std::uint16_t* contextSets;
-    const std::uint8_t* contextFlags;
-    std::uint32_t contextCount;
     /// Nodes that a search stops at. They stand first, each behind those that can come after it without a
     /// token in between.
     std::uint32_t stops;
