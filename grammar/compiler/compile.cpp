@@ -21,7 +21,7 @@ void compile(const Inputs& inputs, const Output& output, std::ostream* report) {
         if (const auto found = vocabulary.numberOf.find(name); found != vocabulary.numberOf.end())
             program.opener = found->second;
     analyse(program, grammar, facts, vocabulary.maxNumber);
-    numberNodes(program, facts, grammar.recoverRule);
+    numberNodes(program, facts, grammar);
     if (report)
         *report << grammar.name << ": " << grammar.rules.size() << " rules, " << program.nodes.size()
                 << " nodes, " << program.classes << " token classes, " << program.guards.size() << " guards, "

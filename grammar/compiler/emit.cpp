@@ -297,19 +297,6 @@ class Emitter {
             o << "    {" << cString(parser_.rules[r].name) << ", " << program_.entry[r] << ", "
               << nullableOf[r] << "},\n";
         o << "};\n";
-        std::vector<std::vector<int>> callers(parser_.rules.size());
-        for (std::size_t i = 0; i < program_.nodes.size(); ++i)
-            if (program_.nodes[i].op == Op::Call)
-                callers[index(program_.nodes[i].arg)].push_back(static_cast<int>(i));
-        std::vector<int> calls;
-        std::vector<std::size_t> callsFrom;
-        for (const auto& ofRule : callers) {
-            callsFrom.push_back(calls.size());
-            calls.insert(calls.end(), ofRule.begin(), ofRule.end());
-        }
-        callsFrom.push_back(calls.size());
-        array(o, "std::uint16_t", "calls", calls, [&](int c) { o << c; });
-        array(o, "std::uint32_t", "callsFrom", callsFrom, [&](std::size_t c) { o << c; });
         array(o, "ChoiceRow", "choices", choices,
               [&](const auto& c) { o << "{" << c.first << ", " << c.second << "}"; });
         array(o, "std::uint16_t", "targets", targets, [&](int t) { o << t; });
@@ -333,7 +320,7 @@ class Emitter {
           << ", guards, " << guards.size() << ", " << std::max(program_.closer, 0) << ", " << parser_.start
           << ", " << parser_.statement << ", " << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule)
           << ", " << left << ", " << right << ", " << parser_.keepTail << ", seconds, " << program_.stops
-          << ", calls, callsFrom};\n\n";
+          << ", " << program_.statementStops << "};\n\n";
     }
 
     void contexts(std::ostream& o) const {

@@ -1,5 +1,6 @@
 #include <algorithm>
 #include <functional>
+#include <set>
 
 #include "grammar/compiler/error.h"
 #include "grammar/compiler/passes.h"
@@ -7,14 +8,17 @@
 namespace zr::gc {
 namespace {
 
-/// A rule is inlined where it is called when it is small and doesn't come back to itself: its calls then need
-/// no entry in the recogniser's memo. Anything larger is memoised, so nothing is read twice at one place.
+/// A rule is inlined where it is called when it is small and doesn't come back to itself, or when only one
+/// place calls it: a call costs the searches more than the nodes do.
 constexpr int kInlineNodes = 60;
 
 class Lowering {
  public:
-    Lowering(const ParserGrammar& grammar, const Facts& facts) : grammar_(grammar), facts_(facts) {
+    /// `calledOnce` are inlined whatever their size.
+    Lowering(const ParserGrammar& grammar, const Facts& facts, const std::set<int>& calledOnce)
+        : grammar_(grammar), facts_(facts) {
         chooseInlined();
+        for (int rule : calledOnce) inlined_[static_cast<std::size_t>(rule)] = true;
     }
 
     Program run() {
@@ -239,10 +243,43 @@ class Lowering {
     std::vector<bool> inlined_;
 };
 
+/// Rules that one place alone calls in what the statement can come to.
+std::set<int> rulesCalledOnce(const ParserGrammar& grammar, const Facts& facts, const Program& program) {
+    std::vector<int> places(grammar.rules.size(), 0);
+    std::vector<bool> met(program.nodes.size(), false);
+    std::vector<int> open{program.entry[static_cast<std::size_t>(grammar.statement)]};
+    while (!open.empty()) {
+        const auto at = static_cast<std::size_t>(open.back());
+        open.pop_back();
+        if (met[at]) continue;
+        met[at] = true;
+        const Node& node = program.nodes[at];
+        open.insert(open.end(), node.targets.begin(), node.targets.end());
+        if (node.next >= 0) open.push_back(node.next);
+        if (node.op != Op::Call) continue;
+        ++places[static_cast<std::size_t>(node.arg)];
+        open.push_back(program.entry[static_cast<std::size_t>(node.arg)]);
+    }
+    std::set<int> once;
+    for (std::size_t i = 0; i < places.size(); ++i) {
+        const int rule = static_cast<int>(i);
+        if (places[i] == 1 && !facts.nullable[i] && rule != grammar.recoverRule &&
+            rule != grammar.statement && rule != grammar.islandRule)
+            once.insert(rule);
+    }
+    return once;
+}
+
 }  // namespace
 
 Program lower(const ParserGrammar& grammar, const Facts& facts) {
-    return Lowering(grammar, facts).run();
+    std::set<int> calledOnce;
+    for (;;) {
+        Program program = Lowering(grammar, facts, calledOnce).run();
+        const std::set<int> more = rulesCalledOnce(grammar, facts, program);
+        if (more.empty()) return program;
+        calledOnce.insert(more.begin(), more.end());
+    }
 }
 
 }  // namespace zr::gc

@@ -31,24 +31,30 @@ std::vector<int> withoutToken(const Program& p, const Facts& facts, int recoverR
     return to;
 }
 
-/// The nodes that a search stops at and can come to, each behind those that withoutToken() names.
-std::vector<int> inOrder(const Program& p, const Facts& facts, int recoverRule) {
+/// The nodes that a search stops at and can come to, those of the statement first, each behind those that
+/// withoutToken() names. `ofStatement` is how many these are.
+std::vector<int> inOrder(const Program& p, const Facts& facts, const ParserGrammar& grammar,
+                         int& ofStatement) {
     struct Open {
         int node;
         std::vector<int> behind;
     };
     std::vector<int> order;
     std::vector<bool> met(p.nodes.size(), false);
-    std::vector<int> starts;
-    for (int entry : p.entry) starts.push_back(p.skip(entry));
-    while (!starts.empty()) {
+    std::vector<int> starts{p.skip(p.entry[index(grammar.statement)])};
+    ofStatement = 0;
+    while (!starts.empty() || ofStatement == 0) {
+        if (starts.empty()) {
+            ofStatement = static_cast<int>(order.size());
+            for (int entry : p.entry) starts.push_back(p.skip(entry));
+        }
         const int start = starts.back();
         starts.pop_back();
         std::vector<Open> open;
         const auto enter = [&](int node) {
             if (met[index(node)]) return;
             met[index(node)] = true;
-            open.push_back({node, withoutToken(p, facts, recoverRule, p.nodes[index(node)])});
+            open.push_back({node, withoutToken(p, facts, grammar.recoverRule, p.nodes[index(node)])});
         };
         enter(start);
         while (!open.empty()) {
@@ -69,8 +75,8 @@ std::vector<int> inOrder(const Program& p, const Facts& facts, int recoverRule) 
 
 }  // namespace
 
-void numberNodes(Program& p, const Facts& facts, int recoverRule) {
-    std::vector<int> order = inOrder(p, facts, recoverRule);
+void numberNodes(Program& p, const Facts& facts, const ParserGrammar& grammar) {
+    std::vector<int> order = inOrder(p, facts, grammar, p.statementStops);
     p.stops = static_cast<int>(order.size());
     std::vector<int> open(p.entry.begin(), p.entry.end());
     std::vector<bool> used(p.nodes.size(), false);

@@ -38,9 +38,10 @@ void applyCloser(Program& program, int closer);
 /// FIRST sets, guards, token classes: everything the tables hold that follows from the nodes.
 void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts, int maxToken);
 
-/// Puts the nodes that a search stops at first, each behind those that can come after it without a token in
-/// between; those that only shape the tree follow. What nothing leads to goes.
-void numberNodes(Program& program, const Facts& facts, int recoverRule);
+/// Puts the nodes that a search stops at first, those of the statement in front, each behind those that can
+/// come after it without a token in between; those that only shape the tree follow. What nothing leads to
+/// goes.
+void numberNodes(Program& program, const Facts& facts, const ParserGrammar& grammar);
 
 /// Lexer: one automaton for the longest match over all rules, and one program a rule for single-rule calls.
 LexerProgram buildLexer(const LexerGrammar& grammar);

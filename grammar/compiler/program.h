@@ -51,6 +51,7 @@ struct Guard {
 struct Program {
     std::vector<Node> nodes;
     int stops = 0;           ///< nodes that a search stops at: they stand first, see numberNodes()
+    int statementStops = 0;  ///< those among them, in front, that the statement can come to
     std::vector<int> entry;  ///< by rule: first node
     std::vector<std::set<int>> sets;
     std::vector<Guard> guards;

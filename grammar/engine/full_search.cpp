@@ -86,7 +86,7 @@ bool FullSearch::findSets(std::uint32_t position, std::uint32_t end) {
     byVertex_.reserve(reach_.keptCount());
     vertexFrom_.assign(end - position + 1, 0);
     vertexBefore_.assign((end - position + 1) * rowWords, 0);
-    behind_.start(sets_, table_->stops);
+    behind_.start(sets_, reach_.nodes());
     starts_.start();
     for (std::uint32_t p = end + 1; p-- > position;) {
         const std::uint64_t* row = reach_.keptAt(p);

@@ -12,7 +12,7 @@
 #include "grammar/engine/tables.h"
 #include "grammar/engine/text_index.h"
 
-/// The search that never turns back, for texts on which the lazy one (recogniser.h) asks for too much.
+/// The search that never turns back, for texts that the quick one (quick_search.h) gives up.
 ///
 /// It goes through the text once from its end to its beginning and finds, for every node that Reach leaves
 /// (reach.h) and every position, the set of all ends that the node's rule can come to from there. What lies

@@ -9,7 +9,6 @@ void Reach::start(const ParserTable& table, TextIndex& text, const Recovery& rec
     table_ = &table;
     text_ = &text;
     recovery_ = recovery;
-    words_ = (table.stops + 63) / 64;
 }
 
 std::size_t Reach::bytes() const {
@@ -57,9 +56,12 @@ void Reach::follow(std::uint16_t rule, std::uint32_t position) {
     rule_ = rule;
     from_ = position;
     end_ = text_->count();
+    const std::uint16_t entry = searchedFrom(*table_, table_->rules[rule].entry);
+    nodes_ = entry < table_->statementStops ? table_->statementStops : table_->stops;
+    words_ = (nodes_ + 63) / 64;
     met_.assign(words_, 0);
-    metAt_.assign(table_->stops, kNone);
-    callBefore_.assign(table_->stops, kNone16);
+    metAt_.assign(nodes_, kNone);
+    callBefore_.assign(nodes_, kNone16);
     called_.assign(table_->ruleCount, kNone16);
     endedAt_.assign(table_->ruleCount, kNone);
     endOf_.assign(table_->ruleCount, kNone16);
@@ -69,7 +71,7 @@ void Reach::follow(std::uint16_t rule, std::uint32_t position) {
     stepsFrom_.clear();
     skips_.clear();
     ends_.clear();
-    meet(searchedFrom(*table_, table_->rules[rule].entry));
+    meet(entry);
     for (std::uint32_t p = position; p <= end_; ++p) {
         const std::size_t ahead = stepsFrom_.empty() ? 0 : stepsFrom_.back();
         beginPosition();
@@ -182,8 +184,8 @@ void Reach::keep(std::uint32_t first, std::uint32_t last) {
     end_ = last;
     kept_.assign((last - from_ + 1) * words_, 0);
     keptCount_ = 0;
-    returns_.assign(table_->stops, 0);
-    wayTo_.assign(table_->stops, kNone);
+    returns_.assign(nodes_, 0);
+    wayTo_.assign(nodes_, kNone);
     for (std::uint32_t p = last + 1; p-- > from_;) {
         const std::uint32_t here = p - from_;
         std::uint64_t* row = kept_.data() + here * words_;

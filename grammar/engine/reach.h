@@ -29,7 +29,7 @@ class Reach {
 
     /// What looking at so many tokens takes at least, nearly all of it for the nodes that are kept.
     static std::size_t bytesFor(const ParserTable& table, std::size_t tokens) {
-        return (tokens + 1) * ((table.stops + 63) / 64) * sizeof(std::uint64_t);
+        return (tokens + 1) * ((table.statementStops + 63) / 64) * sizeof(std::uint64_t);
     }
 
     /// Finds what `rule` can pass from `position` on.
@@ -48,6 +48,8 @@ class Reach {
         return kept_.data() + (position - from_) * words_;
     }
     std::size_t words() const { return words_; }
+    /// Nodes that the followed rule can come to have lower numbers.
+    std::uint32_t nodes() const { return nodes_; }
     /// The branches of a Choice that are worth a look, as bits.
     std::uint32_t branches(const NodeRow& choice, std::uint32_t position) const;
     /// Whether a call may stand for tokens that can't be read.
@@ -89,6 +91,7 @@ class Reach {
     const ParserTable* table_ = nullptr;
     TextIndex* text_ = nullptr;
     Recovery recovery_;
+    std::uint32_t nodes_ = 0;
     std::size_t words_ = 0;
     std::uint16_t rule_ = 0;
     std::uint32_t from_ = 0, end_ = 0;

@@ -132,9 +132,7 @@ struct ParserTable {
     /// Nodes that a search stops at. They stand first, each behind those that can come after it without a
     /// token in between.
     std::uint32_t stops;
-    /// The Calls of rule r are calls[callsFrom[r]] up to calls[callsFrom[r + 1]].
-    const std::uint16_t* calls;
-    const std::uint32_t* callsFrom;
+    std::uint32_t statementStops;  ///< those, in front, that the statement rule can come to
 };
 
 /// The first node at or behind one that a search stops at: those that only shape the tree are passed over.
