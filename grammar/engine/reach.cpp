@@ -38,13 +38,6 @@ bool Reach::mayCall(const NodeRow& call, std::uint32_t position) {
     return text_->guarded(call, position);
 }
 
-std::uint32_t Reach::branches(const NodeRow& choice, std::uint32_t position) const {
-    // The part that recovery replaces starts with none of its tokens: look at every way to it.
-    if (position == recovery_.place)
-        return static_cast<std::uint32_t>((std::uint64_t{1} << table_->choices[choice.arg].count) - 1);
-    return text_->viable(choice, position, position);
-}
-
 /// Whether an end at a position can be that of a call that was met.
 bool Reach::comesBack(std::uint16_t call, std::uint32_t position) const {
     return metAt_[call] < position || (metAt_[call] == position && mayBeEmpty(table_->nodes[call]));
@@ -88,17 +81,6 @@ void Reach::follow(std::uint16_t rule, std::uint32_t position) {
         if (steps_.size() == stepsFrom_.back() && !skips) break;
     }
     beginPosition();
-}
-
-void Reach::meet(std::uint16_t node) {
-    if (has(met_.data(), node)) return;
-    set(met_.data(), node);
-    open_.push_back(node);
-}
-
-void Reach::goOn(std::uint16_t from, std::uint16_t to) {
-    ways_.push_back({from, to});
-    meet(to);
 }
 
 void Reach::beginPosition() {

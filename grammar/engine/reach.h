@@ -51,7 +51,12 @@ class Reach {
     /// Nodes that the followed rule can come to have lower numbers.
     std::uint32_t nodes() const { return nodes_; }
     /// The branches of a Choice that are worth a look, as bits.
-    std::uint32_t branches(const NodeRow& choice, std::uint32_t position) const;
+    std::uint32_t branches(const NodeRow& choice, std::uint32_t position) const {
+        // The part that recovery replaces starts with none of its tokens: look at every way to it.
+        if (position == recovery_.place)
+            return static_cast<std::uint32_t>((std::uint64_t{1} << table_->choices[choice.arg].count) - 1);
+        return text_->viable(choice, position, position);
+    }
     /// Whether a call may stand for tokens that can't be read.
     bool mayRecover(const NodeRow& call, std::uint32_t position) const {
         return position == recovery_.place && call.arg == table_->recoverRule;
@@ -74,8 +79,15 @@ class Reach {
     static void set(std::uint64_t* row, std::uint16_t node) {
         row[node / 64] |= std::uint64_t{1} << (node % 64);
     }
-    void meet(std::uint16_t node);
-    void goOn(std::uint16_t from, std::uint16_t to);
+    void meet(std::uint16_t node) {
+        if (has(met_.data(), node)) return;
+        set(met_.data(), node);
+        open_.push_back(node);
+    }
+    void goOn(std::uint16_t from, std::uint16_t to) {
+        ways_.push_back({from, to});
+        meet(to);
+    }
     void pass(std::uint16_t node, std::uint32_t position);
     void passCall(std::uint16_t call, std::uint32_t position);
     bool mayCall(const NodeRow& call, std::uint32_t position);
