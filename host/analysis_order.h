@@ -17,8 +17,8 @@ class CyclicQueries : public std::runtime_error {
 // Told before each query how many of all are analysed; what it raises ends the work.
 using AnalysisProgress = std::function<void(std::size_t done, std::size_t all)>;
 
-// Analyses the queries of a database and puts each behind those that it reads from. Raises CyclicQueries, with
-// the queries in the order from before, when there is no such order.
+// Analyses the queries of a database and puts each behind those that it reads from. Raises CyclicQueries,
+// with the queries in the order from before, when there is no such order.
 void analyseQueries(Database& database, const AnalysisProgress& progress = {});
 
 // Queries of which each reads from the next, and the last from the first.

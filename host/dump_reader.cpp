@@ -156,7 +156,8 @@ void readJson(CatalogRows& rows, const std::string& path, std::string_view bytes
 
 }  // namespace
 
-void DumpReader::read(CatalogRows& rows) {
+void DumpReader::read(CatalogRows& rows, const CatalogReading& reading) {
+    reading.tell(rows);
     const std::size_t first = bytes_.find_first_not_of(" \t\r\n\xEF\xBB\xBF");
     if (first != std::string::npos && (bytes_[first] == '[' || bytes_[first] == '{'))
         readJson(rows, path_, bytes_);

@@ -58,7 +58,7 @@ class FromPostgresql : public ServerTest {
 TEST_F(FromPostgresql, TheLineageIsTheExpectedOne) {
     const ProgramResult made = import(address("postgres?schema=shop"), "postgresql");
     ASSERT_EQ(made.exitStatus, 0) << made.errors;
-    EXPECT_EQ(made.output, "40 tables and 60 queries; 0 left out\n");
+    EXPECT_EQ(made.summary, "40 tables and 60 queries done");
 
     expectLineage(project(), {"lineage.txt", "lineage_postgresql.txt"}, "gaps_postgresql.txt");
 }
@@ -188,7 +188,7 @@ TEST_F(FromPostgresql, ASchemaWithoutRightsAloneGivesNoProject) {
 TEST_F(FromPostgresql, TheAddressTellsTheDialectAndTheOptionTheSchema) {
     const ProgramResult result =
         runZrsql({"project", "import", address("postgres"), project(), "--schema", "shop", "--force"});
-    EXPECT_EQ(result.output, "40 tables and 60 queries; 0 left out\n") << result.errors;
+    EXPECT_EQ(result.summary, "40 tables and 60 queries done") << result.errors;
     EXPECT_THAT(runZrsql({"project", "list", project()}).output,
                 HasSubstr(": JSON, postgresql, schema shop\n"));
 }
@@ -281,7 +281,7 @@ TEST_F(FromPostgresql, AViewThatWaitsForALockIsLeftOutAndTheRestGoesOn) {
                             "zrsql: " + shown() +
                                 ": while view shop.shipment_times was read: canceling statement "
                                 "due to lock timeout; it is left out"));
-    EXPECT_EQ(result.output, "40 tables and 58 queries; 2 left out\n");
+    EXPECT_EQ(result.summary, "40 tables and 58 queries done, 2 left out");
 }
 
 TEST_F(FromPostgresql, NothingOfTheServerIsChanged) {
