@@ -6,6 +6,7 @@
 #include "broken_line.h"
 #include "expected_lineage.h"
 #include "host/catalog_reader.h"
+#include "host/project.h"
 #include "imports.h"
 
 namespace zr::test {
@@ -101,6 +102,28 @@ TEST_F(FromMariaDb, AViewWhoseTextTheUserMayNotSeeIsLeftOutWithALine) {
                   "/shop: view all_products: left out; the server does not tell its text, for which the "
                   "user needs the right SHOW VIEW");
     EXPECT_EQ(result.summary, "40 tables and 0 queries done, 60 left out");
+}
+
+TEST_F(FromMariaDb, AReadingThatEndsWhileViewsAreReadCanBeGoneOnWith) {
+    ASSERT_EQ(import(address("shop"), "mysql").exitStatus, 0);
+    const std::string whole = readFile(project());
+
+    struct End {};
+    host::CatalogReading reading;
+    reading.look = [](const host::CatalogRows& rows) {
+        if (rows.isWholeButViews) throw End();
+    };
+    host::CatalogRows rows;
+    const auto reader = host::readerFor(address("shop"));
+    EXPECT_THROW(reader->read(rows, reading), End);
+    EXPECT_EQ(rows.views.size(), 60u);
+    host::saveProject(*host::makeDatabase(rows, DB_MYSQL, reader->schema()), project(),
+                      host::StorageForm::Json);
+    EXPECT_FALSE(readFile(project()) == whole);
+
+    const ProgramResult rest = runZrsql({"project", "import", address("shop"), project(), "--continue"});
+    EXPECT_EQ(rest.summary, "0 tables and 10 queries done, 40 tables and 50 queries there before");
+    EXPECT_TRUE(readFile(project()) == whole);
 }
 
 TEST_F(FromMariaDb, AViewThatNoLongerHoldsDoesNotKeepTheRestFromComing) {

@@ -7,6 +7,7 @@
 #include "expected_lineage.h"
 #include "host/catalog_reader.h"
 #include "imports.h"
+#include "started_program.h"
 
 namespace zr::test {
 namespace {
@@ -14,6 +15,7 @@ namespace {
 using testing::ElementsAre;
 using testing::HasSubstr;
 using testing::IsEmpty;
+using testing::MatchesRegex;
 
 constexpr const char* kPassword = "a secret: of reader\\s";
 const std::string kPsql = "psql -h FOLDER -p PORT -U owner -d postgres -q -v ON_ERROR_STOP=1 -AtF ' ' ";
@@ -173,7 +175,7 @@ TEST_F(FromPostgresql, AllSchemasAreReadAndOneWithoutRightsIsLeftOutWithALine) {
     EXPECT_THAT(splitLines(result.errors),
                 testing::Contains("zrsql: " + shown() +
                                   ": schema secret: left out; the user reader has no right to use it"));
-    EXPECT_THAT(result.output, HasSubstr(" 62 queries"));
+    EXPECT_THAT(result.summary, HasSubstr(" 62 queries"));
 }
 
 TEST_F(FromPostgresql, ASchemaWithoutRightsAloneGivesNoProject) {
@@ -282,6 +284,53 @@ TEST_F(FromPostgresql, AViewThatWaitsForALockIsLeftOutAndTheRestGoesOn) {
                                 ": while view shop.shipment_times was read: canceling statement "
                                 "due to lock timeout; it is left out"));
     EXPECT_EQ(result.summary, "40 tables and 58 queries done, 2 left out");
+}
+
+TEST_F(FromPostgresql, AnInterruptWhileViewsAreReadKeepsThoseThatWereAndTheRestCanBeAdded) {
+    const std::string source = address("postgres?schema=shop&statement_timeout=2");
+    ASSERT_EQ(import(source, "postgresql").summary, "40 tables and 60 queries done");
+    const std::string whole = readFile(project());
+    std::filesystem::remove(project());
+
+    server.shell("PGAPPNAME=holder " + kPsql +
+                 "-c 'BEGIN; LOCK TABLE shop.carriers; SELECT pg_sleep(60)' >/dev/null 2>&1 &");
+    while (sql("SELECT count(*) FROM pg_locks WHERE relation = 'shop.carriers'::regclass AND mode = "
+               "'AccessExclusiveLock' AND granted") != "1\n") {
+    }
+    StartedProgram program({"project", "import", source, project(), "--progress"});
+    std::string line;
+    do line = program.readErrorLine();
+    while (!line.empty() && !testing::Matches(MatchesRegex(".*: [1-9][0-9]* of 60 views read"))(line));
+    program.signal(SIGTERM);
+    const auto end = program.wait();
+    sql("SELECT pg_terminate_backend(pid) FROM pg_stat_activity WHERE application_name = 'holder'");
+    EXPECT_EQ(end.exitStatus, 130) << end.errors;
+    EXPECT_THAT(
+        splitLines(end.errors).back(),
+        MatchesRegex("zrsql: interrupted: 40 tables and [1-9][0-9]* quer(y|ies) done, (1 left out, )?[1-9]"
+                     "[0-9]* views? not read, 0:0[0-9]; .*json holds what was read, and the same command "
+                     "with --continue goes on"));
+    EXPECT_EQ(runZrsql({"lineage", project()}).exitStatus, 0) << "what is kept is a project";
+
+    const ProgramResult rest = runZrsql({"project", "import", source, project(), "--continue"});
+    EXPECT_THAT(rest.summary,
+                MatchesRegex("0 tables and [1-9][0-9]* quer(y|ies) done, 40 tables and [1-9][0-9]* "
+                             "quer(y|ies) there before"));
+    EXPECT_EQ(rest.errors, "");
+    EXPECT_TRUE(readFile(project()) == whole);
+}
+
+TEST_F(FromPostgresql, AnInterruptBeforeViewsAreReadLeavesNothing) {
+    const BrokenLine line(static_cast<unsigned>(std::stoi(server.port())), 3000, BrokenLine::Break::Silent);
+    StartedProgram program(
+        {"project", "import", address("postgres?schema=shop", line.port()), project(), "--progress"});
+    EXPECT_THAT(program.readErrorLine(), HasSubstr("0 columns read"));
+    program.signal(SIGINT);
+    const auto end = program.wait();
+    EXPECT_EQ(end.exitStatus, 130);
+    EXPECT_EQ(end.errors,
+              "zrsql: interrupted while tables and keys were read; " + project() + " was not made\n");
+    EXPECT_FALSE(std::filesystem::exists(project()));
 }
 
 TEST_F(FromPostgresql, NothingOfTheServerIsChanged) {

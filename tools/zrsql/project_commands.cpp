@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstdio>
 #include <filesystem>
+#include <unordered_map>
 
 #include "host/analysis_order.h"
 #include "host/catalog.h"
@@ -89,6 +90,23 @@ Count addMissing(host::Database& database, const host::Database& catalog) {
     return added;
 }
 
+// Queries that are views of the catalogue get its order, each group in the places that it has: a project that
+// was gone on with is the one that would have been made at once.
+void arrange(host::Database& database, const host::CatalogRows& rows) {
+    std::unordered_map<const CZRQueryInfo*, std::size_t> places;
+    for (const host::CatalogRows::View& view : rows.views)
+        if (const CZRQueryInfo* query = database.FindQueryBySrcName(view.name))
+            places.try_emplace(query, places.size());
+    std::vector<CZRQueryInfo*> known;
+    for (CZRQueryInfo* query : database.Queries)
+        if (places.contains(query)) known.push_back(query);
+    std::sort(known.begin(), known.end(),
+              [&](const auto* one, const auto* other) { return places.at(one) < places.at(other); });
+    auto next = known.begin();
+    for (CZRQueryInfo*& query : database.Queries)
+        if (places.contains(query)) query = *next++;
+}
+
 void makeProject(const ProjectOptions& options) {
     requireFree(options.file, options.force);
     host::Database database(options.dialect->kind);
@@ -156,6 +174,7 @@ Told importCatalogue(const ProjectOptions& options) {
         there = {static_cast<std::uint64_t>(before->Tables.GetCount()),
                  static_cast<std::uint64_t>(before->Queries.GetCount())};
         added = addMissing(*before, *made);
+        arrange(*before, rows);
     }
     host::Database& project = before ? *before : *made;
     if (project.Tables.IsEmpty() && project.Queries.IsEmpty())
