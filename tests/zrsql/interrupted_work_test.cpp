@@ -131,7 +131,7 @@ class InterruptedProject : public testing::Test {
 };
 
 TEST_F(InterruptedProject, WritesNothingAndBeginsAnew) {
-    const std::string shop = project(20, 400);
+    const std::string shop = project(20, 250);
     const std::vector<std::vector<std::string>> commands = {
         {"lineage", shop, "--format", "csv"},
         {"project", "analyze", shop, "--format", "json"},
@@ -146,7 +146,7 @@ TEST_F(InterruptedProject, WritesNothingAndBeginsAnew) {
         for (const int wait : {0, 3, 20, 60, 100}) {
             StartedProgram program(words);
             EXPECT_THAT(program.readErrorLine(),
-                        MatchesRegex("zrsql: .*p\\.json: 0 of 400 queries analysed"));
+                        MatchesRegex("zrsql: .*p\\.json: 0 of 250 queries analysed"));
             std::this_thread::sleep_for(std::chrono::milliseconds(wait));
             program.signal(wait % 2 ? SIGTERM : SIGINT);
             const std::string out = program.readRest();
@@ -169,7 +169,7 @@ TEST_F(InterruptedProject, WritesNothingAndBeginsAnew) {
         words.pop_back();
         const ProgramResult again = runZrsql(words);
         EXPECT_EQ(again.exitStatus, 0) << again.errors;
-        EXPECT_EQ(again.summary, "400 queries done");
+        EXPECT_EQ(again.summary, "250 queries done");
     }
 }
 
