@@ -324,7 +324,7 @@ TEST_F(FromPostgresql, AnInterruptBeforeViewsAreReadLeavesNothing) {
     const BrokenLine line(static_cast<unsigned>(std::stoi(server.port())), 3000, BrokenLine::Break::Silent);
     StartedProgram program(
         {"project", "import", address("postgres?schema=shop", line.port()), project(), "--progress"});
-    EXPECT_THAT(program.readErrorLine(), HasSubstr("0 columns read"));
+    EXPECT_THAT(program.readErrorLine(), HasSubstr("0 tables read"));
     program.signal(SIGINT);
     const auto end = program.wait();
     EXPECT_EQ(end.exitStatus, 130);

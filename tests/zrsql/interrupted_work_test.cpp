@@ -180,7 +180,7 @@ TEST_F(InterruptedProject, OfAnImportIsAsItWasUntilTheTablesAreRead) {
         if (isThere) std::ofstream(to) << "what was there";
         StartedProgram program(
             {"project", "import", from, to, "-d", "postgresql", "--form", "json", "--force", "--progress"});
-        EXPECT_EQ(program.readErrorLine(), "zrsql: reading " + from + ": 0 columns read");
+        EXPECT_EQ(program.readErrorLine(), "zrsql: reading " + from + ": 0 tables read");
         program.signal(SIGINT);
         const auto end = program.wait();
         EXPECT_EQ(end.exitStatus, 130) << end.errors;

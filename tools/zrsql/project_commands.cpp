@@ -116,7 +116,13 @@ void makeProject(const ProjectOptions& options) {
 }
 
 std::string readSoFar(const host::CatalogRows& rows) {
-    if (!rows.isWholeButViews) return counted(rows.columns.size(), "column", "columns") + " read";
+    if (!rows.isWholeButViews) {
+        // Readers tell the columns of one table after the other.
+        std::uint64_t tables = 0;
+        for (std::size_t at = 0; at < rows.columns.size(); ++at)
+            if (at == 0 || rows.columns[at].table != rows.columns[at - 1].table) ++tables;
+        return counted(tables, "table", "tables") + " read";
+    }
     const auto open = std::count_if(rows.views.begin(), rows.views.end(),
                                     [](const host::CatalogRows::View& view) { return view.isOpen; });
     return std::to_string(rows.views.size() - static_cast<std::size_t>(open)) + " of " +

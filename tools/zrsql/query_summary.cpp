@@ -15,7 +15,6 @@ void QuerySummary::add(const Gap& gap) {
 Summary QuerySummary::summary(std::chrono::milliseconds elapsed) const {
     Summary summary;
     summary.elapsed = elapsed;
-    summary.counted = whole_ + inRing_ + notRead_ + notAnalysed_ + unknownSources_;
     summary.parts.push_back(counted(whole_, "query done", "queries done"));
     const auto add = [&](std::uint64_t count, const char* why) {
         if (count) summary.parts.push_back(std::to_string(count) + " " + why);
