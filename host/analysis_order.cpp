@@ -13,23 +13,27 @@ namespace {
 
 using Queries = std::vector<CZRQueryInfo*>;
 
-using QueriesById = std::unordered_map<CString, CZRQueryInfo*>;
+// Tables and queries by their IDs; a table has no query.
+using ObjectsById = std::unordered_map<CString, CZRQueryInfo*>;
 
 // Which queries of the database an analysed query names, at any depth. Its descriptor is not touched.
-Queries queriesReadBy(CZRQueryInfo& query, Database& database, const QueriesById& byId) {
+Queries queriesReadBy(CZRQueryInfo& query, Database& database, const ObjectsById& byId) {
     CZRQueryInfo scratch;
     scratch.SetDatabase(&database);
     Queries read;
-    for (const CZRQueryInfo* each : zr::withNestedQueries(query)) {
-        scratch.m_sourceTables.RemoveAll();
-        for (const auto& source : each->m_sourceTables) scratch.m_sourceTables[source.key] = source.value;
-        scratch.ResolveSources();
-        for (const auto& source : scratch.m_sourceTables) {
-            const auto found = byId.find(source.value);
-            if (found != byId.end() && std::find(read.begin(), read.end(), found->second) == read.end())
-                read.push_back(found->second);
-        }
-    }
+    const auto note = [&](const CString& id) {
+        const auto found = byId.find(id);
+        if (found == byId.end()) return false;
+        if (found->second && std::find(read.begin(), read.end(), found->second) == read.end())
+            read.push_back(found->second);
+        return true;
+    };
+    // The analysis has looked up most of the sources already.
+    for (const CZRQueryInfo* each : zr::withNestedQueries(query))
+        for (const auto& source : each->m_sourceTables)
+            if (!note(source.value)) scratch.m_sourceTables[source.key] = source.value;
+    if (!scratch.m_sourceTables.IsEmpty()) scratch.ResolveSources();
+    for (const auto& source : scratch.m_sourceTables) note(source.value);
     return read;
 }
 
@@ -37,7 +41,8 @@ class ReadingOrder {
  public:
     // Of queries that are analysed.
     explicit ReadingOrder(Database& database) {
-        QueriesById byId;
+        ObjectsById byId;
+        for (const CZRTableInfo* table : database.Tables) byId.emplace(table->GetID(), nullptr);
         for (CZRQueryInfo* query : database.Queries) byId.emplace(query->GetID(), query);
         for (CZRQueryInfo* query : database.Queries) readBy_[query] = queriesReadBy(*query, database, byId);
     }

@@ -54,6 +54,18 @@ class FromPostgresql : public ServerTest {
         return server.shell(kPsql + "-c \"" + statement + "\"").output;
     }
 
+    // Lets whoever reads a view on this table wait.
+    void lockCarriers() const {
+        server.shell("PGAPPNAME=holder " + kPsql +
+                     "-c 'BEGIN; LOCK TABLE shop.carriers; SELECT pg_sleep(60)' >/dev/null 2>&1 &");
+        while (sql("SELECT count(*) FROM pg_locks WHERE relation = 'shop.carriers'::regclass AND mode = "
+                   "'AccessExclusiveLock' AND granted") != "1\n") {
+        }
+    }
+    void unlockCarriers() const {
+        sql("SELECT pg_terminate_backend(pid) FROM pg_stat_activity WHERE application_name = 'holder'");
+    }
+
     const Variable password{"PGPASSWORD", kPassword};
 };
 
@@ -266,15 +278,9 @@ TEST_F(FromPostgresql, AServerThatFallsSilentIsGivenUp) {
 }
 
 TEST_F(FromPostgresql, AViewThatWaitsForALockIsLeftOutAndTheRestGoesOn) {
-    // The lock is let go when its connection is ended, below.
-    const std::string folder = server.folder();
-    server.shell("PGAPPNAME=holder " + kPsql +
-                 "-c 'BEGIN; LOCK TABLE shop.carriers; SELECT pg_sleep(60)' >/dev/null 2>&1 &");
-    while (sql("SELECT count(*) FROM pg_locks WHERE relation = 'shop.carriers'::regclass AND mode = "
-               "'AccessExclusiveLock' AND granted") != "1\n") {
-    }
+    lockCarriers();
     const ProgramResult result = import(address("postgres?schema=shop&statement_timeout=2"), "postgresql");
-    sql("SELECT pg_terminate_backend(pid) FROM pg_stat_activity WHERE application_name = 'holder'");
+    unlockCarriers();
     EXPECT_EQ(result.exitStatus, 0) << result.errors;
     EXPECT_THAT(splitLines(result.errors),
                 ElementsAre("zrsql: " + shown() +
@@ -292,18 +298,14 @@ TEST_F(FromPostgresql, AnInterruptWhileViewsAreReadKeepsThoseThatWereAndTheRestC
     const std::string whole = readFile(project());
     std::filesystem::remove(project());
 
-    server.shell("PGAPPNAME=holder " + kPsql +
-                 "-c 'BEGIN; LOCK TABLE shop.carriers; SELECT pg_sleep(60)' >/dev/null 2>&1 &");
-    while (sql("SELECT count(*) FROM pg_locks WHERE relation = 'shop.carriers'::regclass AND mode = "
-               "'AccessExclusiveLock' AND granted") != "1\n") {
-    }
+    lockCarriers();
     StartedProgram program({"project", "import", source, project(), "--progress"});
     std::string line;
     do line = program.readErrorLine();
     while (!line.empty() && !testing::Matches(MatchesRegex(".*: [1-9][0-9]* of 60 views read"))(line));
     program.signal(SIGTERM);
     const auto end = program.wait();
-    sql("SELECT pg_terminate_backend(pid) FROM pg_stat_activity WHERE application_name = 'holder'");
+    unlockCarriers();
     EXPECT_EQ(end.exitStatus, 130) << end.errors;
     EXPECT_THAT(
         splitLines(end.errors).back(),
@@ -320,6 +322,23 @@ TEST_F(FromPostgresql, AnInterruptWhileViewsAreReadKeepsThoseThatWereAndTheRestC
     EXPECT_TRUE(readFile(project()) == whole);
 }
 
+TEST_F(FromPostgresql, AnInterruptLeavesAProjectThatWasToBeReplacedAsItWas) {
+    std::ofstream(project()) << "a project";
+    lockCarriers();
+    StartedProgram program(
+        {"project", "import", address("postgres?schema=shop"), project(), "--force", "--progress"});
+    std::string line;
+    do line = program.readErrorLine();
+    while (!line.empty() && line.find("of 60 views read") == std::string::npos);
+    program.signal(SIGINT);
+    const auto end = program.wait();
+    unlockCarriers();
+    EXPECT_EQ(end.exitStatus, 130);
+    EXPECT_EQ(splitLines(end.errors).back(),
+              "zrsql: interrupted while the catalogue was read; " + project() + " is as it was");
+    EXPECT_EQ(readFile(project()), "a project");
+}
+
 TEST_F(FromPostgresql, AnInterruptBeforeViewsAreReadLeavesNothing) {
     const BrokenLine line(static_cast<unsigned>(std::stoi(server.port())), 3000, BrokenLine::Break::Silent);
     StartedProgram program(
@@ -329,7 +348,7 @@ TEST_F(FromPostgresql, AnInterruptBeforeViewsAreReadLeavesNothing) {
     const auto end = program.wait();
     EXPECT_EQ(end.exitStatus, 130);
     EXPECT_EQ(end.errors,
-              "zrsql: interrupted while tables and keys were read; " + project() + " was not made\n");
+              "zrsql: interrupted while the catalogue was read; " + project() + " was not made\n");
     EXPECT_FALSE(std::filesystem::exists(project()));
 }
 

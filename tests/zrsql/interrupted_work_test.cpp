@@ -184,7 +184,7 @@ TEST_F(InterruptedProject, OfAnImportIsAsItWasUntilTheTablesAreRead) {
         program.signal(SIGINT);
         const auto end = program.wait();
         EXPECT_EQ(end.exitStatus, 130) << end.errors;
-        EXPECT_EQ(end.errors, "zrsql: interrupted while tables and keys were read; " + to +
+        EXPECT_EQ(end.errors, "zrsql: interrupted while the catalogue was read; " + to +
                                   (isThere ? " is as it was\n" : " was not made\n"));
         EXPECT_EQ(std::filesystem::exists(to), isThere);
         if (isThere) {

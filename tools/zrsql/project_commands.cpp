@@ -133,9 +133,11 @@ std::string readSoFar(const host::CatalogRows& rows) {
 // ends the program.
 bool readCatalogues(const ProjectOptions& options, const host::Database* before, host::CatalogRows& rows,
                     CString& schema, LongWork& work) {
+    // A whole project is not given up for a part of one.
+    const bool replaces = options.force && std::filesystem::exists(options.file);
     host::CatalogReading reading;
     reading.look = [&](const host::CatalogRows& soFar) {
-        if (soFar.isWholeButViews) work.endAtSteps();
+        if (soFar.isWholeButViews && !replaces) work.endAtSteps();
         work.step([&] { return readSoFar(soFar); });
     };
     if (before) reading.isKnown = [&](const CString& view) { return holds(*before, view); };
@@ -164,7 +166,7 @@ DatabasePointer projectBefore(const ProjectOptions& options) {
 
 Told importCatalogue(const ProjectOptions& options) {
     LongWork work("reading " + options.catalogues.front(), options.showsProgress);
-    work.endAtOnceWith("interrupted while tables and keys were read; " + options.file +
+    work.endAtOnceWith("interrupted while the catalogue was read; " + options.file +
                        (std::filesystem::exists(options.file) ? " is as it was" : " was not made"));
     const DatabasePointer before = projectBefore(options);
     host::CatalogRows rows;
