@@ -149,7 +149,9 @@ void readJson(CatalogRows& rows, const std::string& path, std::string_view bytes
     }
     if (json.is_array()) return takeJsonRows(rows, path, json);
     for (const auto& [name, list] : json.items()) {
-        if (!list.is_array()) throw CatalogReadError(path + ": \"" + name + "\" has to be a list of rows");
+        if (!list.is_array())
+            throw CatalogReadError(
+                std::string(path).append(": \"").append(name).append("\" has to be a list of rows"));
         takeJsonRows(rows, path, list);
     }
 }

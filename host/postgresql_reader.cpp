@@ -59,6 +59,7 @@ class Connection {
     void each(const std::string& sql, const std::vector<std::string>& values,
               const std::function<void(const Cells&)>& take) {
         std::vector<const char*> texts;
+        texts.reserve(values.size());
         for (const std::string& value : values) texts.push_back(value.c_str());
         if (!PQsendQueryParams(handle_, sql.c_str(), static_cast<int>(texts.size()), nullptr, texts.data(),
                                nullptr, nullptr, 0))
@@ -316,6 +317,7 @@ class PostgresqlReader : public CatalogReader {
     static std::string readTextsOf(Connection& connection, CatalogRows& rows,
                                    const std::vector<NamedView>& views) {
         std::vector<std::string> ids;
+        ids.reserve(views.size());
         for (const NamedView& view : views) ids.push_back(view.id);
         connection.run("SAVEPOINT texts");
         std::string why;

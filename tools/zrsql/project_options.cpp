@@ -155,7 +155,7 @@ void ProjectWords::addTo(CLI::App& app) {
         "A project that is read may have any name. One that is made is JSON for a name that ends in .json,\n"
         "SQLite for .db, .sqlite or .sqlite3. Exit status: 0 done, 1 a file can't be read or written or is "
         "no\n"
-        "whole project, 2 wrong use.");
+        "whole project, 2 wrong use, 130 interrupted.");
 }
 
 std::optional<ProjectOptions> ProjectWords::read() const {
