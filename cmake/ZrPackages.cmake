@@ -69,6 +69,7 @@ set(CPACK_DEBIAN_TOOLS_PACKAGE_NAME zrsql)
 set(CPACK_DEBIAN_TOOLS_PACKAGE_SECTION database)
 set(CPACK_DEBIAN_TOOLS_PACKAGE_SHLIBDEPS ON)
 set(CPACK_DEBIAN_TOOLS_PACKAGE_DEPENDS "${zr_same_library}")
+set(CPACK_DEBIAN_TOOLS_PACKAGE_SUGGESTS "mdbtools") # runs its programs for databases of MS Access
 set(CPACK_DEBIAN_TOOLS_DESCRIPTION
     "shows what the library libzrparsersql sees in a SQL text
 A program that shows the tokens of a query, its syntax tree, and the columns,

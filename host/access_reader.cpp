@@ -125,10 +125,11 @@ std::string AccessReader::run(const std::vector<std::string>& words) const {
     }
 }
 
-void AccessReader::read(CatalogRows& rows) {
+void AccessReader::read(CatalogRows& rows, const CatalogReading& reading) {
     readTables(rows);
     // What is beyond the tables may be missing in old or damaged files.
     const auto orNote = [&](const char* what, auto step) {
+        reading.tell(rows);
         try {
             (this->*step)(rows);
         } catch (const CatalogReadError& error) {

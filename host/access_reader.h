@@ -16,7 +16,8 @@ class AccessReader : public CatalogReader {
  public:
     explicit AccessReader(std::string path, std::chrono::milliseconds patience = std::chrono::seconds(60))
         : path_(std::move(path)), patience_(patience) {}
-    void read(CatalogRows& rows) override;
+    using CatalogReader::read;
+    void read(CatalogRows& rows, const CatalogReading& reading) override;
 
  private:
     std::string run(const std::vector<std::string>& words) const;

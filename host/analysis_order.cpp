@@ -13,53 +13,38 @@ namespace {
 
 using Queries = std::vector<CZRQueryInfo*>;
 
-using QueriesById = std::unordered_map<CString, CZRQueryInfo*>;
+// Tables and queries by their IDs; a table has no query.
+using ObjectsById = std::unordered_map<CString, CZRQueryInfo*>;
 
-// Which queries of the database a query names, at any depth. A query's descriptor is not touched: only an
-// analysis tells, and that one is made on the side.
-Queries queriesReadBy(const CZRQueryInfo& query, Database& database, const QueriesById& byId) {
+// Which queries of the database an analysed query names, at any depth. Its descriptor is not touched.
+Queries queriesReadBy(CZRQueryInfo& query, Database& database, const ObjectsById& byId) {
     CZRQueryInfo scratch;
-    scratch.m_sql = query.m_sql;
     scratch.SetDatabase(&database);
-    BuildQueryInfo(&scratch, database.GetDBType());
     Queries read;
-    for (CZRQueryInfo* each : zr::withNestedQueries(scratch)) {
-        each->SetDatabase(&database);
-        each->ResolveSources();
-        for (const auto& source : each->m_sourceTables) {
-            const auto found = byId.find(source.value);
-            if (found != byId.end() && std::find(read.begin(), read.end(), found->second) == read.end())
-                read.push_back(found->second);
-        }
-    }
+    const auto note = [&](const CString& id) {
+        const auto found = byId.find(id);
+        if (found == byId.end()) return false;
+        if (found->second && std::find(read.begin(), read.end(), found->second) == read.end())
+            read.push_back(found->second);
+        return true;
+    };
+    // The analysis has looked up most of the sources already.
+    for (const CZRQueryInfo* each : zr::withNestedQueries(query))
+        for (const auto& source : each->m_sourceTables)
+            if (!note(source.value)) scratch.m_sourceTables[source.key] = source.value;
+    if (!scratch.m_sourceTables.IsEmpty()) scratch.ResolveSources();
+    for (const auto& source : scratch.m_sourceTables) note(source.value);
     return read;
 }
 
-class Steps {
- public:
-    Steps(const Database& database, const AnalysisProgress& progress)
-        : all_(static_cast<std::size_t>(database.Queries.GetCount()) * 2), progress_(progress) {}
-
-    void next() {
-        if (progress_) progress_(done_, all_);
-        ++done_;
-    }
-
- private:
-    std::size_t done_ = 0;
-    const std::size_t all_;
-    const AnalysisProgress& progress_;
-};
-
 class ReadingOrder {
  public:
-    explicit ReadingOrder(Database& database, Steps& steps) {
-        QueriesById byId;
+    // Of queries that are analysed.
+    explicit ReadingOrder(Database& database) {
+        ObjectsById byId;
+        for (const CZRTableInfo* table : database.Tables) byId.emplace(table->GetID(), nullptr);
         for (CZRQueryInfo* query : database.Queries) byId.emplace(query->GetID(), query);
-        for (CZRQueryInfo* query : database.Queries) {
-            steps.next();
-            readBy_[query] = queriesReadBy(*query, database, byId);
-        }
+        for (CZRQueryInfo* query : database.Queries) readBy_[query] = queriesReadBy(*query, database, byId);
     }
 
     const Queries& readBy(CZRQueryInfo* query) const { return readBy_.at(query); }
@@ -107,37 +92,47 @@ std::string ringText(const Ring& ring) {
     return text + ring.front()->GetSrcName().toUtf8();
 }
 
-void analyseInOrder(Database& database, const ReadingOrder& order, Steps& steps) {
-    // The database sorts by what the descriptors tell of their sources.
+void analyseAll(Database& database, const AnalysisProgress& progress) {
+    const auto all = static_cast<std::size_t>(database.Queries.GetCount());
+    std::size_t done = 0;
     for (CZRQueryInfo* query : database.Queries) {
+        if (progress) progress(done++, all);
+        BuildQueryInfo(query, database.GetDBType());
+    }
+}
+
+// Puts each query behind those that it reads from. The database sorts by what the descriptors tell of their
+// sources, so that these stand aside meanwhile.
+void sortByReading(Database& database, const ReadingOrder& order) {
+    std::unordered_map<CZRQueryInfo*, std::vector<std::pair<CString, CString>>> kept;
+    for (CZRQueryInfo* query : database.Queries) {
+        for (const auto& source : query->m_sourceTables) kept[query].emplace_back(source.key, source.value);
         query->m_sourceTables.RemoveAll();
         for (const CZRQueryInfo* read : order.readBy(query))
             query->m_sourceTables[read->GetSrcName()] = read->GetID();
     }
     database.SortQueries();
-    for (CZRQueryInfo* query : database.Queries) query->m_sourceTables.RemoveAll();
-
     for (CZRQueryInfo* query : database.Queries) {
-        steps.next();
-        BuildQueryInfo(query, database.GetDBType());
+        query->m_sourceTables.RemoveAll();
+        for (const auto& [name, id] : kept[query]) query->m_sourceTables[name] = id;
     }
 }
 
 }  // namespace
 
 void analyseQueries(Database& database, const AnalysisProgress& progress) {
-    Steps steps(database, progress);
-    ReadingOrder order(database, steps);
+    analyseAll(database, progress);
+    ReadingOrder order(database);
     if (const std::vector<Ring> rings = order.findRings(database); !rings.empty())
         throw CyclicQueries("queries read from each other in a ring: " + ringText(rings.front()));
-    analyseInOrder(database, order, steps);
+    sortByReading(database, order);
 }
 
 std::vector<Ring> analyseQueriesInRings(Database& database, const AnalysisProgress& progress) {
-    Steps steps(database, progress);
-    ReadingOrder order(database, steps);
+    analyseAll(database, progress);
+    ReadingOrder order(database);
     std::vector<Ring> rings = order.findRings(database);
-    analyseInOrder(database, order, steps);
+    sortByReading(database, order);
     return rings;
 }
 

@@ -14,12 +14,11 @@ class CyclicQueries : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
-// Told before each query how many of all are done; what it raises ends the work. All are gone through twice,
-// first for what they read: each time counts.
+// Told before each query how many of all are analysed; what it raises ends the work.
 using AnalysisProgress = std::function<void(std::size_t done, std::size_t all)>;
 
-// Analyses the queries of a database, each behind those that it reads from, and leaves them in that order.
-// Raises CyclicQueries, with no query analysed, when there is no such order.
+// Analyses the queries of a database and puts each behind those that it reads from. Raises CyclicQueries,
+// with the queries in the order from before, when there is no such order.
 void analyseQueries(Database& database, const AnalysisProgress& progress = {});
 
 // Queries of which each reads from the next, and the last from the first.

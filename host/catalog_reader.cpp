@@ -120,6 +120,7 @@ class Maker {
                      ": left out; there is one of that name already");
                 continue;
             }
+            if (view.isOpen) continue;
             const CString sql = view.text ? queryOfView(*view.text) : CString();
             if (sql.IsEmpty()) {
                 note("view " + view.name.toUtf8() + ": left out; the catalogue does not tell its text");

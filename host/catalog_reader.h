@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <optional>
 #include <stdexcept>
@@ -45,6 +46,7 @@ struct CatalogRows {
         CString schema;
         CString name;
         std::optional<CString> text;  // with or without CREATE VIEW
+        bool isOpen = false;          // the text was not asked for, or not yet
     };
     struct Function {
         CString schema;
@@ -56,6 +58,22 @@ struct CatalogRows {
     std::vector<View> views;
     std::vector<Function> functions;
     std::vector<std::string> notes;  // what was left out, and why: a line each
+    // All but the texts of views is read, and every view is named. What a reading that ends behind this
+    // leaves is a catalogue of its own.
+    bool isWholeButViews = false;
+};
+
+// How a catalogue is to be read.
+struct CatalogReading {
+    // Called now and then with what was read so far; what it raises ends the reading.
+    std::function<void(const CatalogRows& rows)> look;
+    // Whether the text of a view is there already, by its name; such a view stays open.
+    std::function<bool(const CString& view)> isKnown;
+
+    void tell(const CatalogRows& rows) const {
+        if (look) look(rows);
+    }
+    bool wants(const CString& view) const { return !isKnown || !isKnown(view); }
 };
 
 // One kind of source.
@@ -63,7 +81,8 @@ class CatalogReader {
  public:
     virtual ~CatalogReader() = default;
     // Appends all that the source tells. Raises CatalogReadError.
-    virtual void read(CatalogRows& rows) = 0;
+    virtual void read(CatalogRows& rows, const CatalogReading& reading) = 0;
+    void read(CatalogRows& rows) { read(rows, {}); }
     // The one schema that it reads; empty: not one alone.
     virtual CString schema() const { return {}; }
 };
@@ -82,7 +101,8 @@ std::optional<DBTypes> kindOfSource(const std::string& source);
 std::vector<std::string> catalogReaders();
 
 // Makes the tables and queries of the rows; a name that is a view's is no table. With a schema, rows of
-// others are passed over. What can't be taken in is noted, and the rest goes on.
+// others are passed over. What can't be taken in is noted, and the rest goes on. A view that is open makes no
+// query.
 std::unique_ptr<Database> makeDatabase(CatalogRows& rows, DBTypes kind, const CString& schema);
 
 // The query of a text that may begin with CREATE VIEW ... AS.

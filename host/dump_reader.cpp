@@ -149,14 +149,17 @@ void readJson(CatalogRows& rows, const std::string& path, std::string_view bytes
     }
     if (json.is_array()) return takeJsonRows(rows, path, json);
     for (const auto& [name, list] : json.items()) {
-        if (!list.is_array()) throw CatalogReadError(path + ": \"" + name + "\" has to be a list of rows");
+        if (!list.is_array())
+            throw CatalogReadError(
+                std::string(path).append(": \"").append(name).append("\" has to be a list of rows"));
         takeJsonRows(rows, path, list);
     }
 }
 
 }  // namespace
 
-void DumpReader::read(CatalogRows& rows) {
+void DumpReader::read(CatalogRows& rows, const CatalogReading& reading) {
+    reading.tell(rows);
     const std::size_t first = bytes_.find_first_not_of(" \t\r\n\xEF\xBB\xBF");
     if (first != std::string::npos && (bytes_[first] == '[' || bytes_[first] == '{'))
         readJson(rows, path_, bytes_);

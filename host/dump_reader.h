@@ -13,7 +13,8 @@ class DumpReader : public CatalogReader {
  public:
     // The content of the file; the path is for messages.
     DumpReader(std::string path, std::string bytes) : path_(std::move(path)), bytes_(std::move(bytes)) {}
-    void read(CatalogRows& rows) override;
+    using CatalogReader::read;
+    void read(CatalogRows& rows, const CatalogReading& reading) override;
 
  private:
     std::string path_;

@@ -1,5 +1,6 @@
 #include <mysql.h>
 
+#include <algorithm>
 #include <functional>
 #include <set>
 
@@ -85,6 +86,8 @@ class Connection {
     MYSQL* handle_;
 };
 
+constexpr std::size_t kViewsTogether = 50;
+
 class MysqlReader : public CatalogReader {
  public:
     MysqlReader(CatalogUrl url, const CString& schema) : url_(std::move(url)) {
@@ -99,7 +102,9 @@ class MysqlReader : public CatalogReader {
 
     CString schema() const override { return CString::fromUtf8(settings_.schema); }
 
-    void read(CatalogRows& rows) override {
+    using CatalogReader::read;
+    void read(CatalogRows& rows, const CatalogReading& reading) override {
+        reading.tell(rows);
         Connection connection(url_, settings_, socket_);
         const std::string seconds = std::to_string(settings_.statementSeconds);
         connection.run(connection.isMariaDb() ? "SET SESSION max_statement_time = " + seconds
@@ -111,8 +116,11 @@ class MysqlReader : public CatalogReader {
             readColumns(connection, rows, wanted);
             readKeys(connection, rows, wanted);
             readFunctions(connection, rows, wanted);
-            readViews(connection, rows, wanted);
+            nameViews(connection, rows, wanted);
+            reading.tell(rows);
         }
+        rows.isWholeButViews = true;
+        readTexts(connection, rows, reading);
         connection.run("COMMIT");
     }
 
@@ -184,21 +192,51 @@ class MysqlReader : public CatalogReader {
             [&](const Cells& cells) { rows.functions.push_back(functionIn(cells)); });
     }
 
-    static void readViews(Connection& connection, CatalogRows& rows, const std::string& schema) {
+    static void nameViews(Connection& connection, CatalogRows& rows, const std::string& schema) {
         connection.begin("views were read");
         connection.each(
-            "SELECT TABLE_SCHEMA, TABLE_NAME, VIEW_DEFINITION FROM information_schema.VIEWS WHERE "
-            "TABLE_SCHEMA "
-            "= " +
+            "SELECT TABLE_SCHEMA, TABLE_NAME FROM information_schema.TABLES WHERE TABLE_TYPE = 'VIEW' AND "
+            "TABLE_SCHEMA = " +
                 schema + " ORDER BY TABLE_NAME",
             [&](const Cells& cells) {
-                if (cells[2].value_or(std::string()).empty())
-                    rows.notes.push_back(connection.shown() + ": view " + cells[1].value_or(std::string()) +
-                                         ": left out; the server does not tell its text, for which the user "
-                                         "needs the right SHOW VIEW");
-                else
-                    rows.views.push_back(viewIn(cells));
+                rows.views.push_back({textIn(cells[0]), textIn(cells[1]), std::nullopt, true});
             });
+    }
+
+    // A view that is asked for by its name is looked up; a list of names would go through the schema.
+    static void readTexts(Connection& connection, CatalogRows& rows, const CatalogReading& reading) {
+        connection.begin("views were read");
+        std::vector<std::size_t> wanted;
+        for (std::size_t at = 0; at < rows.views.size(); ++at)
+            if (rows.views[at].isOpen && reading.wants(rows.views[at].name)) wanted.push_back(at);
+        std::vector<std::size_t> untold;
+        for (std::size_t at = 0; at < wanted.size(); at += kViewsTogether) {
+            const std::size_t end = std::min(at + kViewsTogether, wanted.size());
+            std::string sql;
+            for (std::size_t each = at; each < end; ++each) {
+                const CatalogRows::View& view = rows.views[wanted[each]];
+                sql += (sql.empty() ? "" : " UNION ALL ") + ("SELECT " + std::to_string(wanted[each])) +
+                       ", VIEW_DEFINITION FROM information_schema.VIEWS WHERE TABLE_SCHEMA = " +
+                       connection.quoted(view.schema.toUtf8()) +
+                       " AND TABLE_NAME = " + connection.quoted(view.name.toUtf8());
+            }
+            connection.each(sql, [&](const Cells& cells) {
+                CatalogRows::View& view = rows.views[static_cast<std::size_t>(numberIn(cells[0]))];
+                if (!cells[1].value_or(std::string()).empty()) view.text = textIn(cells[1]);
+            });
+            for (std::size_t each = at; each < end; ++each) {
+                CatalogRows::View& view = rows.views[wanted[each]];
+                view.isOpen = !view.text;
+                if (view.text) continue;
+                rows.notes.push_back(connection.shown() + ": view " + view.name.toUtf8() +
+                                     ": left out; the server does not tell its text, for which the "
+                                     "user needs the right SHOW VIEW");
+                untold.push_back(wanted[each]);
+            }
+            reading.tell(rows);
+        }
+        for (auto row = untold.rbegin(); row != untold.rend(); ++row)
+            rows.views.erase(rows.views.begin() + static_cast<std::ptrdiff_t>(*row));
     }
 
     CatalogUrl url_;

@@ -1,6 +1,7 @@
 #include <libpq-fe.h>
 #include <poll.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <chrono>
 #include <cstdlib>
@@ -51,11 +52,14 @@ class Connection {
 
     // What is done next, for messages.
     void begin(const char* what) { what_ = what; }
+    // Called now and then while the server is waited for; what it raises ends the waiting.
+    std::function<void()> look = [] {};
 
     // Raises RefusedStatement, or CatalogReadError when the connection is gone.
     void each(const std::string& sql, const std::vector<std::string>& values,
               const std::function<void(const Cells&)>& take) {
         std::vector<const char*> texts;
+        texts.reserve(values.size());
         for (const std::string& value : values) texts.push_back(value.c_str());
         if (!PQsendQueryParams(handle_, sql.c_str(), static_cast<int>(texts.size()), nullptr, texts.data(),
                                nullptr, nullptr, 0))
@@ -91,6 +95,7 @@ class Connection {
     // A server that is still there ends a statement in time; so what takes longer is a server that is not.
     Result waitForResult() {
         constexpr std::chrono::seconds kGrace(5);
+        constexpr std::chrono::milliseconds kLook(100);
         const auto deadline = Clock::now() + std::chrono::seconds(settings_.statementSeconds) + kGrace;
         while (PQflush(handle_) == 1 || PQisBusy(handle_)) {
             const auto left = std::chrono::duration_cast<std::chrono::milliseconds>(deadline - Clock::now());
@@ -98,7 +103,8 @@ class Connection {
                 throw CatalogReadError(shown_ + ": while " + what_ + ": the server does not answer");
             pollfd wanted{PQsocket(handle_), POLLIN, 0};
             if (PQflush(handle_) == 1) wanted.events |= POLLOUT;
-            if (poll(&wanted, 1, static_cast<int>(left.count())) < 0 && errno != EINTR)
+            look();
+            if (poll(&wanted, 1, static_cast<int>(std::min(left, kLook).count())) < 0 && errno != EINTR)
                 throw CatalogReadError(shown_ + ": while " + what_ + ": " + std::strerror(errno));
             if (!PQconsumeInput(handle_)) failForGood();
         }
@@ -138,6 +144,15 @@ std::string arrayOf(const std::vector<std::string>& words) {
     return text + "}";
 }
 
+constexpr std::size_t kViewsTogether = 100;
+
+// A view that stands in the rows; its name is for messages.
+struct NamedView {
+    std::size_t row;
+    std::string name;
+    std::string id;
+};
+
 class PostgresqlReader : public CatalogReader {
  public:
     PostgresqlReader(CatalogUrl url, const CString& schema) : url_(std::move(url)) {
@@ -146,8 +161,11 @@ class PostgresqlReader : public CatalogReader {
 
     CString schema() const override { return CString::fromUtf8(settings_.schema); }
 
-    void read(CatalogRows& rows) override {
+    using CatalogReader::read;
+    void read(CatalogRows& rows, const CatalogReading& reading) override {
+        reading.tell(rows);
         Connection connection(url_, settings_);
+        connection.look = [&] { reading.tell(rows); };
         connection.run("BEGIN TRANSACTION ISOLATION LEVEL REPEATABLE READ READ ONLY");
         connection.run("SET LOCAL statement_timeout = '" + std::to_string(settings_.statementSeconds) + "s'");
         connection.run("SET LOCAL lock_timeout = '" + std::to_string(settings_.lockSeconds) + "s'");
@@ -162,7 +180,9 @@ class PostgresqlReader : public CatalogReader {
             readColumns(connection, rows, wanted);
             readKeys(connection, rows, wanted);
             readFunctions(connection, rows, wanted);
-            readViews(connection, rows, wanted);
+            const std::vector<NamedView> views = nameViews(connection, rows, wanted);
+            rows.isWholeButViews = true;
+            readTexts(connection, rows, reading, views);
         }
         connection.run("COMMIT");
     }
@@ -246,40 +266,77 @@ class PostgresqlReader : public CatalogReader {
             {schemas}, [&](const Cells& cells) { rows.functions.push_back(functionIn(cells)); });
     }
 
-    // To print a view the server waits for whoever alters what it reads, so one view may fail alone: where
-    // all together fail they are asked for one by one.
-    static void readViews(Connection& connection, CatalogRows& rows, const std::string& schemas) {
+    static std::vector<NamedView> nameViews(Connection& connection, CatalogRows& rows,
+                                            const std::string& schemas) {
         connection.begin("views were read");
-        const std::string from =
-            " FROM pg_catalog.pg_class c JOIN pg_catalog.pg_namespace n ON n.oid = c.relnamespace "
-            "WHERE c.relkind IN ('v', 'm') AND n.nspname = ANY ($1::pg_catalog.name[]) ORDER BY n.nspname, "
-            "c.oid";
-        const auto take = [&](const Cells& cells) { rows.views.push_back(viewIn(cells)); };
+        std::vector<NamedView> views;
+        connection.each(
+            "SELECT n.nspname, c.relname, c.oid FROM pg_catalog.pg_class c JOIN pg_catalog.pg_namespace n "
+            "ON n.oid = c.relnamespace WHERE c.relkind IN ('v', 'm') AND n.nspname = ANY "
+            "($1::pg_catalog.name[]) ORDER BY n.nspname, c.oid",
+            {schemas}, [&](const Cells& cells) {
+                views.push_back({rows.views.size(), cells[0].value_or("") + "." + cells[1].value_or(""),
+                                 cells[2].value_or("")});
+                rows.views.push_back({textIn(cells[0]), textIn(cells[1]), std::nullopt, true});
+            });
+        return views;
+    }
+
+    // To print a view the server waits for whoever alters what it reads, so one view may fail alone: where
+    // several together fail they are asked for one by one.
+    static void readTexts(Connection& connection, CatalogRows& rows, const CatalogReading& reading,
+                          const std::vector<NamedView>& views) {
+        std::vector<NamedView> wanted;
+        for (const NamedView& view : views)
+            if (reading.wants(rows.views[view.row].name)) wanted.push_back(view);
+        std::vector<std::size_t> refused;
+        for (std::size_t at = 0; at < wanted.size(); at += kViewsTogether) {
+            const auto first = wanted.begin() + static_cast<std::ptrdiff_t>(at);
+            const auto last =
+                wanted.begin() + static_cast<std::ptrdiff_t>(std::min(at + kViewsTogether, wanted.size()));
+            connection.begin("views were read");
+            if (!readTextsOf(connection, rows, {first, last}).empty()) {
+                connection.run("SET LOCAL lock_timeout = '1s'");
+                for (auto view = first; view != last; ++view) {
+                    reading.tell(rows);
+                    const std::string what = "view " + view->name + " was read";
+                    connection.begin(what.c_str());
+                    const std::string why = readTextsOf(connection, rows, {*view});
+                    if (why.empty()) continue;
+                    rows.notes.push_back(why + "; it is left out");
+                    refused.push_back(view->row);
+                }
+            }
+            reading.tell(rows);
+        }
+        for (auto row = refused.rbegin(); row != refused.rend(); ++row)
+            rows.views.erase(rows.views.begin() + static_cast<std::ptrdiff_t>(*row));
+    }
+
+    // Empty, or why the server refuses; then none is read.
+    static std::string readTextsOf(Connection& connection, CatalogRows& rows,
+                                   const std::vector<NamedView>& views) {
+        std::vector<std::string> ids;
+        ids.reserve(views.size());
+        for (const NamedView& view : views) ids.push_back(view.id);
         connection.run("SAVEPOINT texts");
+        std::string why;
         try {
-            connection.each("SELECT n.nspname, c.relname, pg_catalog.pg_get_viewdef(c.oid, true)" + from,
-                            {schemas}, take);
-            return;
-        } catch (const RefusedStatement&) {
+            connection.each(
+                "SELECT v.place, pg_catalog.pg_get_viewdef(v.id, true) FROM "
+                "pg_catalog.unnest($1::pg_catalog.oid[]) WITH ORDINALITY v(id, place)",
+                {arrayOf(ids)}, [&](const Cells& cells) {
+                    CatalogRows::View& view =
+                        rows.views[views[static_cast<std::size_t>(numberIn(cells[0])) - 1].row];
+                    view.text = textIn(cells[1]);
+                    view.isOpen = false;
+                });
+        } catch (const RefusedStatement& refused) {
+            why = refused.what();
             connection.run("ROLLBACK TO SAVEPOINT texts");
         }
-        std::vector<Cells> views;
-        connection.each("SELECT n.nspname, c.relname, c.oid" + from, {schemas},
-                        [&](const Cells& cells) { views.push_back(cells); });
-        connection.run("SET LOCAL lock_timeout = '1s'");
-        for (const Cells& view : views) {
-            const std::string name = view[0].value_or("") + "." + view[1].value_or("");
-            const std::string what = "view " + name + " was read";
-            connection.begin(what.c_str());
-            connection.run("SAVEPOINT texts");
-            try {
-                connection.each("SELECT $1, $2, pg_catalog.pg_get_viewdef($3::pg_catalog.oid, true)",
-                                {*view[0], *view[1], *view[2]}, take);
-            } catch (const RefusedStatement& refused) {
-                connection.run("ROLLBACK TO SAVEPOINT texts");
-                rows.notes.push_back(std::string(refused.what()) + "; it is left out");
-            }
-        }
+        connection.run("RELEASE SAVEPOINT texts");
+        return why;
     }
 
     CatalogUrl url_;

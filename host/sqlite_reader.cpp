@@ -104,7 +104,7 @@ void readTable(Connection& connection, CatalogRows& rows, const std::string& tab
 
 }  // namespace
 
-void SqliteReader::read(CatalogRows& rows) {
+void SqliteReader::read(CatalogRows& rows, const CatalogReading& reading) {
     Connection connection(path_);
     connection.each("BEGIN", {}, [](const auto&) {});
     std::vector<std::string> tables;
@@ -117,7 +117,10 @@ void SqliteReader::read(CatalogRows& rows) {
             else
                 rows.views.push_back({{}, textIn(cells[1]), textIn(cells[2])});
         });
-    for (const std::string& table : tables) readTable(connection, rows, table);
+    for (const std::string& table : tables) {
+        reading.tell(rows);
+        readTable(connection, rows, table);
+    }
     connection.each("COMMIT", {}, [](const auto&) {});
 }
 

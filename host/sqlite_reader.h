@@ -10,7 +10,8 @@ namespace zr::host {
 class SqliteReader : public CatalogReader {
  public:
     explicit SqliteReader(std::string path) : path_(std::move(path)) {}
-    void read(CatalogRows& rows) override;
+    using CatalogReader::read;
+    void read(CatalogRows& rows, const CatalogReading& reading) override;
 
  private:
     std::string path_;

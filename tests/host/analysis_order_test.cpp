@@ -62,12 +62,12 @@ TEST_F(AnalysisOrder, TellsHowFarItIsAndCanBeEnded) {
         steps += std::to_string(done) + "/" + std::to_string(all) + " ";
     };
     analyseQueries(*database, note);
-    EXPECT_EQ(steps, "0/4 1/4 2/4 3/4 ");
+    EXPECT_EQ(steps, "0/2 1/2 ");
     steps.clear();
     analyseQueriesInRings(*database, note);
-    EXPECT_EQ(steps, "0/4 1/4 2/4 3/4 ");
+    EXPECT_EQ(steps, "0/2 1/2 ");
     const auto end = [](std::size_t done, std::size_t) {
-        if (done == 2) throw std::out_of_range("ended");
+        if (done == 1) throw std::out_of_range("ended");
     };
     EXPECT_THROW(analyseQueries(*database, end), std::out_of_range);
 }
@@ -81,17 +81,13 @@ TEST_F(AnalysisOrder, NestedQueriesAndBranchesOfUnionsCount) {
     EXPECT_EQ(order(), "a b c d");
 }
 
-TEST_F(AnalysisOrder, RingsAreNamedAndNothingIsAnalysed) {
+TEST_F(AnalysisOrder, RingsAreNamedAndLeaveTheOrder) {
     add(u"a", u"SELECT id FROM b");
     add(u"b", u"SELECT id FROM c");
     add(u"c", u"SELECT id FROM d, b");
     add(u"d", u"SELECT id FROM orders");
     EXPECT_EQ(complaint(), "queries read from each other in a ring: b reads from c reads from b");
     EXPECT_EQ(order(), "a b c d");
-    for (const CZRQueryInfo* query : database->Queries) {
-        EXPECT_TRUE(query->m_selectItems.IsEmpty());
-        EXPECT_TRUE(query->m_sourceTables.IsEmpty());
-    }
 }
 
 TEST_F(AnalysisOrder, RingsThroughNestedQueriesAreFound) {

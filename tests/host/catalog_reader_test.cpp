@@ -126,6 +126,31 @@ TEST_F(CatalogReading, LeavesOutTablesWhoseNameIsTaken) {
                                         "key mail_key: left out; there is no table Users"));
 }
 
+TEST_F(CatalogReading, MakesNoQueryOfAViewThatIsOpenYetKnowsItsName) {
+    rows.columns = {{u"a", u"users", u"id", u"int"}, {u"b", u"later", u"x", u"int"}};
+    rows.views = {{u"a", u"first", u"SELECT id FROM users"},
+                  {u"a", u"later", std::nullopt, true},
+                  {u"b", u"Later", u"SELECT 1"}};
+    make(DB_POSTGRESQL);
+    EXPECT_EQ(sql(u"first"), "SELECT id FROM users");
+    EXPECT_EQ(sql(u"later"), "no query");
+    EXPECT_THAT(columns(u"later"), ElementsAre("no table"));
+    EXPECT_THAT(rows.notes, ElementsAre("view b.Later: left out; there is one of that name already",
+                                        "table b.later: left out; there is a view of that name, in a"));
+}
+
+TEST_F(CatalogReading, TellsWhatWasReadSoFarAndEndsWhenItIsTold) {
+    const std::string file =
+        sqlite("CREATE TABLE t (a, b); CREATE TABLE u (a); CREATE VIEW v AS SELECT a FROM t");
+    std::vector<std::size_t> told;
+    zr::host::CatalogReading reading;
+    reading.look = [&](const CatalogRows& soFar) { told.push_back(soFar.columns.size()); };
+    readerFor(file)->read(rows, reading);
+    EXPECT_THAT(told, ElementsAre(0, 2));
+    reading.look = [](const CatalogRows&) { throw std::out_of_range("ended"); };
+    EXPECT_THROW(readerFor(file)->read(rows, reading), std::out_of_range);
+}
+
 TEST_F(CatalogReading, KeepsOfFunctionsOfOneNameTheOneWithTheMostParameters) {
     rows.functions = {{u"a", u"twice", 2}, {u"a", u"twice", 1}, {u"b", u"other", 0}, {u"a", u"none", 0}};
     const Database& made = make(DB_POSTGRESQL, u"a");

@@ -37,6 +37,7 @@ version=$(dpkg-deb --field "$work"/packages/zrsql_*.deb Version)
 has libzrparsersql Depends libantlr3c libicu libuuid1 libstdc++6
 has libzrparsersql-dev Depends "libzrparsersql (= $version)" libantlr3c-dev libicu-dev uuid-dev
 has zrsql Depends "libzrparsersql (= $version)" libsqlite3-0
+has zrsql Suggests mdbtools
 dpkg-deb --info "$work"/packages/libzrparsersql_*.deb shlibs | grep -q "^libzrparsersql 0 libzrparsersql (>= ${version%.*}), libzrparsersql (<< " || fail "no shlibs"
 dpkg-deb --info "$work"/packages/libzrparsersql_*.deb triggers | grep -q ldconfig || fail "no ldconfig trigger"
 for name in "${names[@]}"; do

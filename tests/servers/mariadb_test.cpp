@@ -6,6 +6,7 @@
 #include "broken_line.h"
 #include "expected_lineage.h"
 #include "host/catalog_reader.h"
+#include "host/project.h"
 #include "imports.h"
 
 namespace zr::test {
@@ -53,14 +54,14 @@ class FromMariaDb : public ServerTest {
 TEST_F(FromMariaDb, TheLineageIsTheExpectedOne) {
     const ProgramResult made = import(address("shop"), "mysql");
     ASSERT_EQ(made.exitStatus, 0) << made.errors;
-    EXPECT_EQ(made.output, "40 tables and 60 queries; 0 left out\n");
+    EXPECT_EQ(made.summary, "40 tables and 60 queries done");
 
     expectLineage(project(), {"lineage.txt", "lineage_mariadb.txt"}, "gaps_mariadb.txt");
 }
 
 TEST_F(FromMariaDb, TheOtherNameOfTheAddressAndTheSocketServeAsWell) {
     const std::string socket = "mysql://reader@localhost/?schema=shop&socket=" + server.folder() + "/socket";
-    EXPECT_EQ(import(socket, "mysql").output, "40 tables and 60 queries; 0 left out\n");
+    EXPECT_EQ(import(socket, "mysql").summary, "40 tables and 60 queries done");
 }
 
 TEST_F(FromMariaDb, RowsHaveTypesKeysAndFunctions) {
@@ -100,7 +101,29 @@ TEST_F(FromMariaDb, AViewWhoseTextTheUserMayNotSeeIsLeftOutWithALine) {
               "zrsql: mariadb://guest@127.0.0.1:" + server.port() +
                   "/shop: view all_products: left out; the server does not tell its text, for which the "
                   "user needs the right SHOW VIEW");
-    EXPECT_EQ(result.output, "40 tables and 0 queries; 60 left out\n");
+    EXPECT_EQ(result.summary, "40 tables and 0 queries done, 60 left out");
+}
+
+TEST_F(FromMariaDb, AReadingThatEndsWhileViewsAreReadCanBeGoneOnWith) {
+    ASSERT_EQ(import(address("shop"), "mysql").exitStatus, 0);
+    const std::string whole = readFile(project());
+
+    struct End {};
+    host::CatalogReading reading;
+    reading.look = [](const host::CatalogRows& rows) {
+        if (rows.isWholeButViews) throw End();
+    };
+    host::CatalogRows rows;
+    const auto reader = host::readerFor(address("shop"));
+    EXPECT_THROW(reader->read(rows, reading), End);
+    EXPECT_EQ(rows.views.size(), 60u);
+    host::saveProject(*host::makeDatabase(rows, DB_MYSQL, reader->schema()), project(),
+                      host::StorageForm::Json);
+    EXPECT_FALSE(readFile(project()) == whole);
+
+    const ProgramResult rest = runZrsql({"project", "import", address("shop"), project(), "--continue"});
+    EXPECT_EQ(rest.summary, "0 tables and 10 queries done, 40 tables and 50 queries there before");
+    EXPECT_TRUE(readFile(project()) == whole);
 }
 
 TEST_F(FromMariaDb, AViewThatNoLongerHoldsDoesNotKeepTheRestFromComing) {
@@ -108,7 +131,7 @@ TEST_F(FromMariaDb, AViewThatNoLongerHoldsDoesNotKeepTheRestFromComing) {
         "DROP TABLE shop.short_lived");
     const ProgramResult result = import(address("shop"), "mysql");
     sql("DROP VIEW shop.orphan");
-    EXPECT_EQ(result.output, "40 tables and 61 queries; 0 left out\n") << result.errors;
+    EXPECT_EQ(result.summary, "40 tables and 61 queries done") << result.errors;
 }
 
 TEST_F(FromMariaDb, ASchemaWithoutRightsIsNotThereForTheUser) {
@@ -118,7 +141,7 @@ TEST_F(FromMariaDb, ASchemaWithoutRightsIsNotThereForTheUser) {
 }
 
 TEST_F(FromMariaDb, AllSchemasThatTheUserMaySeeAreRead) {
-    EXPECT_THAT(import(address(""), "mysql").output, HasSubstr("42 tables and 61 queries"));
+    EXPECT_THAT(import(address(""), "mysql").summary, testing::StartsWith("42 tables and 61 queries done"));
 }
 
 TEST_F(FromMariaDb, ThePasswordComesFromTheClientsFileToo) {

@@ -7,6 +7,7 @@
 #include "expected_lineage.h"
 #include "host/catalog_reader.h"
 #include "imports.h"
+#include "started_program.h"
 
 namespace zr::test {
 namespace {
@@ -14,6 +15,7 @@ namespace {
 using testing::ElementsAre;
 using testing::HasSubstr;
 using testing::IsEmpty;
+using testing::MatchesRegex;
 
 constexpr const char* kPassword = "a secret: of reader\\s";
 const std::string kPsql = "psql -h FOLDER -p PORT -U owner -d postgres -q -v ON_ERROR_STOP=1 -AtF ' ' ";
@@ -52,13 +54,25 @@ class FromPostgresql : public ServerTest {
         return server.shell(kPsql + "-c \"" + statement + "\"").output;
     }
 
+    // Lets whoever reads a view on this table wait.
+    void lockCarriers() const {
+        server.shell("PGAPPNAME=holder " + kPsql +
+                     "-c 'BEGIN; LOCK TABLE shop.carriers; SELECT pg_sleep(60)' >/dev/null 2>&1 &");
+        while (sql("SELECT count(*) FROM pg_locks WHERE relation = 'shop.carriers'::regclass AND mode = "
+                   "'AccessExclusiveLock' AND granted") != "1\n") {
+        }
+    }
+    void unlockCarriers() const {
+        sql("SELECT pg_terminate_backend(pid) FROM pg_stat_activity WHERE application_name = 'holder'");
+    }
+
     const Variable password{"PGPASSWORD", kPassword};
 };
 
 TEST_F(FromPostgresql, TheLineageIsTheExpectedOne) {
     const ProgramResult made = import(address("postgres?schema=shop"), "postgresql");
     ASSERT_EQ(made.exitStatus, 0) << made.errors;
-    EXPECT_EQ(made.output, "40 tables and 60 queries; 0 left out\n");
+    EXPECT_EQ(made.summary, "40 tables and 60 queries done");
 
     expectLineage(project(), {"lineage.txt", "lineage_postgresql.txt"}, "gaps_postgresql.txt");
 }
@@ -173,7 +187,7 @@ TEST_F(FromPostgresql, AllSchemasAreReadAndOneWithoutRightsIsLeftOutWithALine) {
     EXPECT_THAT(splitLines(result.errors),
                 testing::Contains("zrsql: " + shown() +
                                   ": schema secret: left out; the user reader has no right to use it"));
-    EXPECT_THAT(result.output, HasSubstr(" 62 queries"));
+    EXPECT_THAT(result.summary, HasSubstr(" 62 queries"));
 }
 
 TEST_F(FromPostgresql, ASchemaWithoutRightsAloneGivesNoProject) {
@@ -188,7 +202,7 @@ TEST_F(FromPostgresql, ASchemaWithoutRightsAloneGivesNoProject) {
 TEST_F(FromPostgresql, TheAddressTellsTheDialectAndTheOptionTheSchema) {
     const ProgramResult result =
         runZrsql({"project", "import", address("postgres"), project(), "--schema", "shop", "--force"});
-    EXPECT_EQ(result.output, "40 tables and 60 queries; 0 left out\n") << result.errors;
+    EXPECT_EQ(result.summary, "40 tables and 60 queries done") << result.errors;
     EXPECT_THAT(runZrsql({"project", "list", project()}).output,
                 HasSubstr(": JSON, postgresql, schema shop\n"));
 }
@@ -264,15 +278,9 @@ TEST_F(FromPostgresql, AServerThatFallsSilentIsGivenUp) {
 }
 
 TEST_F(FromPostgresql, AViewThatWaitsForALockIsLeftOutAndTheRestGoesOn) {
-    // The lock is let go when its connection is ended, below.
-    const std::string folder = server.folder();
-    server.shell("PGAPPNAME=holder " + kPsql +
-                 "-c 'BEGIN; LOCK TABLE shop.carriers; SELECT pg_sleep(60)' >/dev/null 2>&1 &");
-    while (sql("SELECT count(*) FROM pg_locks WHERE relation = 'shop.carriers'::regclass AND mode = "
-               "'AccessExclusiveLock' AND granted") != "1\n") {
-    }
+    lockCarriers();
     const ProgramResult result = import(address("postgres?schema=shop&statement_timeout=2"), "postgresql");
-    sql("SELECT pg_terminate_backend(pid) FROM pg_stat_activity WHERE application_name = 'holder'");
+    unlockCarriers();
     EXPECT_EQ(result.exitStatus, 0) << result.errors;
     EXPECT_THAT(splitLines(result.errors),
                 ElementsAre("zrsql: " + shown() +
@@ -281,7 +289,67 @@ TEST_F(FromPostgresql, AViewThatWaitsForALockIsLeftOutAndTheRestGoesOn) {
                             "zrsql: " + shown() +
                                 ": while view shop.shipment_times was read: canceling statement "
                                 "due to lock timeout; it is left out"));
-    EXPECT_EQ(result.output, "40 tables and 58 queries; 2 left out\n");
+    EXPECT_EQ(result.summary, "40 tables and 58 queries done, 2 left out");
+}
+
+TEST_F(FromPostgresql, AnInterruptWhileViewsAreReadKeepsThoseThatWereAndTheRestCanBeAdded) {
+    const std::string source = address("postgres?schema=shop&statement_timeout=2");
+    ASSERT_EQ(import(source, "postgresql").summary, "40 tables and 60 queries done");
+    const std::string whole = readFile(project());
+    std::filesystem::remove(project());
+
+    lockCarriers();
+    StartedProgram program({"project", "import", source, project(), "--progress"});
+    std::string line;
+    do line = program.readErrorLine();
+    while (!line.empty() && !testing::Matches(MatchesRegex(".*: [1-9][0-9]* of 60 views read"))(line));
+    program.signal(SIGTERM);
+    const auto end = program.wait();
+    unlockCarriers();
+    EXPECT_EQ(end.exitStatus, 130) << end.errors;
+    EXPECT_THAT(
+        splitLines(end.errors).back(),
+        MatchesRegex("zrsql: interrupted: 40 tables and [1-9][0-9]* quer(y|ies) done, (1 left out, )?[1-9]"
+                     "[0-9]* views? not read, 0:0[0-9]; .*json holds what was read, and the same command "
+                     "with --continue goes on"));
+    EXPECT_EQ(runZrsql({"lineage", project()}).exitStatus, 0) << "what is kept is a project";
+
+    const ProgramResult rest = runZrsql({"project", "import", source, project(), "--continue"});
+    EXPECT_THAT(rest.summary,
+                MatchesRegex("0 tables and [1-9][0-9]* quer(y|ies) done, 40 tables and [1-9][0-9]* "
+                             "quer(y|ies) there before"));
+    EXPECT_EQ(rest.errors, "");
+    EXPECT_TRUE(readFile(project()) == whole);
+}
+
+TEST_F(FromPostgresql, AnInterruptLeavesAProjectThatWasToBeReplacedAsItWas) {
+    std::ofstream(project()) << "a project";
+    lockCarriers();
+    StartedProgram program(
+        {"project", "import", address("postgres?schema=shop"), project(), "--force", "--progress"});
+    std::string line;
+    do line = program.readErrorLine();
+    while (!line.empty() && line.find("of 60 views read") == std::string::npos);
+    program.signal(SIGINT);
+    const auto end = program.wait();
+    unlockCarriers();
+    EXPECT_EQ(end.exitStatus, 130);
+    EXPECT_EQ(splitLines(end.errors).back(),
+              "zrsql: interrupted while the catalogue was read; " + project() + " is as it was");
+    EXPECT_EQ(readFile(project()), "a project");
+}
+
+TEST_F(FromPostgresql, AnInterruptBeforeViewsAreReadLeavesNothing) {
+    const BrokenLine line(static_cast<unsigned>(std::stoi(server.port())), 3000, BrokenLine::Break::Silent);
+    StartedProgram program(
+        {"project", "import", address("postgres?schema=shop", line.port()), project(), "--progress"});
+    EXPECT_THAT(program.readErrorLine(), HasSubstr("0 tables read"));
+    program.signal(SIGINT);
+    const auto end = program.wait();
+    EXPECT_EQ(end.exitStatus, 130);
+    EXPECT_EQ(end.errors,
+              "zrsql: interrupted while the catalogue was read; " + project() + " was not made\n");
+    EXPECT_FALSE(std::filesystem::exists(project()));
 }
 
 TEST_F(FromPostgresql, NothingOfTheServerIsChanged) {

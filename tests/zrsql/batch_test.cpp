@@ -1,6 +1,7 @@
 #include "batch.h"
 
 #include <fcntl.h>
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <unistd.h>
 
@@ -212,32 +213,49 @@ TEST(ProgressText, OfTheSummaryTellsDoneAndFailed) {
     BatchState state = stateOf(1498, 2, 30000);
     EXPECT_EQ(summaryText(state), "1498 done, 2 failed, 0:30 (50/s)");
     state.interrupted = true;
-    EXPECT_EQ(summaryText(state), "interrupted: 1498 done, 2 failed, 0:30 (50/s)");
+    EXPECT_EQ(summaryText(state),
+              "interrupted: 1498 done, 2 failed, 0:30 (50/s); --skip 1500 goes on from there");
+    state.skipped = 700;
+    EXPECT_THAT(summaryText(state), testing::EndsWith("; --skip 2200 goes on from there"));
     EXPECT_EQ(summaryText(stateOf(0, 0, 0)), "0 done, 0 failed, 0:00 (0/s)");
+}
+
+void show(Progress& progress, const BatchState& state) {
+    progress.show(state.elapsed, progressText(state));
+}
+
+TEST(Progress, IsTakenAwayFromATerminal) {
+    const File screen = fileOf({});
+    Progress progress(screen.get(), true);
+    progress.clear();
+    show(progress, stateOf(1, 0, 1000));
+    progress.clear();
+    EXPECT_EQ(bytesOf(screen.get()), "\r1 queries, 1/s\r              \r");
 }
 
 TEST(Progress, StaysInOneLineOfATerminalAndCoversWhatStoodThere) {
     const File screen = fileOf({});
     Progress progress(screen.get(), true);
-    progress.show(stateOf(1000000, 0, 1000));
-    progress.show(stateOf(1000001, 0, 1001));  // too soon
-    progress.end(stateOf(1, 0, 2000));
+    show(progress, stateOf(1000000, 0, 1000));
+    show(progress, stateOf(1000001, 0, 1001));  // too soon
+    progress.end(summaryText(stateOf(1, 0, 2000)));
+    progress.clear();
     EXPECT_EQ(bytesOf(screen.get()), "\r1000000 queries, 1000000/s\r1 done, 0 failed, 0:02 (1/s)\n");
 }
 
 TEST(Progress, CoversALongerTextOnATerminal) {
     const File screen = fileOf({});
     Progress progress(screen.get(), true);
-    progress.show(stateOf(1000000, 0, 1000));
-    progress.show(stateOf(1, 0, 2000));
+    show(progress, stateOf(1000000, 0, 1000));
+    show(progress, stateOf(1, 0, 2000));
     EXPECT_EQ(bytesOf(screen.get()), "\r1000000 queries, 1000000/s\r1 queries, 1/s            ");
 }
 
 TEST(Progress, OfAFileIsALineASecond) {
     const File log = fileOf({});
     Progress progress(log.get(), false);
-    for (int elapsed = 100; elapsed < 2500; elapsed += 100) progress.show(stateOf(10, 0, elapsed));
-    progress.end(stateOf(10, 0, 5000));
+    for (int elapsed = 100; elapsed < 2500; elapsed += 100) show(progress, stateOf(10, 0, elapsed));
+    progress.end(summaryText(stateOf(10, 0, 5000)));
     EXPECT_EQ(bytesOf(log.get()),
               "10 queries, 100/s\n10 queries, 9/s\n10 queries, 5/s\n10 done, 0 failed, 0:05 (2/s)\n");
 }

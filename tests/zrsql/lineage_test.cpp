@@ -173,7 +173,7 @@ TEST_F(ZrsqlLineage, ImportsWhatItCanAndTellsTheRest) {
     const ProgramResult result =
         runZrsql({"project", "import", dump.path(), file("new.json"), "-d", "oracle"});
     EXPECT_EQ(result.exitStatus, 0) << result.errors;
-    EXPECT_EQ(result.output, "1 tables and 0 queries; 1 left out\n");
+    EXPECT_EQ(result.summary, "1 table and 0 queries done, 1 left out");
     EXPECT_EQ(result.errors, "zrsql: column t.a: left out; it is told twice\n");
     EXPECT_EQ(runZrsql({"project", "import", dump.path(), file("new.json"), "-d", "oracle"}).exitStatus, 1);
     const TemporaryFile empty("TABLE_NAME,COLUMN_NAME\n");

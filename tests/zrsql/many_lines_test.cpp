@@ -175,7 +175,9 @@ TEST(Interrupt, EndsARunThatWaitsForInput) {
     EXPECT_EQ(program.readRest(), "") << "the line that was begun is no line";
     const auto end = program.wait();
     EXPECT_EQ(end.exitStatus, 130);
-    EXPECT_EQ(end.errors, "");
+    EXPECT_THAT(end.errors,
+                MatchesRegex("zrsql: interrupted: 1 done, 0 failed, 0:0[0-9] \\([0-9]+/s\\); --skip 1 "
+                             "goes on from there\n"));
 }
 
 TEST(Interrupt, GivenTwiceEndsARunWhoseAnswersNobodyReads) {
@@ -197,7 +199,7 @@ TEST(ProgressOption, TellsOfAFileHowMuchTimeIsLeft) {
     const auto told = splitLines(result.errors);
     ASSERT_GE(told.size(), 2u);
     EXPECT_THAT(told.front(), MatchesRegex("[0-9]+ queries, [0-9]+/s, [0-9]+:[0-9][0-9] left"));
-    EXPECT_THAT(told.back(), MatchesRegex("300 done, 2 failed, [0-9]+:[0-9][0-9] \\([0-9]+/s\\)"));
+    EXPECT_THAT(told.back(), MatchesRegex("zrsql: 300 done, 2 failed, [0-9]+:[0-9][0-9] \\([0-9]+/s\\)"));
 }
 
 TEST(ProgressOption, TellsOfAPipeNoTimeLeft) {
@@ -206,7 +208,7 @@ TEST(ProgressOption, TellsOfAPipeNoTimeLeft) {
     ASSERT_EQ(splitLines(result.output).size(), 10u);
     ASSERT_GE(told.size(), 2u);
     EXPECT_THAT(told.front(), MatchesRegex("[0-9]+ queries, [0-9]+/s"));
-    EXPECT_THAT(told.back(), MatchesRegex("10 done, 0 failed, [0-9]+:[0-9][0-9] \\([0-9]+/s\\)"));
+    EXPECT_THAT(told.back(), MatchesRegex("zrsql: 10 done, 0 failed, [0-9]+:[0-9][0-9] \\([0-9]+/s\\)"));
 }
 
 TEST(ProgressOption, IsOffWhereNobodyAskedAndNoTerminalIsThere) {

@@ -8,6 +8,7 @@
 #include <csignal>
 #include <cstdlib>
 #include <fstream>
+#include <regex>
 #include <sstream>
 #include <stdexcept>
 #include <thread>
@@ -76,12 +77,29 @@ ProgramResult run(const std::vector<std::string>& words, const std::string& inpu
     return result;
 }
 
+// Long work ends with one line more on standard error.
+void takeSummaryOut(ProgramResult& result) {
+    static const std::regex form("zrsql: (.*), [0-9:]+[0-9](?: \\([0-9]+/s\\))?((?:; .*)?)\n");
+    if (result.errors.empty()) return;
+    const std::size_t before = result.errors.rfind('\n', result.errors.size() - 2);
+    const std::size_t start = before == std::string::npos ? 0 : before + 1;
+    const std::string last = result.errors.substr(start);
+    std::smatch parts;
+    if (!std::regex_match(last, parts, form)) return;
+    result.summary = parts[1].str() + parts[2].str();
+    result.errors.resize(start);
+}
+
 }  // namespace
 
 ProgramResult runZrsql(const std::vector<std::string>& arguments, const std::string& input) {
     std::vector<std::string> words = {ZR_BIN_DIR "/zrsql"};
     words.insert(words.end(), arguments.begin(), arguments.end());
-    return run(words, input);
+    ProgramResult result = run(words, input);
+    if (words.size() > 1 &&
+        (words[1] == "project" || words[1] == "lineage" || words[1] == "impact" || words[1] == "report"))
+        takeSummaryOut(result);
+    return result;
 }
 
 ProgramResult runShell(const std::string& line) {

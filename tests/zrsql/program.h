@@ -9,6 +9,7 @@ struct ProgramResult {
     int exitStatus = -1;  // -1 when a signal ended it
     std::string output;
     std::string errors;
+    std::string summary;  // the last line of long work, which is not among the errors, without the time
 };
 
 // Runs zrsql with the arguments and the bytes on its standard input, and waits for its end.

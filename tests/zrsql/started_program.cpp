@@ -33,6 +33,20 @@ std::string readAll(int descriptor) {
     return bytes;
 }
 
+// Without its end; empty when there is none. What is read beyond it is kept.
+std::string nextLine(int descriptor, std::string& kept) {
+    std::size_t end;
+    while ((end = kept.find('\n')) == std::string::npos) {
+        char block[1 << 12];
+        const ssize_t count = read(descriptor, block, sizeof block);
+        if (count <= 0) return {};
+        kept.append(block, static_cast<std::size_t>(count));
+    }
+    std::string line = kept.substr(0, end);
+    kept.erase(0, end + 1);
+    return line;
+}
+
 void closeOnce(int& descriptor) {
     if (descriptor >= 0) close(std::exchange(descriptor, -1));
 }
@@ -52,6 +66,7 @@ StartedProgram::StartedProgram(const std::vector<std::string>& arguments) {
         dup2(in.reading, STDIN_FILENO);
         dup2(out.writing, STDOUT_FILENO);
         dup2(err.writing, STDERR_FILENO);
+        std::signal(SIGTERM, SIG_DFL);
         std::signal(SIGINT, SIG_DFL);  // whoever runs the tests in the background may have it passed over
         execv(pointers[0], pointers.data());
         _exit(127);
@@ -82,16 +97,11 @@ void StartedProgram::closeInput() {
 }
 
 std::string StartedProgram::readLine() {
-    std::size_t end;
-    while ((end = read_.find('\n')) == std::string::npos) {
-        char block[1 << 12];
-        const ssize_t count = read(output_, block, sizeof block);
-        if (count <= 0) return {};
-        read_.append(block, static_cast<std::size_t>(count));
-    }
-    std::string line = read_.substr(0, end);
-    read_.erase(0, end + 1);
-    return line;
+    return nextLine(output_, read_);
+}
+
+std::string StartedProgram::readErrorLine() {
+    return nextLine(errors_, readErrors_);
 }
 
 std::string StartedProgram::readRest() {
@@ -106,7 +116,7 @@ StartedProgram::End StartedProgram::wait() {
     End end;
     closeInput();
     readAll(output_);
-    end.errors = readAll(errors_);
+    end.errors = std::exchange(readErrors_, {}) + readAll(errors_);
     int status = 0;
     rusage used{};
     wait4(std::exchange(child_, -1), &status, 0, &used);

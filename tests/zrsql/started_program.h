@@ -21,6 +21,8 @@ class StartedProgram {
     // The next line of its output without the end, or an empty text when there is none.
     std::string readLine();
     std::string readRest();
+    // The next line of what it tells on standard error; not told again by wait().
+    std::string readErrorLine();
     void signal(int number) const;
 
     struct End {
@@ -37,6 +39,7 @@ class StartedProgram {
     int output_ = -1;
     int errors_ = -1;
     std::string read_;
+    std::string readErrors_;
 };
 
 }  // namespace zr::test

@@ -71,6 +71,12 @@ class Writer {
  public:
     explicit Writer(const Batch& batch) : batch_(batch) { state_.allBytes = sizeOf(batch.input); }
 
+    // Before the writing begins.
+    void noteSkipped(const SkippedLines& skipped) {
+        state_.skipped = skipped.lines;
+        if (state_.allBytes) *state_.allBytes -= std::min(*state_.allBytes, skipped.bytes);
+    }
+
     void writeAll(ChunkWindow& window) {
         bool isBroken = false;
         while (const auto slot = window.oldest()) {
@@ -82,13 +88,12 @@ class Writer {
             state_.failed += slot->failed;
             state_.bytes += slot->chunk.lines.size();
             look();
-            if (batch_.progress) batch_.progress->show(state_);
+            if (batch_.progress) batch_.progress->show(state_.elapsed, progressText(state_));
         }
     }
     BatchState end(bool interrupted) {
         look();
         state_.interrupted = interrupted;
-        if (batch_.progress) batch_.progress->end(state_);
         return state_;
     }
 
@@ -117,13 +122,14 @@ BatchState runBatch(const Batch& batch) {
     Writer writer(batch);
     const InterruptWatch interrupt([&window] { window.stop(); });
     {
+        LineChunks chunks(batch.input, interrupt.descriptor());
+        writer.noteSkipped(chunks.skip(batch.skip));
         std::vector<std::jthread> threads;
         const Ender atTheEnd{window};
         for (unsigned job = 0; job < batch.jobs; ++job)
             threads.emplace_back(
                 [&window, &problem, worker = batch.newWorker()] { workAll(window, worker, problem); });
         threads.emplace_back([&writer, &window] { writer.writeAll(window); });
-        LineChunks chunks(batch.input, interrupt.descriptor());
         while (auto chunk = chunks.next())
             if (!window.put(std::move(*chunk))) break;
         window.end();

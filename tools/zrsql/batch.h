@@ -17,6 +17,7 @@ using LineWorker = std::function<bool(std::string_view line, std::uint64_t numbe
 struct Batch {
     int input = 0;  // a descriptor that is open; not closed
     std::FILE* output = nullptr;
+    std::uint64_t skip = 0;        // lines to pass over first; they count in the numbers of lines
     unsigned jobs = 1;             // threads that work
     Progress* progress = nullptr;  // null: none is shown
     std::function<LineWorker()> newWorker;

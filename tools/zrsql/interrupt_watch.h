@@ -9,9 +9,9 @@
 
 namespace zr::tool {
 
-// For its time makes the first interrupt (SIGINT) a call of a function, on a thread of its own; the second
-// one ends the program as usual. Threads that are to be left alone by the signal are started after it. A
-// program that was started to pass interrupts over passes them over.
+// For its time makes the first interrupt (SIGINT, SIGTERM) a call of a function, on a thread of its own; the
+// second one ends the program as usual. Threads that are to be left alone by the signals are started after
+// it. A program that was started to pass interrupts over passes them over.
 class InterruptWatch {
  public:
     explicit InterruptWatch(std::function<void()> onInterrupt);
@@ -25,8 +25,10 @@ class InterruptWatch {
 
  private:
     void watch();
-    bool waitForInterrupt() const;
+    int waitForInterrupt() const;
 
+    const sigset_t interrupts_;
+    const int last_;  // of them; 0 when there is none
     const std::function<void()> onInterrupt_;
     std::array<int, 2> pipe_{};
     sigset_t before_{};

@@ -3,23 +3,39 @@
 #include <poll.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 
 namespace zr::tool {
 
+SkippedLines LineChunks::skip(std::uint64_t lines) {
+    SkippedLines skipped;
+    while (skipped.lines < lines) {
+        const auto chunk = nextUpTo(lines - skipped.lines);
+        if (!chunk) break;
+        skipped.lines += nextLine_ - chunk->firstLine;
+        skipped.bytes += chunk->lines.size();
+    }
+    return skipped;
+}
+
 std::optional<LineChunk> LineChunks::next() {
+    return nextUpTo(kMostLines);
+}
+
+std::optional<LineChunk> LineChunks::nextUpTo(std::uint64_t lines) {
     while (!interrupted_) {
-        if (auto chunk = cut()) return chunk;
+        if (auto chunk = cut(std::min<std::uint64_t>(lines, kMostLines))) return chunk;
         if (!fill()) break;
     }
     if (interrupted_ || start_ == buffer_.size()) return std::nullopt;
     return take(buffer_.size(), 1);
 }
 
-std::optional<LineChunk> LineChunks::cut() {
+std::optional<LineChunk> LineChunks::cut(std::uint64_t mostLines) {
     std::size_t end = start_;
     std::uint64_t lines = 0;
-    while (lines < kMostLines && end - start_ < kMostBytes) {
+    while (lines < mostLines && end - start_ < kMostBytes) {
         const std::size_t lineEnd = buffer_.find('\n', scanned_);
         if (lineEnd == std::string::npos) {
             scanned_ = buffer_.size();

@@ -19,6 +19,11 @@ struct LineChunk {
     std::uint64_t firstLine = 0;  // its number in the input, from 1
 };
 
+struct SkippedLines {
+    std::uint64_t lines = 0;
+    std::uint64_t bytes = 0;
+};
+
 // Reads the lines of an open file or pipe in chunks. A chunk holds what is there: no line waits for input
 // that comes behind it. Memory is bounded by the chunk and the longest line.
 class LineChunks {
@@ -29,11 +34,14 @@ class LineChunks {
     // Neither is closed. The reading ends as soon as `interrupt` can be read from; -1: never.
     LineChunks(int input, int interrupt) : input_(input), interrupt_(interrupt) {}
 
+    // Passes lines over, as many as there are. Throws ReadError.
+    SkippedLines skip(std::uint64_t lines);
     // The next chunk, or nothing at the end and after an interrupt. Throws ReadError.
     std::optional<LineChunk> next();
 
  private:
-    std::optional<LineChunk> cut();
+    std::optional<LineChunk> nextUpTo(std::uint64_t lines);
+    std::optional<LineChunk> cut(std::uint64_t mostLines);
     LineChunk take(std::size_t end, std::uint64_t lines);
     bool fill();
 

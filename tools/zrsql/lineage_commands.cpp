@@ -4,7 +4,9 @@
 
 #include "host/file_replacement.h"
 #include "lineage_format.h"
+#include "long_work.h"
 #include "project_commands.h"
+#include "query_summary.h"
 #include "report_page.h"
 #include "traced_project.h"
 
@@ -32,23 +34,30 @@ void writeReport(const LineageOptions& options, TracedProject& project, std::str
 
 }  // namespace
 
-void runLineage(const LineageOptions& options, std::string& out) {
-    LongWork work("following " + options.file);
+Told runLineage(const LineageOptions& options) {
+    LongWork work("following " + options.file, options.showsProgress);
     TracedProject project(options.file, &work);
-    if (options.command == LineageCommand::Lineage) {
-        const auto queries = queriesOf(options, project.database());
-        std::size_t done = 0;
-        for (const CZRQueryInfo* query : queries) {
-            project.step(done++);
-            project.lineage().tracer().columnsOf(*query);  // what it finds is kept
-        }
-        return appendLineage(out, options.format, project, queries);
+    host::Lineage& lineage = project.lineage();
+    const auto queries = queriesOf(options, project.database());
+    QuerySummary summary;
+    std::size_t done = 0;
+    for (const CZRQueryInfo* query : queries) {
+        work.step("followed", done++, queries.size());
+        const auto& columns = lineage.tracer().columnsOf(*query);  // what it finds is kept
+        summary.add(
+            {lineage.isInRing(*query), lineage.tracer().missingOf(*query), hasUnknownSource(columns)});
     }
-    if (options.command == LineageCommand::Report) return writeReport(options, project, out);
-    const auto target = project.lineage().find(CString::fromUtf8(options.target));
-    if (!target)
-        throw ProjectFailure(options.file + ": there is no table, query or column " + options.target);
-    appendImpact(out, options.format, project, *target);
+    Told told;
+    if (options.command == LineageCommand::Lineage) appendLineage(told.out, options.format, project, queries);
+    if (options.command == LineageCommand::Report) writeReport(options, project, told.out);
+    if (options.command == LineageCommand::Impact) {
+        const auto target = lineage.find(CString::fromUtf8(options.target));
+        if (!target)
+            throw ProjectFailure(options.file + ": there is no table, query or column " + options.target);
+        appendImpact(told.out, options.format, project, *target);
+    }
+    told.summary = summary.summary(work.elapsed());
+    return told;
 }
 
 }  // namespace zr::tool

@@ -1,13 +1,12 @@
 #pragma once
 
-#include <string>
-
 #include "lineage_options.h"
+#include "told.h"
 
 namespace zr::tool {
 
-// Does what "zrsql lineage", "zrsql impact" or "zrsql report" says and appends what it has to tell. Raises
-// ProjectFailure (project_commands.h) or an error of the host's project (host/project.h).
-void runLineage(const LineageOptions& options, std::string& out);
+// Does what "zrsql lineage", "zrsql impact" or "zrsql report" says. Raises ProjectFailure
+// (project_commands.h), Interrupted (long_work.h) or an error of the host's project (host/project.h).
+Told runLineage(const LineageOptions& options);
 
 }  // namespace zr::tool

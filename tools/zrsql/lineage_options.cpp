@@ -2,6 +2,8 @@
 
 #include <CLI/CLI.hpp>
 
+#include "progress_option.h"
+
 namespace zr::tool {
 
 CLI::App* LineageWords::add(CLI::App& app, const std::string& name, const std::string& help,
@@ -12,6 +14,7 @@ CLI::App* LineageWords::add(CLI::App& app, const std::string& name, const std::s
         added->add_option("--format", format_, "Form of the output: " + CLI::detail::join(formats, ", "))
             ->check(CLI::IsMember(formats))
             ->type_name("FORMAT");
+    addProgressTo(*added, options_.showsProgress);
     commands_.push_back(added);
     return added;
 }

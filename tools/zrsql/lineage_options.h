@@ -20,6 +20,7 @@ struct LineageOptions {
     std::vector<std::string> queries;  // lineage: empty for all
     std::string target;                // impact
     std::string output = "-";          // report: - is standard output
+    bool showsProgress = false;
 };
 
 // The words of the command line behind "lineage", "impact" and "report". They are stored where the object is,

@@ -3,8 +3,12 @@
 #include <chrono>
 #include <csignal>
 #include <cstddef>
+#include <functional>
 #include <stdexcept>
 #include <string>
+
+#include "progress.h"
+#include "summary.h"
 
 namespace zr::tool {
 
@@ -15,27 +19,40 @@ class Interrupted : public std::runtime_error {
 };
 
 // A piece of work of many steps. While it lives an interrupt (SIGINT, SIGTERM) lets the next step raise
-// Interrupted, and a second one ends the program at once. On a terminal standard error shows how far it is.
-// One at a time.
+// Interrupted, and a second one of the kind ends the program at once; a program that was started to pass
+// interrupts over passes them over. How far it is goes to standard error: on a terminal when it takes
+// noticeably long, elsewhere when it is asked for. One at a time.
 class LongWork {
  public:
-    // What is being done, such as "analysing shop.json".
-    explicit LongWork(std::string what);
+    LongWork(std::string what, bool showsProgress);
     ~LongWork();
     LongWork(const LongWork&) = delete;
     LongWork& operator=(const LongWork&) = delete;
 
-    void step(std::size_t done, std::size_t all);
+    // As long as nothing is worth being kept an interrupt may end the program at once, wherever it waits:
+    // with this line and the status of interrupted programs.
+    void endAtOnceWith(const std::string& line);
+    // From here on it is the next step again that an interrupt ends.
+    void endAtSteps();
+
+    // Tells how far it is, such as "500 tables". Raises Interrupted.
+    void step(const std::function<std::string()>& far);
+    // Of work that writes nothing before its end: so many of the project's queries are "analysed".
+    void step(const char* verb, std::size_t done, std::size_t all);
+
+    std::chrono::milliseconds elapsed() const;
 
  private:
-    void show(std::size_t done, std::size_t all);
-
     const std::string what_;
+    const bool isTerminal_;
     const bool isShown_;
-    bool hasLine_ = false;
-    std::chrono::steady_clock::time_point next_;
+    Progress progress_;
+    const std::chrono::steady_clock::time_point start_ = std::chrono::steady_clock::now();
     struct sigaction oldInterrupt_ = {};
     struct sigaction oldEnd_ = {};
 };
+
+// The exit status of a program that was interrupted, as shells have it for SIGINT.
+inline constexpr int kInterruptedStatus = 130;
 
 }  // namespace zr::tool

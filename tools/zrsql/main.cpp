@@ -29,7 +29,6 @@ namespace {
 
 constexpr int kUnreadable = 1;
 constexpr int kWrongUse = 2;
-constexpr int kInterrupted = 130;  // as shells tell a program that SIGINT ended
 
 std::unique_ptr<CZRDatabaseInfo> openDatabase(const Options& options) {
     if (options.catalog.empty()) return std::make_unique<host::Database>();
@@ -143,6 +142,7 @@ int runLines(const Options& options, const CZRDatabaseInfo& catalogue) {
     batch.input = input.descriptor();
     batch.output = stdout;
     batch.jobs = options.jobs;
+    batch.skip = options.skip;
     if (options.showsProgress || isTerminal) batch.progress = &progress;
     // An analysis writes user functions into its database, and a look-up of columns marks sources. Clones
     // keep the IDs, so that all threads answer alike.
@@ -153,7 +153,9 @@ int runLines(const Options& options, const CZRDatabaseInfo& catalogue) {
         };
     };
     try {
-        return runBatch(batch).interrupted ? kInterrupted : 0;
+        const BatchState end = runBatch(batch);
+        if (batch.progress || end.interrupted) progress.end("zrsql: " + summaryText(end));
+        return end.interrupted ? kInterruptedStatus : 0;
     } catch (const ReadError&) {
         throw InputError(options.jsonLines + ": can't be read to its end");
     }
@@ -162,13 +164,11 @@ int runLines(const Options& options, const CZRDatabaseInfo& catalogue) {
 // Gives the exit status.
 int run(const Options& options) {
     if (options.project || options.lineage) {
-        std::string told;
-        if (options.project)
-            runProject(*options.project, told);
-        else
-            runLineage(*options.lineage, told);
-        std::fwrite(told.data(), 1, told.size(), stdout);
-        return 0;
+        const Told told = options.project ? runProject(*options.project) : runLineage(*options.lineage);
+        std::fwrite(told.out.data(), 1, told.out.size(), stdout);
+        if (std::fflush(stdout) == 0 && told.summary)
+            std::fprintf(stderr, "zrsql: %s\n", summaryText(*told.summary).c_str());
+        return told.summary && told.summary->interrupted ? kInterruptedStatus : 0;
     }
     const auto database = openDatabase(options);
     if (!options.jsonLines.empty()) return runLines(options, *database);
@@ -201,7 +201,7 @@ int main(int argc, char** argv) {
         return kWrongUse;
     } catch (const Interrupted& interrupt) {
         std::fprintf(stderr, "zrsql: %s\n", interrupt.what());
-        return kInterrupted;
+        return kInterruptedStatus;
     } catch (const std::exception& problem) {
         std::fprintf(stderr, "zrsql: %s\n", problem.what());
         return kUnreadable;

@@ -22,6 +22,7 @@ struct Words {
     std::string format;
     std::string catalog;
     unsigned jobs = 1;
+    std::uint64_t skip = 0;
     bool showsProgress = false;
 };
 
@@ -47,6 +48,12 @@ CLI::App* addCommand(CLI::App& app, Words& words, const std::string& name, const
             ->excludes(file);
     command->add_option("--jobs", words.jobs, "Threads to work on the lines of --jsonl; 0 is one a processor")
         ->check(CLI::Range(0u, kMostJobs))
+        ->needs(jsonLines)
+        ->type_name("N");
+    command
+        ->add_option("--skip", words.skip,
+                     "Pass the first N lines of --jsonl over, to go on behind a run that was interrupted")
+        ->check(CLI::NonNegativeNumber)
         ->needs(jsonLines)
         ->type_name("N");
     command
@@ -133,6 +140,7 @@ std::optional<Options> readOptions(int argc, char** argv, int& exitStatus) {
     options.asPicture = words.format == "pretty";
     options.catalog = words.catalog;
     options.jobs = words.jobs ? words.jobs : std::clamp(std::thread::hardware_concurrency(), 1u, kMostJobs);
+    options.skip = words.skip;
     options.showsProgress = words.showsProgress;
     return options;
 }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstdint>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -23,6 +24,7 @@ struct Options {
     bool asPicture = false;                 // analyze: for a person instead of JSON
     std::string catalog;                    // empty: none
     unsigned jobs = 1;                      // at least 1
+    std::uint64_t skip = 0;                 // lines of jsonLines to pass over first
     bool showsProgress = false;             // where standard error is a terminal it is shown anyway
     std::optional<ProjectOptions> project;  // given: nothing of the above counts
     std::optional<LineageOptions> lineage;  // as well

@@ -1,60 +1,54 @@
 #include "progress.h"
 
-#include <algorithm>
-#include <cmath>
+#include "summary.h"
 
 namespace zr::tool {
 
-namespace {
-
-double seconds(const BatchState& state) {
-    return std::chrono::duration<double>(state.elapsed).count();
-}
-
-std::string rate(const BatchState& state) {
-    const double passed = std::max(seconds(state), 0.001);
-    return std::to_string(std::llround(static_cast<double>(state.done + state.failed) / passed)) + "/s";
-}
-
-// 0:07, 12:30, 1:02:03
-std::string clockText(double time) {
-    const auto whole = static_cast<std::uint64_t>(std::ceil(time));
-    const auto twoDigits = [](std::uint64_t number) {
-        return (number < 10 ? "0" : "") + std::to_string(number);
-    };
-    const std::uint64_t hours = whole / 3600, minutes = whole / 60 % 60;
-    const std::string front =
-        hours ? std::to_string(hours) + ":" + twoDigits(minutes) : std::to_string(minutes);
-    return front + ":" + twoDigits(whole % 60);
-}
-
-}  // namespace
-
 std::string progressText(const BatchState& state) {
-    std::string text = std::to_string(state.done + state.failed) + " queries, " + rate(state);
+    const std::uint64_t answered = state.done + state.failed;
+    std::string text = std::to_string(answered) + " queries, " + rateText(answered, state.elapsed);
     if (state.allBytes && state.bytes > 0) {
         const std::uint64_t left = *state.allBytes > state.bytes ? *state.allBytes - state.bytes : 0;
-        text += ", " +
-                clockText(seconds(state) * static_cast<double>(left) / static_cast<double>(state.bytes)) +
-                " left";
+        const double passed = std::chrono::duration<double>(state.elapsed).count();
+        text +=
+            ", " + clockText(passed * static_cast<double>(left) / static_cast<double>(state.bytes)) + " left";
     }
     return text;
 }
 
 std::string summaryText(const BatchState& state) {
-    return (state.interrupted ? "interrupted: " : "") + std::to_string(state.done) + " done, " +
-           std::to_string(state.failed) + " failed, " + clockText(seconds(state)) + " (" + rate(state) + ")";
+    Summary summary;
+    summary.interrupted = state.interrupted;
+    summary.parts = {std::to_string(state.done) + " done", std::to_string(state.failed) + " failed"};
+    summary.elapsed = state.elapsed;
+    summary.counted = state.done + state.failed;
+    if (state.interrupted)
+        summary.goesOn =
+            "--skip " + std::to_string(state.skipped + state.done + state.failed) + " goes on from there";
+    return summaryText(summary);
 }
 
-void Progress::show(const BatchState& state) {
+bool Progress::isDue(std::chrono::milliseconds elapsed) const {
     const std::chrono::milliseconds pause(isTerminal_ ? 100 : 1000);
-    if (shown_ && state.elapsed - *shown_ < pause) return;
-    shown_ = state.elapsed;
-    write(progressText(state), false);
+    return !shown_ || elapsed - *shown_ >= pause;
 }
 
-void Progress::end(const BatchState& state) {
-    write(summaryText(state), true);
+void Progress::show(std::chrono::milliseconds elapsed, const std::string& text) {
+    if (!isDue(elapsed)) return;
+    shown_ = elapsed;
+    write(text, false);
+}
+
+void Progress::end(const std::string& text) {
+    write(text, true);
+}
+
+void Progress::clear() {
+    if (!isTerminal_ || width_ == 0) return;
+    const std::string blanks(width_, ' ');
+    std::fprintf(out_, "\r%s\r", blanks.c_str());
+    std::fflush(out_);
+    width_ = 0;
 }
 
 void Progress::write(const std::string& text, bool isLast) {
@@ -63,7 +57,7 @@ void Progress::write(const std::string& text, bool isLast) {
     line += text;
     if (isTerminal_ && text.size() < width_) line.append(width_ - text.size(), ' ');
     if (!isTerminal_ || isLast) line += '\n';
-    width_ = text.size();
+    width_ = isLast ? 0 : text.size();
     std::fwrite(line.data(), 1, line.size(), out_);
     std::fflush(out_);
 }

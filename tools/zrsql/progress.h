@@ -10,6 +10,7 @@ namespace zr::tool {
 
 // How far a run over many lines is.
 struct BatchState {
+    std::uint64_t skipped = 0;              // lines passed over ahead of the run
     std::uint64_t done = 0;                 // lines that have their answer
     std::uint64_t failed = 0;               // lines answered with an error, not among those
     std::uint64_t bytes = 0;                // of the input, answered
@@ -21,17 +22,23 @@ struct BatchState {
 // "1500 queries, 300/s, 0:25 left"; without the time where the size is not known.
 std::string progressText(const BatchState& state);
 
-// "1498 done, 2 failed, 0:30 (50/s)", with "interrupted: " ahead where that is so.
+// "1498 done, 2 failed, 0:30 (50/s)", with "interrupted: " ahead where that is so, and then with the option
+// that goes on.
 std::string summaryText(const BatchState& state);
 
-// Shows the progress, not more often than a person can read: in one line of a terminal, else in lines of
-// their own.
+// Shows how far a piece of work is, not more often than a person can read: in one line of a terminal, else in
+// lines of their own.
 class Progress {
  public:
     Progress(std::FILE* shownOn, bool isTerminal) : out_(shownOn), isTerminal_(isTerminal) {}
 
-    void show(const BatchState& state);
-    void end(const BatchState& state);
+    // Whether it is time to show something.
+    bool isDue(std::chrono::milliseconds elapsed) const;
+    void show(std::chrono::milliseconds elapsed, const std::string& text);
+    // The last line.
+    void end(const std::string& text);
+    // Takes away what stands in a terminal's line.
+    void clear();
 
  private:
     void write(const std::string& text, bool isLast);

@@ -3,6 +3,7 @@
 #include <CLI/CLI.hpp>
 
 #include "host/catalog_reader.h"
+#include "progress_option.h"
 
 namespace zr::tool {
 
@@ -33,11 +34,12 @@ CLI::App* ProjectWords::add(const std::string& name, const std::string& help, Pr
     return added;
 }
 
-void ProjectWords::addForm(CLI::App& app) {
+// Gives the option that replaces a file.
+CLI::Option* ProjectWords::addForm(CLI::App& app) {
     app.add_option("--form", form_, "Form of the file: json or sqlite; otherwise its name's ending tells")
         ->check(CLI::IsMember({"json", "sqlite"}))
         ->type_name("FORM");
-    app.add_flag("--force", options_.force, "Replace the file when it is there");
+    return app.add_flag("--force", options_.force, "Replace the file when it is there");
 }
 
 void ProjectWords::addTo(CLI::App& app) {
@@ -82,12 +84,19 @@ void ProjectWords::addTo(CLI::App& app) {
         ->type_name("FILE")
         ->allow_extra_args(false);
     imported->add_option("--schema", options_.schema, "Take this schema or owner only")->type_name("NAME");
-    addForm(*imported);
+    CLI::Option* force = addForm(*imported);
+    imported
+        ->add_flag("--continue", options_.goesOn,
+                   "Add to the project, where it is there, what it does not have yet: goes on behind an "
+                   "import that was interrupted")
+        ->excludes(force);
+    addProgressTo(*imported, options_.showsProgress);
     imported->footer(
         "Examples:\n  zrsql project import columns.csv shop.json -d mssql --also views.csv --schema dbo\n"
         "  zrsql project import mysql://reader@db.example/shop shop.json\n\n"
         "Passwords are taken from PGPASSWORD or ~/.pgpass, MYSQL_PWD or ~/.my.cnf.\n"
-        "What can't be taken in is told on standard error, a line each, and the rest goes on.");
+        "What can't be taken in is told on standard error, a line each, and the rest goes on. An interrupt\n"
+        "while the texts of views are read leaves a project with those that were read.");
 
     CLI::App* table = add("add-table", "Add a table", ProjectCommand::AddTable);
     table->add_option("NAME", options_.name, "Name of the table")->required();
@@ -137,15 +146,16 @@ void ProjectWords::addTo(CLI::App& app) {
     analyze->add_option("--format", format_, "Form of the output: pretty, json")
         ->check(CLI::IsMember({"pretty", "json"}))
         ->type_name("FORMAT");
+    addProgressTo(*analyze, options_.showsProgress);
     analyze->footer(
         "Example:\n  zrsql project analyze shop.json all_orders\n\n"
-        "Each query is analysed behind those that it reads from. Queries that read from each other in a\n"
+        "Each query is shown behind those that it reads from. Queries that read from each other in a\n"
         "ring are an error. Wrong SQL is none: what was read of it is shown.");
     project_->footer(
         "A project that is read may have any name. One that is made is JSON for a name that ends in .json,\n"
         "SQLite for .db, .sqlite or .sqlite3. Exit status: 0 done, 1 a file can't be read or written or is "
         "no\n"
-        "whole project, 2 wrong use.");
+        "whole project, 2 wrong use, 130 interrupted.");
 }
 
 std::optional<ProjectOptions> ProjectWords::read() const {

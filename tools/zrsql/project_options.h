@@ -9,7 +9,8 @@
 
 namespace CLI {
 class App;
-}
+class Option;
+}  // namespace CLI
 
 namespace zr::tool {
 
@@ -28,6 +29,8 @@ struct ProjectOptions {
     std::vector<std::string> catalogues;  // import: files to read
     host::StorageForm form{};             // new, convert
     bool force = false;                   // new, convert, import: replace a file that is there
+    bool goesOn = false;                  // import: add to a project that is there what it lacks
+    bool showsProgress = false;           // import, analyze
     const Dialect* dialect{};             // new, import
     std::string schema;                   // new
     std::string catalog;                  // new: tables to begin with
@@ -52,7 +55,7 @@ class ProjectWords {
 
  private:
     CLI::App* add(const std::string& name, const std::string& help, ProjectCommand command);
-    void addForm(CLI::App& app);
+    CLI::Option* addForm(CLI::App& app);
 
     CLI::App* project_ = nullptr;
     std::vector<std::pair<CLI::App*, ProjectCommand>> commands_;

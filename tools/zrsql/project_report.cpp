@@ -1,6 +1,5 @@
 #include "project_report.h"
 
-#include "analyst.h"
 #include "dialects.h"
 #include "host/descriptor_access.h"
 #include "host/filters.h"
@@ -199,7 +198,7 @@ void appendQueryText(std::string& out, const CZRQueryInfo& query) {
 }
 
 void appendAnalysis(std::string& out, const CZRQueryInfo& query, host::ColumnTracer& tracer,
-                    const Dialect& dialect) {
+                    const ReadPlace& read) {
     Text text = u"Query " + textOf(query.GetSrcName()) + u'\n';
     TextTable columns;
     std::size_t place = 0;
@@ -220,12 +219,12 @@ void appendAnalysis(std::string& out, const CZRQueryInfo& query, host::ColumnTra
         sources.add({textOf(source->key), meaning == "unknown" ? u"not in the project" : textOf(meaning)});
     }
     appendBlock(text, u"Sources", sources);
-    appendStop(text, readPlace(dialect, query.m_sql));
+    appendStop(text, read);
     appendUtf8(out, text);
 }
 
 void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, host::ColumnTracer& tracer,
-                        const Dialect& dialect) {
+                        const ReadPlace& read) {
     out += '{';
     JsonMembers members(out);
     members.text("name", query.GetSrcName().View());
@@ -243,7 +242,7 @@ void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, host::Colum
     }
     out += ']';
     members.name("read");
-    appendRead(out, readPlace(dialect, query.m_sql));
+    appendRead(out, read);
     out += '}';
 }
 

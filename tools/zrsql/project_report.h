@@ -2,7 +2,7 @@
 
 #include <string>
 
-#include "dialects.h"
+#include "analyst.h"
 #include "host/column_tracer.h"
 #include "host/project.h"
 
@@ -21,9 +21,9 @@ void appendQueryText(std::string& out, const CZRQueryInfo& query);
 // An analysed query: its result columns with where each comes from, its sources, and how far its text was
 // read.
 void appendAnalysis(std::string& out, const CZRQueryInfo& query, host::ColumnTracer& tracer,
-                    const Dialect& dialect);
+                    const ReadPlace& read);
 // The same as a JSON object.
 void appendAnalysisJson(std::string& out, const CZRQueryInfo& query, host::ColumnTracer& tracer,
-                        const Dialect& dialect);
+                        const ReadPlace& read);
 
 }  // namespace zr::tool

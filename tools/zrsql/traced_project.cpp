@@ -11,7 +11,7 @@ TracedProject::TracedProject(const std::string& file, LongWork* work)
       lineage_(std::make_unique<host::Lineage>(
           *database_, [this](const CZRQueryInfo& query) { return !readPlaceOf(query).stop; },
           [this](std::size_t done, std::size_t all) {
-              if (work_) work_->step(done, all);
+              if (work_) work_->step("analysed", done, all);
           })) {}
 
 const ReadPlace& TracedProject::readPlaceOf(const CZRQueryInfo& query) {

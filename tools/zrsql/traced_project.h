@@ -21,7 +21,7 @@ class TracedProject {
     host::Lineage& lineage() { return *lineage_; }
     // Before each query of the project that is told about; raises Interrupted (long_work.h).
     void step(std::size_t done) {
-        if (work_) work_->step(done, static_cast<std::size_t>(database_->Queries.GetCount()));
+        if (work_) work_->step("written", done, static_cast<std::size_t>(database_->Queries.GetCount()));
     }
     // How far the text of a query of the project was read.
     const ReadPlace& readPlaceOf(const CZRQueryInfo& query);
