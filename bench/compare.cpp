@@ -191,7 +191,8 @@ void tell(const std::vector<Reader>& readers, const std::vector<Text>& texts,
             middleToken.push_back(middle.back() / texts[k].query.tokens);
         }
         std::printf("  %-12s %7zu %7zu %10.0f %10.0f %10.0f %10.0f\n", readers[i].name, least.size(),
-                    median(least), median(middle), median(leastToken), median(middleToken));
+                    texts.size() - least.size(), median(least), median(middle), median(leastToken),
+                    median(middleToken));
         for (const auto& bar : kTokenBars)
             if (!least.empty() && std::string(bar.reader) == readers[i].name)
                 std::printf("  %-12s at most %.0f ns/token: %s\n", "", bar.most,
