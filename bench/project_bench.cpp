@@ -1,4 +1,5 @@
-/// Saving, loading, analysing and resolving a project of 2,000 tables with 50,000 columns and 5,000 queries.
+/// Saving, loading, analysing and resolving a project of 2,000 tables with 50,000 columns and 5,000 queries,
+/// and each of these steps for one query by itself.
 
 #include <benchmark/benchmark.h>
 #include <zrparsersql/analysis.h>
@@ -8,6 +9,7 @@
 #include "bench/counting_heap.h"
 #include "bench/large_project.h"
 #include "host/project.h"
+#include "host/stored_tree.h"
 
 namespace {
 
@@ -99,6 +101,64 @@ void resolve(benchmark::State& state) {
         benchmark::Counter(static_cast<double>(correct), benchmark::Counter::kAvgIterations);
 }
 
+/// The last query of a chain of four, which reads from the one before it, in a project of its own.
+struct OneQuery {
+    std::unique_ptr<Database> database = zr::bench::makeProject({28, 25, 4});
+    CZRQueryInfo& query = *database->Queries.GetTail();
+};
+
+/// One step of one query, over and over. A step is given an analysed and resolved query.
+template <class Step>
+void oneQuery(benchmark::State& state, Step step) {
+    OneQuery one;
+    analyseAll(*one.database);
+    for (CZRQueryInfo* query : one.database->Queries) {
+        query->ResolveSources();
+        query->ResolveAllItems();
+    }
+    for (auto _ : state) step(one.query);
+    const zr::bench::HeapCount count;
+    step(one.query);
+    state.counters["allocs"] = static_cast<double>(count.use().allocations);
+    state.counters["peak KB"] = static_cast<double>(count.use().peakBytes) / 1e3;
+}
+
+/// What a section of a project's file is written from.
+zr::host::StoredTree saved(CZRQueryInfo& query) {
+    zr::host::StoredTree tree;
+    zr::host::TreeStorage storage(tree, zr::host::TreeStorage::Use::Save);
+    query.Save(storage);
+    return tree;
+}
+
+void registerOneQuery() {
+    const auto add = [](const char* name, auto step) {
+        benchmark::RegisterBenchmark((std::string("one_query/") + name).c_str(),
+                                     [step](benchmark::State& state) { oneQuery(state, step); });
+    };
+    // Each is made anew, since what an analysis replaces stays with its descriptor.
+    add("analyse", [](CZRQueryInfo& query) {
+        CZRQueryInfo made;
+        made.SetDatabase(query.GetDatabase());
+        made.SetSQL(query.GetSQL());
+        BuildQueryInfo(&made, DB_MSSQL);
+    });
+    add("resolve", [](CZRQueryInfo& query) {
+        query.ResolveSources();
+        benchmark::DoNotOptimize(query.GetCorrect());
+        query.ResolveAllItems();
+    });
+    add("copy", [](CZRQueryInfo& query) { delete query.Clone(); });
+    add("save", [](CZRQueryInfo& query) { benchmark::DoNotOptimize(saved(query)); });
+    add("load", [](CZRQueryInfo& query) {
+        static zr::host::StoredTree tree = saved(query);
+        zr::host::TreeStorage storage(tree, zr::host::TreeStorage::Use::Load);
+        zr::host::Factory factory;
+        zr::host::Query loaded(DB_MSSQL);
+        loaded.Load(storage, factory);
+    });
+}
+
 template <class Run>
 void registerOne(const std::string& name, Run run) {
     benchmark::RegisterBenchmark(name.c_str(), run)
@@ -121,6 +181,7 @@ int main(int argc, char** argv) {
     registerForms("load", load);
     registerOne("analyse", analyse);
     registerOne("resolve", resolve);
+    registerOneQuery();
     benchmark::Initialize(&argc, argv);
     benchmark::RunSpecifiedBenchmarks();
     for (const StorageForm form : {StorageForm::Json, StorageForm::Sqlite})

@@ -3,7 +3,6 @@
 /// doubles.
 
 #include <benchmark/benchmark.h>
-#include <time.h>
 #include <zrparsersql/analysis.h>
 #include <zrparsersql/database_info.h>
 #include <zrparsersql/input_stream.h>
@@ -11,11 +10,11 @@
 #include <zrparsersql/recognizers/MSSQL.h>
 #include <zrparsersql/sql_parsers.h>
 
-#include <algorithm>
 #include <cstdio>
 #include <string>
 
 #include "bench/queries.h"
+#include "bench/timing.h"
 #include "grammar/engine/lexed_text.h"
 #include "parser/grammars.h"
 
@@ -77,16 +76,7 @@ void run(benchmark::State& state, const std::string& query, Run stage) {
 }
 
 double seconds(std::size_t (*stage)(const std::u16string&), const std::u16string& text) {
-    double best = 1e9;
-    for (int i = 0; i < 5; ++i) {
-        timespec a{}, b{};
-        clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &a);
-        stage(text);
-        clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &b);
-        best = std::min(best, static_cast<double>(b.tv_sec - a.tv_sec) +
-                                  1e-9 * static_cast<double>(b.tv_nsec - a.tv_nsec));
-    }
-    return best;
+    return zr::bench::bestTime([&] { stage(text); }, 5);
 }
 
 /// The table of growth: time at n, and time(2n)/time(n) for parse and for the whole analysis.

@@ -39,6 +39,12 @@ if(ZR_SANITIZE)
   add_link_options(-fsanitize=${ZR_SANITIZE})
 endif()
 
+if(ZR_COVERAGE)
+  # Tests start threads, and some of them end a process without its destructors: atomic counts stay right.
+  add_compile_options(--coverage -fprofile-abs-path -fprofile-update=prefer-atomic)
+  add_link_options(--coverage)
+endif()
+
 if(ZR_FUZZ)
   # What the fuzzer learns from: every piece tells which of its edges ran. The fuzzer itself comes with the targets.
   add_compile_options(-fsanitize=fuzzer-no-link)

@@ -24,9 +24,9 @@ void CZRFilterItemInfo::destroy(CZRFilterItemInfo* item) {
 
 void CZRFilterItemInfo::SetAll(CString fieldID, int condition, const CZRFilterValue& value,
                                int conditionAdd) {
+    Value = value;  // first, since it can throw
     FieldID = std::move(fieldID);
     Condition = condition;
-    Value = value;
     ConditionAdd = conditionAdd;
 }
 

@@ -3,6 +3,7 @@
 #include <cstring>
 #include <new>
 #include <string>
+#include <utility>
 
 #include "model/filter_text.h"
 #include "platform/case_mapping.h"
@@ -105,18 +106,29 @@ bool equalsAsBlob(const CZRFilterValue& value, const CZRFilterValue& other) {
 
 }  // namespace
 
-CZRFilterValue::CZRFilterValue(const CZRFilterValue& other)
-    : Encoding(other.Encoding), ValueType(other.ValueType) {
-    if (other.Data && (Data = copyBytes(other.Data, other.DataLength))) DataLength = other.DataLength;
-    if (other.Blob) SetBlob(other.Blob, other.BlobLength);
+// Delegates, so that a copy that runs out of memory half-way ends like any other value.
+CZRFilterValue::CZRFilterValue(const CZRFilterValue& other) : CZRFilterValue() {
+    Encoding = other.Encoding;
+    ValueType = other.ValueType;
+    if (other.Data) {
+        Data = copyBytes(other.Data, other.DataLength);
+        if (!Data) throw std::bad_alloc();
+        DataLength = other.DataLength;
+    }
+    if (other.Blob && !SetBlob(other.Blob, other.BlobLength)) throw std::bad_alloc();
 }
 
 CZRFilterValue& CZRFilterValue::operator=(const CZRFilterValue& other) {
     if (this == &other) return *this;
-    SetNull(other.ValueType);
-    Encoding = other.Encoding;
-    if (other.Data && (Data = copyBytes(other.Data, other.DataLength))) DataLength = other.DataLength;
-    if (other.Blob) SetBlob(other.Blob, other.BlobLength);
+    CZRFilterValue copy(other);
+    std::swap(Data, copy.Data);
+    std::swap(Blob, copy.Blob);
+    release(Converted);
+    DataLength = copy.DataLength;
+    BlobLength = copy.BlobLength;
+    Encoding = copy.Encoding;
+    ConvertedEncoding = copy.ConvertedEncoding;
+    ValueType = copy.ValueType;
     return *this;
 }
 
@@ -140,12 +152,25 @@ int store(CZRFilterValue& value, const void* bytes, std::size_t length, int enco
     return 1;
 }
 
+// Stores what a step stores; where that runs out of memory, nothing.
+template <class Step>
+int storeOrNull(CZRFilterValue& value, int valueType, Step step) {
+    try {
+        return step();
+    } catch (const std::bad_alloc&) {
+        value.SetNull(valueType);
+        return 0;
+    }
+}
+
 template <class Number>
 int storeNumber(CZRFilterValue& value, const char16_t* picture, Number number, int valueType) {
-    CString text;
-    text.Format(picture, number);
-    const std::string bytes(text.View().begin(), text.View().end());
-    return store(value, bytes.data(), bytes.size(), FE_ASCII, valueType);
+    return storeOrNull(value, valueType, [&] {
+        CString text;
+        text.Format(picture, number);
+        const std::string bytes(text.View().begin(), text.View().end());
+        return store(value, bytes.data(), bytes.size(), FE_ASCII, valueType);
+    });
 }
 
 }  // namespace
@@ -185,7 +210,8 @@ int CZRFilterValue::SetDate(const zr::DateTime& value, int valueType) {
     if (value.status == zr::DateTime::Status::Null) return SetWide(u"", valueType);
     if (value.status == zr::DateTime::Status::Invalid || !zr::areDaysValid(value.days))
         return SetWide(u"Invalid DateTime", valueType);
-    return SetWide(zr::formatDays(value.days).c_str(), valueType);
+    return storeOrNull(*this, valueType,
+                       [&] { return SetWide(zr::formatDays(value.days).c_str(), valueType); });
 }
 
 int CZRFilterValue::SetWide(const char16_t* text, int valueType) {

@@ -1,3 +1,5 @@
+#include <new>
+
 #include "model/owned_append.h"
 #include "model/stored_section.h"
 #include "zrparsersql/filter_info.h"
@@ -43,7 +45,10 @@ void CZRFilterItemInfo::Load(CZRStorageNode& node, CZRDescriptorFactory& /*facto
 void CZRFilterValue::Save(CZRStorageNode& node) {
     node.WriteInt(u"IsNULL", IsNull());
     node.WriteInt(u"Type", ValueType);
-    if (!IsNull()) node.WriteString(u"Value", CString(GetWide()), 0);
+    if (IsNull()) return;
+    const char16_t* const text = GetWide();
+    if (!text) throw std::bad_alloc();
+    node.WriteString(u"Value", text, 0);
 }
 
 void CZRFilterValue::Load(CZRStorageNode& node) {
@@ -53,6 +58,6 @@ void CZRFilterValue::Load(CZRStorageNode& node) {
         SetNull(-1);  // not of type 0: intended, stored projects rely on it
     else if (isNull)
         SetNull(type);
-    else
-        SetWide(node.ReadString(u"Value", CString(), 0).GetString(), type);
+    else if (!SetWide(node.ReadString(u"Value", CString(), 0).GetString(), type))
+        throw std::bad_alloc();
 }

@@ -4,8 +4,10 @@
 #include <unicode/ucnv_cb.h>
 #include <unicode/ucnv_err.h>
 
+#include <atomic>
 #include <memory>
 #include <mutex>
+#include <new>
 
 namespace zr {
 namespace {
@@ -55,18 +57,28 @@ struct ConverterCloser {
 };
 using Converter = std::unique_ptr<UConverter, ConverterCloser>;
 
+// Text must not get lost for want of memory, of which ICU tells by its status alone.
+bool succeeded(UErrorCode status) {
+    if (status == U_MEMORY_ALLOCATION_ERROR) throw std::bad_alloc();
+    return U_SUCCESS(status);
+}
+
+// ICU's data has a converter for each name above and for the system's encoding, so nothing but memory can be
+// missing, even where the status tells of a file: ICU remembers so for good when it had none at its first
+// use.
 Converter openConverter(const char* name) {
     UErrorCode status = U_ZERO_ERROR;
     Converter converter(ucnv_open(name, &status));
-    return U_SUCCESS(status) ? std::move(converter) : nullptr;
+    if (!converter) throw std::bad_alloc();
+    return converter;
 }
 
 CodeTable makeTable(const TableSource& source) {
     CodeTable table{};
     // The lower half is ASCII everywhere; ICU's PC code pages move three control characters about.
     for (unsigned byte = 0; byte < 128; ++byte) table[byte] = static_cast<char16_t>(byte);
-    const Converter converter = source.sevenBit ? nullptr : openConverter(source.converter);
-    if (!converter) return table;
+    if (source.sevenBit) return table;
+    const Converter converter = openConverter(source.converter);
     UErrorCode status = U_ZERO_ERROR;
     ucnv_setToUCallBack(converter.get(), UCNV_TO_U_CALLBACK_STOP, nullptr, nullptr, nullptr, &status);
     for (unsigned byte = 128; byte < 256; ++byte) {
@@ -75,37 +87,59 @@ CodeTable makeTable(const TableSource& source) {
         status = U_ZERO_ERROR;
         ucnv_resetToUnicode(converter.get());
         const int length = ucnv_toUChars(converter.get(), units, 4, bytes, 1, &status);
-        if (U_SUCCESS(status) && length == 1) table[byte] = units[0];
+        if (succeeded(status) && length == 1) table[byte] = units[0];
     }
     return table;
 }
 
-// Tables that are made once each, when first asked for.
+// Made when first asked for, and anew when that failed: std::call_once would do but for the thread sanitizer,
+// which doesn't know of a first call that throws.
+template <class Value>
+class MadeOnce {
+ public:
+    template <class Make>
+    const Value& get(Make make) {
+        if (!isMade_.load(std::memory_order_acquire)) {
+            const std::lock_guard<std::mutex> lock(mutex_);
+            if (!isMade_.load(std::memory_order_relaxed)) {
+                value_ = make();
+                isMade_.store(true, std::memory_order_release);
+            }
+        }
+        return value_;
+    }
+
+ private:
+    std::mutex mutex_;
+    std::atomic<bool> isMade_{false};
+    Value value_{};
+};
+
+using ReverseTable = std::unique_ptr<const ReverseCodeTable>;
+
+ReverseTable makeReverse(const CodeTable& table) {
+    auto reverse = std::make_unique<ReverseCodeTable>();
+    reverse->fill('?');
+    for (std::size_t byte = 0; byte < table.size(); ++byte)
+        if (table[byte]) (*reverse)[table[byte]] = static_cast<unsigned char>(byte);
+    return reverse;
+}
+
 class Tables {
  public:
     const CodeTable& forward(int encoding) {
-        Slot& slot = slots_[indexOf(encoding)];
-        std::call_once(slot.forwardMade, [&] { slot.forward = makeTable(kSources[indexOf(encoding)]); });
-        return slot.forward;
+        const std::size_t index = indexOf(encoding);
+        return slots_[index].forward.get([index] { return makeTable(kSources[index]); });
     }
     const ReverseCodeTable& reverse(int encoding) {
         const CodeTable& table = forward(encoding);
-        Slot& slot = slots_[indexOf(encoding)];
-        std::call_once(slot.reverseMade, [&] {
-            slot.reverse = std::make_unique<ReverseCodeTable>();
-            slot.reverse->fill('?');
-            for (std::size_t byte = 0; byte < table.size(); ++byte)
-                if (table[byte]) (*slot.reverse)[table[byte]] = static_cast<unsigned char>(byte);
-        });
-        return *slot.reverse;
+        return *slots_[indexOf(encoding)].reverse.get([&table] { return makeReverse(table); });
     }
 
  private:
     struct Slot {
-        std::once_flag forwardMade;
-        std::once_flag reverseMade;
-        CodeTable forward;
-        std::unique_ptr<ReverseCodeTable> reverse;
+        MadeOnce<CodeTable> forward;
+        MadeOnce<ReverseTable> reverse;
     };
     static std::size_t indexOf(int encoding) {
         return static_cast<std::size_t>(
@@ -133,17 +167,14 @@ std::u16string systemToUtf16(std::string_view bytes) {
     UErrorCode status = U_ZERO_ERROR;
     // At least one byte makes a unit, in every encoding that can be a system's own.
     std::u16string units(bytes.size() * 2 + 1, u'\0');
-    const int length = !converter
-                           ? 0
-                           : ucnv_toUChars(converter.get(), units.data(), static_cast<int32_t>(units.size()),
-                                           bytes.data(), static_cast<int32_t>(bytes.size()), &status);
-    units.resize(U_SUCCESS(status) ? static_cast<std::size_t>(length) : 0);
+    const int length = ucnv_toUChars(converter.get(), units.data(), static_cast<int32_t>(units.size()),
+                                     bytes.data(), static_cast<int32_t>(bytes.size()), &status);
+    units.resize(succeeded(status) ? static_cast<std::size_t>(length) : 0);
     return units;
 }
 
 std::string utf16ToSystem(std::u16string_view units) {
     const Converter converter = openConverter(nullptr);
-    if (!converter) return {};
     UErrorCode status = U_ZERO_ERROR;
     ucnv_setSubstChars(converter.get(), "?", 1, &status);
     status = U_ZERO_ERROR;
@@ -152,7 +183,7 @@ std::string utf16ToSystem(std::u16string_view units) {
     std::string bytes(static_cast<std::size_t>(largest), '\0');
     const int length = ucnv_fromUChars(converter.get(), bytes.data(), largest, units.data(),
                                        static_cast<int32_t>(units.size()), &status);
-    bytes.resize(U_SUCCESS(status) ? static_cast<std::size_t>(length) : 0);
+    bytes.resize(succeeded(status) ? static_cast<std::size_t>(length) : 0);
     return bytes;
 }
 

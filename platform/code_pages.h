@@ -13,7 +13,8 @@ using CodeTable = std::array<char16_t, 256>;
 using ReverseCodeTable = std::array<unsigned char, 65536>;
 
 // The table of a filter value's encoding (filter_info.h): 3 to 26 by name, ISO 8859-1 for anything else.
-// Tables are made when first asked for, never change and live as long as the process; any thread may ask.
+// Tables are made when first asked for, never change and live as long as the process; any thread may ask. All
+// here throw std::bad_alloc without memory.
 const CodeTable& codeTable(int encoding);
 const ReverseCodeTable& reverseCodeTable(int encoding);
 

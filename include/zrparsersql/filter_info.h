@@ -35,8 +35,9 @@ enum FilterEncoding : int {
 // The typed value of one condition: text in a declared encoding that is converted when asked for.
 //
 // Setters answer 1, or 0 when memory ran out, which leaves a null value. A null pointer makes a null value of
-// the type given. Reading may fill the cache of the last conversion, so even readers of one value need a
-// guard against each other; distinct values are independent.
+// the type given. Without memory copies, saving and loading throw std::bad_alloc. Reading may fill the cache
+// of the last conversion, so even readers of one value need a guard against each other; distinct values are
+// independent.
 struct ZR_SHARED_DECLARATION CZRFilterValue {
     char* Data = nullptr;             // the text, with a zero behind it; null is SQL's NULL; owned
     std::uint32_t DataLength = 0;     // bytes, without the zero

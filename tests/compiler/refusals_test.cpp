@@ -83,6 +83,7 @@ class OutputFolder {
         return found;
     }
     std::string content(const std::string& name) const { return contentOf(path_ / name); }
+    const fs::path& path() const { return path_; }
 
  private:
     fs::path path_;
@@ -119,19 +120,70 @@ TEST(GrammarCompiler, KeepsARuleThatOnlyHostsCall) {
         << out.content("Toy.h");
 }
 
-TEST(GrammarCompiler, WritesTheSameFilesEveryTime) {
-    OutputFolder first("first"), second("second");
-    for (const std::string& inputs :
-         {inputsOf("good"),
-          std::string("--tokens " ZR_MSSQL "/MSSQL.tokens --lexer " ZR_MSSQL "/MSSQL.lexer " ZR_MSSQL
-                      "/MSSQL.query.grammar " ZR_MSSQL "/MSSQL.functions.grammar ")}) {
-        ASSERT_EQ(run(inputs + first.arguments()).status, 0);
-        ASSERT_EQ(run(inputs + second.arguments()).status, 0);
-        ASSERT_EQ(first.names(), second.names());
-        for (const std::string& name : first.names())
-            EXPECT_TRUE(first.content(name) == second.content(name)) << name;
+/// A grammar of the library: its folder, its name and its parser files, in their order.
+struct Real {
+    const char* folder;
+    const char* name;
+    std::vector<const char*> files;
+};
+
+const Real kReal[] = {
+    {"mssql", "MSSQL", {"MSSQL.query", "MSSQL.functions"}},
+    {"mssql", "MSSQLfrom", {"MSSQLfrom"}},
+    {"mysql", "MySQLSelect", {"MySQLSelect.query", "MySQLSelect.expression"}},
+    {"oracle", "Oracle", {"Oracle.query", "Oracle.expression"}},
+    {"postgresql", "PostgreSQL", {"PostgreSQL.query", "PostgreSQL.expression", "PostgreSQL.statements"}},
+    {"msaccess", "MSAccessSQL_v3", {"MSAccessSQL_v3.query", "MSAccessSQL_v3.expression"}},
+};
+
+std::string inputsOf(const Real& grammar) {
+    const fs::path folder = fs::path(ZR_GRAMMARS) / grammar.folder;
+    std::string inputs = "--tokens " + quoted(folder / (std::string(grammar.name) + ".tokens")) + "--lexer " +
+                         quoted(folder / (std::string(grammar.name) + ".lexer"));
+    for (const char* file : grammar.files) inputs += quoted(folder / (std::string(file) + ".grammar"));
+    return inputs;
+}
+
+class RealGrammar : public testing::TestWithParam<Real> {};
+
+// What the build compiled says nothing of the machine, the folder or the time.
+TEST_P(RealGrammar, CompilesToWhatTheBuildHas) {
+    OutputFolder out(GetParam().name);
+    const std::string source = std::string(GetParam().name) + ".cpp";
+    const Outcome outcome = run(inputsOf(GetParam()) + "--headers " + quoted(out.path()) + "--source " +
+                                quoted(out.path() / source));
+    ASSERT_EQ(outcome.status, 0) << outcome.said;
+    EXPECT_EQ(out.names().size(), 3U);
+    for (const std::string& name : out.names()) {
+        const fs::path built =
+            fs::path(ZR_GENERATED) / (name == source ? "" : "zrparsersql/recognizers") / name;
+        EXPECT_TRUE(out.content(name) == contentOf(built)) << name;
     }
-    EXPECT_EQ(first.names().size(), 5U);
+}
+
+INSTANTIATE_TEST_SUITE_P(Grammars, RealGrammar, testing::ValuesIn(kReal),
+                         [](const auto& grammar) { return grammar.param.name; });
+
+TEST(GrammarCompiler, TakesComplementsAndCutsInALexer) {
+    OutputFolder out("complement");
+    const fs::path lexer = out.path() / "toy.lexer";
+    std::string text = contentOf(kCases / "good" / "toy.lexer");
+    text.replace(text.find("WS : "), 5, "WS : '[' ~[\\]x]* ']' ~'y' -> cut(1,2) ;\n// ");
+    std::ofstream(lexer, std::ios::binary) << text;
+    const Outcome outcome = run("--tokens " + quoted(kCases / "good" / "toy.tokens") + "--lexer " +
+                                quoted(lexer) + quoted(kCases / "good" / "toy.grammar") + out.arguments());
+    EXPECT_EQ(outcome.status, 0) << outcome.said;
+    EXPECT_NE(out.content("out.cpp").find(", 0, 1, 2, "), std::string::npos) << "the cut of WS";
+}
+
+TEST(GrammarCompiler, RefusesAFileOfAnotherGrammar) {
+    const Outcome outcome =
+        run(inputsOf("good") + quoted(fs::path(ZR_GRAMMARS) / "mssql" / "MSSQLfrom.grammar"));
+    EXPECT_EQ(outcome.status, 1);
+    EXPECT_NE(outcome.said.find("MSSQLfrom.grammar:"), std::string::npos) << outcome.said;
+    EXPECT_NE(outcome.said.find("this file is of grammar MSSQLfrom, the files before it are of Toy"),
+              std::string::npos)
+        << outcome.said;
 }
 
 TEST(GrammarCompiler, RefusesAFileThatIsNotThere) {

@@ -176,6 +176,18 @@ TEST_F(QueryResolution, OneItemIsResolvedWithWhatIsBelowIt) {
     EXPECT_EQ(query.Resolved, 1);
 }
 
+TEST_F(QueryResolution, AListIsResolvedByItself) {
+    query.readsFrom(u"t");
+    SelectItemField* inList = fieldItem(u"t", u"a");
+    SelectItemField* inOther = fieldItem(u"t", u"a");
+    query.m_orderItems.AddTail(functionItem(u"f", {inList}));
+    query.m_orderItems.AddTail(nullptr);
+    query.m_groupItems.AddTail(inOther);
+    query.ResolveItems(query.m_orderItems);
+    EXPECT_EQ(inList->m_fieldName, u"NewA");
+    EXPECT_TRUE(inOther->m_fieldName.IsEmpty());
+}
+
 TEST_F(QueryResolution, EveryClauseIsResolved) {
     query.readsFrom(u"t");
     std::vector<SelectItemField*> items;
