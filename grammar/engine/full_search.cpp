@@ -88,6 +88,8 @@ bool FullSearch::findSets(std::uint32_t position, std::uint32_t end) {
     vertexBefore_.assign((end - position + 1) * rowWords, 0);
     behind_.start(sets_, reach_.nodes());
     starts_.start();
+    here_.assign(reach_.nodes(), kEmpty);
+    ahead_.assign(reach_.nodes(), kEmpty);
     for (std::uint32_t p = end + 1; p-- > position;) {
         const std::uint64_t* row = reach_.keptAt(p);
         const std::uint32_t here = p - position;
@@ -101,9 +103,14 @@ bool FullSearch::findSets(std::uint32_t position, std::uint32_t end) {
                     static_cast<std::uint16_t>(w * 64 + static_cast<unsigned>(std::countr_zero(left)));
                 const SetId set = setFor(node, p);
                 byVertex_.push_back(set);
+                here_[node] = set;
                 if (set != kEmpty && (table_->nodes[node].flags & kBehindCall)) behind_.note(node, p, set);
             }
         }
+        for (std::size_t w = 0; p < end && w < rowWords; ++w)
+            for (std::uint64_t left = row[rowWords + w]; left != 0; left &= left - 1)
+                ahead_[w * 64 + static_cast<unsigned>(std::countr_zero(left))] = kEmpty;
+        here_.swap(ahead_);
         steps_ += 1 + (byVertex_.size() - vertexFrom_[here]) / 8;
         if (steps() > budget || remembered() > options_->maxMemo) return false;
     }
@@ -126,13 +133,13 @@ SetId FullSearch::setFor(std::uint16_t at, std::uint32_t p) {
         case Op::Token:
         case Op::Set:
         case Op::Hard:
-            return setAt(node.run, p + 1);
+            return ahead_[node.run];
         case Op::Soft:
         case Op::SoftStar: {
-            const SetId skipped = setAt(node.run, p);
+            const SetId skipped = here_[node.run];
             if (!text_->isCloser(p)) return skipped;
             sets_.join(skipped);
-            const SetId taken = setAt(node.op == Op::Soft ? node.run : at, p + 1);
+            const SetId taken = ahead_[node.op == Op::Soft ? node.run : at];
             sets_.join(taken);
             return sets_.joined(taken);
         }
@@ -141,7 +148,7 @@ SetId FullSearch::setFor(std::uint16_t at, std::uint32_t p) {
             bool several = false;
             for (std::uint32_t mask = reach_.branches(node, p); mask != 0; mask &= mask - 1) {
                 const SetId set =
-                    setAt(branchTarget(*table_, node, static_cast<std::uint32_t>(std::countr_zero(mask))), p);
+                    here_[branchTarget(*table_, node, static_cast<std::uint32_t>(std::countr_zero(mask)))];
                 if (set == kEmpty || set == first) continue;
                 if (first != kEmpty && !several) {
                     sets_.join(first);
@@ -157,7 +164,7 @@ SetId FullSearch::setFor(std::uint16_t at, std::uint32_t p) {
         case Op::End:
             return sets_.single(p);
         default:
-            return setAt(node.run, p);
+            return here_[node.run];
     }
 }
 
@@ -167,7 +174,7 @@ bool FullSearch::isSkipped(const NodeRow& call, std::uint32_t p) const {
 }
 
 SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p) {
-    const SetId ends = endsOf(call.arg, p);
+    const SetId ends = here_[searchedFrom(*table_, table_->rules[call.arg].entry)];
     if (ends == kEmpty) return kEmpty;
     const EndsBehind::Word* behind = behind_.words(call.run);
     if (behind == nullptr) return kEmpty;

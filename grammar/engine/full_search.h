@@ -100,6 +100,7 @@ class FullSearch {
     std::vector<SetId> byVertex_;             ///< of the nodes that were kept, position by position
     std::vector<std::uint32_t> vertexFrom_;   ///< by position
     std::vector<std::uint8_t> vertexBefore_;  ///< by position and word of its row: nodes in the words before
+    std::vector<SetId> here_, ahead_;         ///< by node: of the position at hand and of the next one
     EndsBehind behind_;
     StartsBefore starts_;
     std::vector<PositionSets::Part> gained_;
