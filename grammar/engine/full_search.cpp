@@ -8,6 +8,8 @@ namespace {
 
 /// So many of 64 positions are many.
 constexpr std::uint32_t kManyEnds = 2;
+/// Ends over fewer words than this are looked at one by one.
+constexpr std::uint32_t kFarWords = 4;
 
 }  // namespace
 
@@ -320,7 +322,8 @@ FullSearch::Wanted FullSearch::wantedBy(const Walk& walk, const NodeRow& call) {
     const bool isFew = walk.wanted.count <= Wanted::kFew;
     const std::uint32_t many = kManyEnds * (range.to - range.from);
     const std::uint32_t elsewhere = behind_.known(call.run).elsewhere;
-    const bool backwards = isFew && sets_.size(ends) >= many && elsewhere >= many;
+    const bool backwards =
+        isFew && range.to - range.from >= kFarWords && sets_.size(ends) >= many && elsewhere >= many;
     const bool forwards = !backwards && !(isFew && elsewhere == 0);
     for (std::uint32_t i = 0; isFew && i < walk.wanted.count; ++i) {
         const std::uint32_t end = walk.wanted.few[i], wordOfEnd = sets_.wordOf(end);

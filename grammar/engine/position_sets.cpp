@@ -11,6 +11,7 @@ void PositionSets::start(std::uint32_t from, std::uint32_t end) {
     words_.clear();
     joint_.assign((end - from) / 64 + 1, 0);
     jointFrom_ = jointTo_ = 0;
+    lastSingle_ = kEmpty;
 }
 
 void PositionSets::widenTo(std::uint32_t from, std::uint32_t to) {
@@ -69,9 +70,10 @@ void PositionSets::drop() {
 }
 
 SetId PositionSets::single(std::uint32_t position) {
+    // Rules often end one in the other.
+    if (isSingle(lastSingle_, position)) return lastSingle_;
     joinWord(wordOf(position), bitOf(position));
-    // Rules often end one in the other: the last set made is likely to be this one.
-    return joined(static_cast<SetId>(sets_.size()) - 1);
+    return lastSingle_ = joined(kEmpty);
 }
 
 bool PositionSets::isSingle(SetId id, std::uint32_t position) const {

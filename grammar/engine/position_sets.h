@@ -97,6 +97,7 @@ class PositionSets {
     std::vector<std::uint64_t> joint_;           ///< the set being made
     std::uint32_t jointFrom_ = 0, jointTo_ = 0;  ///< words of it that are in use
     std::uint64_t wordsJoined_ = 0;
+    SetId lastSingle_ = kEmpty;
 };
 
 }  // namespace zr::engine
