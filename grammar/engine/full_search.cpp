@@ -176,10 +176,12 @@ bool FullSearch::isSkipped(const NodeRow& call, std::uint32_t p) const {
 }
 
 SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p) {
-    const SetId ends = here_[searchedFrom(*table_, table_->rules[call.arg].entry)];
-    if (ends == kEmpty) return kEmpty;
+    const SetId all = here_[searchedFrom(*table_, table_->rules[call.arg].entry)];
     const EndsBehind::Word* behind = behind_.words(call.run);
-    if (behind == nullptr) return kEmpty;
+    if (all == kEmpty || behind == nullptr) return kEmpty;
+    // An end that takes no token counts for some calls and not for others.
+    const bool mayBeEmpty = sets_.contains(all, p);
+    const SetId ends = mayBeEmpty ? sets_.without(all, p) : all;
     // Rules inside each other mostly share the ends further on: only what is new is looked at.
     EndsBehind::Known& known = behind_.known(call.run);
     auto* last = &known.last[sets_.size(known.last[0].ends) > sets_.size(known.last[1].ends) ? 0 : 1];
@@ -189,21 +191,28 @@ SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p) {
         grows = sets_.grows(ends, last->ends, gained_);
     }
     if (grows) sets_.join(last->behind);
-    SetId before = kEmpty;
-    for (const auto& [word, more] : gained_) {
-        const std::uint64_t bits = counted(call, p, word, more);
-        sets_.joinWord(word, bits & behind[word].here);
-        for (std::uint64_t left = bits & behind[word].elsewhere; left != 0; left &= left - 1) {
-            const SetId further = setAt(call.run, sets_.positionOf(word, left));
-            if (further != before) sets_.join(further);
-            before = further;
-        }
-    }
+    for (const auto& [word, bits] : gained_) joinBehind(call.run, behind[word], word, bits);
     steps_ += gained_.size() / kWordsAStep;
-    const SetId made = sets_.joined(ends);
-    // An end that takes no token counts for some calls and not for others.
-    if (!sets_.contains(ends, p)) *last = {ends, made};
+    SetId made = sets_.joined(ends);
+    *last = {ends, made};
+    if (mayBeEmpty && !(call.flags & kNonEmpty)) {
+        sets_.join(made);
+        joinBehind(call.run, behind[sets_.wordOf(p)], sets_.wordOf(p), sets_.bitOf(p));
+        made = sets_.joined(made);
+    }
     return made;
+}
+
+/// Joins the ends that a node comes to from the positions `from` of a word.
+void FullSearch::joinBehind(std::uint16_t node, const EndsBehind::Word& behind, std::uint32_t word,
+                            std::uint64_t from) {
+    sets_.joinWord(word, from & behind.here);
+    SetId before = kEmpty;
+    for (std::uint64_t left = from & behind.elsewhere; left != 0; left &= left - 1) {
+        const SetId further = setAt(node, sets_.positionOf(word, left));
+        if (further != before) sets_.join(further);
+        before = further;
+    }
 }
 
 /// Those ends in a word that count for a call: some calls want one that takes a token.

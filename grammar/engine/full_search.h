@@ -59,6 +59,8 @@ class FullSearch {
     SetId setFor(std::uint16_t node, std::uint32_t position);
     bool isSkipped(const NodeRow& call, std::uint32_t position) const;
     SetId setBehind(const NodeRow& call, std::uint32_t position);
+    void joinBehind(std::uint16_t node, const EndsBehind::Word& behind, std::uint32_t word,
+                    std::uint64_t from);
     std::uint64_t counted(const NodeRow& call, std::uint32_t position, std::uint32_t word,
                           std::uint64_t bits) const;
     SetId setAt(std::uint16_t node, std::uint32_t position) const;

@@ -76,6 +76,13 @@ SetId PositionSets::single(std::uint32_t position) {
     return lastSingle_ = joined(kEmpty);
 }
 
+SetId PositionSets::without(SetId set, std::uint32_t position) {
+    if (isSingle(set, position)) return kEmpty;
+    join(set);
+    joint_[wordOf(position)] &= ~bitOf(position);
+    return joined(kEmpty);
+}
+
 bool PositionSets::isSingle(SetId id, std::uint32_t position) const {
     const Set& set = sets_[id];
     return set.count == 1 && set.from == wordOf(position) && words_[set.offset] == bitOf(position);

@@ -41,6 +41,8 @@ class PositionSets {
     /// One more than `most` says that there are more; then nothing is forgotten.
     std::uint32_t takeFew(std::uint32_t* positions, std::uint32_t most);
     SetId single(std::uint32_t position);
+    /// A set without one of its positions.
+    SetId without(SetId set, std::uint32_t position);
 
     // ---- looking at one
     bool isSingle(SetId set, std::uint32_t position) const;
