@@ -41,13 +41,19 @@ void locate(const ParserTable& table, const Derivation& derivation, std::vector<
 
 }  // namespace
 
-void settleSteps(const ParserTable& table, const Derivation& derivation,
-                 const std::vector<std::uint16_t>& types, std::uint16_t node, std::uint32_t position,
-                 std::uint32_t exact, Cursor cursor, std::vector<Step>& steps) {
-    const auto runEndOf = [&](std::uint32_t at) {
-        while (at < types.size() && types[at] == table.closer) ++at;
-        return at;
-    };
+std::uint32_t CloserRun::endFrom(std::uint32_t position) {
+    if (position >= from_ && position < to_) return to_;
+    std::uint32_t end = position;
+    while (end < types_.size() && types_[end] == closer_ && (end != from_ || to_ == from_)) ++end;
+    if (end == from_ && end < to_) end = to_;
+    if (end == position) return end;
+    from_ = position;
+    to_ = end;
+    return end;
+}
+
+void settleSteps(const ParserTable& table, const Derivation& derivation, CloserRun& run, std::uint16_t node,
+                 std::uint32_t position, std::uint32_t exact, Cursor cursor, std::vector<Step>& steps) {
     const std::size_t base = steps.size();
     std::uint32_t low = position, high = position;
     for (;;) {
@@ -65,13 +71,13 @@ void settleSteps(const ParserTable& table, const Derivation& derivation,
                 break;
             case Op::Hard:
                 ++low;
-                high = std::min(high + 1, runEndOf(step.low));
+                high = std::min(high + 1, run.endFrom(step.low));
                 break;
             case Op::Soft:
-                high = std::min(high + 1, runEndOf(low));
+                high = std::min(high + 1, run.endFrom(low));
                 break;
             case Op::SoftStar:
-                high = runEndOf(low);
+                high = run.endFrom(low);
                 break;
             case Op::Call: {
                 const Derivation::Part& part = derivation.parts[cursor.part];

@@ -28,7 +28,7 @@ class TreeBuilder {
     /// `types` are the tokens that the recogniser saw.
     TreeBuilder(const ParserTable& table, const Derivation& derivation,
                 const std::vector<std::uint16_t>& types, Tree& tree)
-        : table_(table), derivation_(derivation), types_(types), tree_(tree) {
+        : table_(table), derivation_(derivation), types_(types), tree_(tree), run_(types, table.closer) {
         work_.swap(spare());
     }
     ~TreeBuilder() {
@@ -112,6 +112,7 @@ class TreeBuilder {
     const Derivation& derivation_;
     const std::vector<std::uint16_t>& types_;
     Tree& tree_;
+    CloserRun run_;
     Work work_;
     Cursor cursor_{0, 0};
     std::uint32_t dropped_ = 0;  ///< scopes at work whose tree is left out
@@ -193,7 +194,7 @@ template <class Tree>
 void TreeBuilder<Tree>::settle() {
     Frame& frame = work_.frames.back();
     frame.stepsBase = frame.nextStep = static_cast<std::uint32_t>(work_.steps.size());
-    settleSteps(table_, derivation_, types_, frame.node, frame.at, frame.end, cursor_, work_.steps);
+    settleSteps(table_, derivation_, run_, frame.node, frame.at, frame.end, cursor_, work_.steps);
     frame.node = kNone16;
 }
 
