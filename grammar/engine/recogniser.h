@@ -27,8 +27,8 @@ class Recogniser {
         std::uint32_t high = 0;   ///< where the derivation ends
     };
 
-    /// `types` holds the token numbers of the on-channel tokens without end of file; it must outlive this
-    /// object.
+    /// `types` holds the token numbers of the on-channel tokens without end of file. It, the table and the
+    /// options must outlive this object.
     Recogniser(const ParserTable& table, const std::vector<std::uint16_t>& types, const Options& options);
     ~Recogniser();
     Recogniser(Recogniser&&) = default;

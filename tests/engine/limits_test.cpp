@@ -266,7 +266,8 @@ TEST(MemoLimit, OfTheDefaultIsFarFromWhatATextNeeds) {
     const std::u16string text = u"SELECT a FROM t WHERE a = 1" + repeated(u" AND b = 2", 10000);
     const std::vector<std::uint16_t> types = typesOf(text);
     const engine::ParserTable& table = *mssqlTables().parser;
-    engine::Recogniser recogniser(table, types, engine::Options{});
+    const engine::Options options;
+    engine::Recogniser recogniser(table, types, options);
     EXPECT_TRUE(recogniser.run(table.statementRule, 0).found);
     EXPECT_GT(recogniser.remembered(), types.size());
     EXPECT_LT(recogniser.remembered(), types.size() * 100);
@@ -278,7 +279,8 @@ TEST(MemoLimit, OfTheDefaultIsFarFromWhatATextNeeds) {
 double stepsPerToken(const std::u16string& text, bool wholly) {
     const std::vector<std::uint16_t> types = typesOf(text);
     const engine::ParserTable& table = *mssqlTables().parser;
-    engine::Recogniser recogniser(table, types, engine::Options{});
+    const engine::Options options;
+    engine::Recogniser recogniser(table, types, options);
     const engine::Recogniser::Result result = recogniser.run(table.statementRule, 0);
     EXPECT_TRUE(result.found);
     EXPECT_FALSE(result.overBudget);
