@@ -20,7 +20,7 @@ std::size_t FullSearch::bytes() const {
 std::size_t FullSearch::capacity() const {
     return reach_.capacity() + sets_.capacity() + behind_.capacity() + starts_.capacity() +
            byVertex_.capacity() * sizeof(SetId) + vertexFrom_.capacity() * sizeof(std::uint32_t) +
-           vertexBefore_.capacity() + walks_.capacity() * sizeof(Walk);
+           vertexBefore_.capacity() * sizeof(std::uint16_t) + walks_.capacity() * sizeof(Walk);
 }
 
 void FullSearch::start(const ParserTable& table, TextIndex& text, const Options& options,
@@ -96,9 +96,9 @@ bool FullSearch::findSets(std::uint32_t position, std::uint32_t end) {
         const std::uint64_t* row = reach_.keptAt(p);
         const std::uint32_t here = p - position;
         vertexFrom_[here] = static_cast<std::uint32_t>(byVertex_.size());
-        std::uint8_t* before = vertexBefore_.data() + here * rowWords;
+        std::uint16_t* before = vertexBefore_.data() + here * rowWords;
         for (std::size_t w = 0; w < rowWords; ++w) {
-            before[w] = static_cast<std::uint8_t>(byVertex_.size() - vertexFrom_[here]);
+            before[w] = static_cast<std::uint16_t>(byVertex_.size() - vertexFrom_[here]);
             // In their order each node stands behind those that its set is made of.
             for (std::uint64_t left = row[w]; left != 0; left &= left - 1) {
                 const auto node =

@@ -53,6 +53,7 @@ void Reach::follow(std::uint16_t rule, std::uint32_t position) {
     nodes_ = entry < table_->statementStops ? table_->statementStops : table_->stops;
     words_ = (nodes_ + 63) / 64;
     met_.assign(words_, 0);
+    open_.clear();  // a search that memory ran out for leaves some
     metAt_.assign(nodes_, kNone);
     callBefore_.assign(nodes_, kNone16);
     called_.assign(table_->ruleCount, kNone16);

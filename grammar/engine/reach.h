@@ -70,7 +70,6 @@ class Reach {
     /// A way from a node to one that comes behind it.
     struct Way {
         std::uint16_t from, to;
-        bool operator==(const Way&) const = default;
     };
 
     static bool has(const std::uint64_t* row, std::uint16_t node) {

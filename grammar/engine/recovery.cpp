@@ -1,6 +1,5 @@
 #include "grammar/engine/recovery.h"
 
-#include <algorithm>
 #include <set>
 #include <utility>
 #include <vector>
@@ -87,7 +86,6 @@ class PlaceSeeker {
         } else {
             for (const std::uint32_t end : search_.allEnds(table_, text_, options_, node.arg, p))
                 if (end != p || !(node.flags & kNonEmpty)) meet(node.run, end);
-            text_.cutAt(text_.fullCount());
         }
     }
 

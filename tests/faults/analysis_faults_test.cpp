@@ -39,11 +39,19 @@ void parse(CString& text) {
     }
 }
 
+/// Left to the full search by the quick one.
+const Case kManyReadings = {
+    "MssqlManyReadings", DB_MSSQL,
+    u"SELECT city, COUNT(id), SUM(total), MAX(total) FROM orders WHERE status = 'open' GROUP BY city HAVING "
+    u"COUNT(id) > 5 ORDER BY city",
+    &parse<CZRMSSQLParser>};
+
 const Case kCases[] = {
     {"Mssql", DB_MSSQL,
      u"SELECT TOP 5 a AS x, t.b + 'c d', {fn UCASE(e)}, CAST(f AS VARCHAR(3)), dbo.g(1) FROM t INNER JOIN u "
      u"ON t.h = u.i WHERE j IN (SELECT k FROM v WHERE l = 1 ORDER BY m DESC) UNION ALL SELECT n FROM w",
      &parse<CZRMSSQLParser>},
+    kManyReadings,
     {"Mysql", DB_MYSQL,
      u"SELECT DISTINCT a AS x, t.b + 1, ABS(c) FROM t AS y INNER JOIN u ON t.h = u.i WHERE j IN "
      u"(SELECT k FROM v) GROUP BY a ORDER BY a DESC LIMIT 5",
@@ -79,6 +87,30 @@ std::string analysed(CZRQueryInfo& query, const Case& what) {
     query.SetSQL(what.sql);
     BuildQueryInfo(&query, what.kind);
     return plainDescriptor(query);
+}
+
+/// What a thread keeps for its next text must be fit for that, however the last one ended.
+TEST_P(Exhausted, TheNextTextsOfTheThreadAreReadAsEver) {
+    const auto descriptorOf = [](const Case& next) {
+        CZRQueryInfo query;
+        return analysed(query, next);
+    };
+    const std::string expected = descriptorOf(kManyReadings);
+    const std::string expectedOwn = descriptorOf(what());
+    const long allocations = failEach([&](long successes) {
+        bool happened = false;
+        {
+            CZRQueryInfo query;
+            query.SetSQL(what().sql);
+            const Failure failing = failure(successes);
+            BuildQueryInfo(&query, what().kind);
+            happened = failing.happened();
+        }
+        EXPECT_EQ(descriptorOf(kManyReadings), expected) << successes;
+        EXPECT_EQ(descriptorOf(what()), expectedOwn) << successes;
+        return happened && !testing::Test::HasFailure();
+    });
+    EXPECT_GT(allocations, 5);
 }
 
 TEST_P(Exhausted, AnAnalysisLeavesADescriptorThatCanBeReadCopiedAndAnalysedAnew) {
