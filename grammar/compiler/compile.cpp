@@ -22,11 +22,13 @@ void compile(const Inputs& inputs, const Output& output, std::ostream* report) {
             program.opener = found->second;
     analyse(program, grammar, facts, vocabulary.maxNumber);
     numberNodes(program, facts, grammar);
+    lookAhead(program);
     if (report)
         *report << grammar.name << ": " << grammar.rules.size() << " rules, " << program.nodes.size()
                 << " nodes, " << program.classes << " token classes, " << program.guards.size() << " guards, "
-                << lexerProgram.accept.size() << " lexer states, closer " << closer
-                << (why.empty() ? "" : "; refused as closer:" + why) << "\n";
+                << program.lookahead.size() << " rows of lookahead, " << lexerProgram.accept.size()
+                << " lexer states, closer " << closer << (why.empty() ? "" : "; refused as closer:" + why)
+                << "\n";
     if (!output.sourceFile.empty())
         emit(vocabulary, lexerGrammar, lexerProgram, grammar, facts, program, output);
 }

@@ -271,20 +271,10 @@ class Emitter {
             std::string op = ops[static_cast<int>(n.op)];
             if (n.op == Op::Token && n.arg == program_.closer) op = "Hard";
             if (n.op == Op::Choice) {
-                if (n.targets.size() > 32)
-                    throw GrammarError(parser_.rules[0].file, 0, "more than 32 alternatives");
                 arg = static_cast<int>(choices.size());
                 choices.emplace_back(targets.size(), n.targets.size());
                 targets.insert(targets.end(), n.targets.begin(), n.targets.end());
-                const auto base = masks.size();
-                masks.resize(base + index(program_.classes));
-                for (std::size_t t = 0; t < n.targets.size(); ++t) {
-                    const Node& target = program_.nodes[index(n.targets[t])];
-                    for (int c = 0; c < program_.classes; ++c)
-                        if (target.canEnd) masks[base + index(c)] |= std::uint32_t{1} << t;
-                    for (int token : target.first)
-                        masks[base + index(program_.classOf[index(token)])] |= std::uint32_t{1} << t;
-                }
+                masks.insert(masks.end(), n.ahead.begin(), n.ahead.end());
             }
             o << "    {Op::" << op << ", Mark::" << marks[static_cast<int>(n.mark)] << ", "
               << (n.behindCall ? 1 : 0) + (n.nonEmpty ? 2 : 0) << ", " << arg << ", "
@@ -300,7 +290,11 @@ class Emitter {
         array(o, "ChoiceRow", "choices", choices,
               [&](const auto& c) { o << "{" << c.first << ", " << c.second << "}"; });
         array(o, "std::uint16_t", "targets", targets, [&](int t) { o << t; });
+        array(o, "std::uint16_t", "stopOf", targets, [&](int t) { o << program_.skip(t); });
         array(o, "std::uint32_t", "masks", masks, [&](std::uint32_t m) { o << m << "u"; });
+        std::vector<std::uint32_t> rows;
+        for (const auto& row : program_.lookahead) rows.insert(rows.end(), row.begin(), row.end());
+        array(o, "std::uint32_t", "aheadRows", rows, [&](std::uint32_t m) { o << m << "u"; });
         array(o, "std::uint8_t", "classOf", program_.classOf, [&](int c) { o << c; });
         std::vector<std::uint64_t> words;
         for (const auto& s : classSets_) words.insert(words.end(), s.begin(), s.end());
@@ -315,12 +309,13 @@ class Emitter {
         const int left = std::max(number("LEFT_PAREN"), number("LEFT_PAREN_"));
         const int right = std::max(number("RIGHT_PAREN"), number("RIGHT_PAREN_"));
         o << "const ParserTable parser{kTableVersion, nodes, rules, " << parser_.rules.size() << ", choices, "
-          << choices.size() << ", targets, masks, classOf, " << program_.classes << ", "
-          << vocabulary_.maxNumber << ", classSets, " << firstBase << ", " << openers << ", " << recoverFollow
-          << ", guards, " << guards.size() << ", " << std::max(program_.closer, 0) << ", " << parser_.start
-          << ", " << parser_.statement << ", " << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule)
-          << ", " << left << ", " << right << ", " << parser_.keepTail << ", seconds, " << program_.stops
-          << ", " << program_.statementStops << "};\n\n";
+          << choices.size() << ", targets, stopOf, masks, aheadRows, " << Program::kLookahead << ", classOf, "
+          << program_.classes << ", " << vocabulary_.maxNumber << ", classSets, " << firstBase << ", "
+          << openers << ", " << recoverFollow << ", guards, " << guards.size() << ", "
+          << std::max(program_.closer, 0) << ", " << parser_.start << ", " << parser_.statement << ", "
+          << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule) << ", " << left << ", " << right << ", "
+          << parser_.keepTail << ", seconds, " << program_.stops << ", " << program_.statementStops
+          << "};\n\n";
     }
 
     void contexts(std::ostream& o) const {

@@ -184,6 +184,12 @@ class Lowering {
     }
 
     int choice(std::vector<int> targets) {
+        if (targets.size() > Program::kTargets) {
+            const auto rest = targets.begin() + Program::kTargets - 1;
+            const int more = choice({rest, targets.end()});
+            targets.erase(rest, targets.end());
+            targets.push_back(more);
+        }
         const int at = add(Node(Op::Choice));
         node(at).targets = std::move(targets);
         return at;

@@ -43,6 +43,9 @@ void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts,
 /// goes.
 void numberNodes(Program& program, const Facts& facts, const ParserGrammar& grammar);
 
+/// Finds which targets of each choice fit by the tokens ahead.
+void lookAhead(Program& program);
+
 /// Lexer: one automaton for the longest match over all rules, and one program a rule for single-rule calls.
 LexerProgram buildLexer(const LexerGrammar& grammar);
 

@@ -39,6 +39,9 @@ struct Node {
     std::set<int> first;
     int guard = -1;     ///< Call: index into guards, or -1
     int required = -1;  ///< Call: a token that must still come behind it, or -1
+    /// Choice, filled by lookAhead(), by class of the next token: the targets that fit as bits, or kMore and
+    /// a row of Program::lookahead.
+    std::vector<std::uint32_t> ahead;
 };
 
 /// What must be in the text for a Call to be worth running: a token of `follow` right behind a token of
@@ -58,6 +61,11 @@ struct Program {
     /// By rule, by token that it starts with: what can come second, kEof standing for "anything, the rule may
     /// be over". Told apart no finer than token classes are.
     std::vector<std::map<int, std::set<int>>> second;
+    /// By class of the token further on the same again, and last what fits whatever comes.
+    std::vector<std::vector<std::uint32_t>> lookahead;
+    static constexpr std::uint32_t kMore = 0x80000000u;
+    static constexpr std::size_t kTargets = 31;  ///< of a Choice at most, one bit each beside kMore
+    static constexpr int kLookahead = 4;
     int closer = -1;
     int opener = -1;  ///< the left parenthesis
     std::set<int> recoverFollow;

@@ -55,7 +55,10 @@ class Reach {
         // The part that recovery replaces starts with none of its tokens: look at every way to it.
         if (position == recovery_.place)
             return static_cast<std::uint32_t>((std::uint64_t{1} << table_->choices[choice.arg].count) - 1);
-        return text_->viable(choice, position, position);
+        // Nor need the tokens ahead of it be those that a reading goes on with.
+        if (position < recovery_.place && recovery_.place - position < table_->tokensAhead)
+            return text_->startable(choice, position);
+        return text_->viable(choice, position);
     }
     /// Whether a call may stand for tokens that can't be read.
     bool mayRecover(const NodeRow& call, std::uint32_t position) const {

@@ -7,7 +7,7 @@
 /// engine never runs tables of another layout.
 namespace zr::engine {
 
-constexpr std::uint32_t kTableVersion = 7;
+constexpr std::uint32_t kTableVersion = 8;
 
 constexpr std::uint16_t kNone16 = 0xFFFF;
 
@@ -95,7 +95,7 @@ struct RuleRow {
 
 struct ChoiceRow {
     std::uint32_t firstTarget;
-    std::uint16_t count;  ///< at most 32
+    std::uint16_t count;  ///< at most 31
 };
 
 /// Class sets, see ParserTable::classSets.
@@ -111,9 +111,16 @@ struct ParserTable {
     const ChoiceRow* choices;
     std::uint32_t choiceCount;
     const std::uint16_t* targets;
-    const std::uint32_t* choiceMask;  ///< [choice * classes + class]: bit i set when target i can go on there
-    const std::uint8_t* classOf;      ///< by token number; 0 is end of file
-    std::uint32_t classes;            ///< at most 256
+    const std::uint16_t* stopOf;  ///< by target: the node at or behind it that a search stops at
+    /// [choice * classes + class]: bit i set when target i can go on there, or kMoreTokens and a row of
+    /// `aheadRows`.
+    const std::uint32_t* choiceMask;
+    /// [row * (classes + 1) + class]: the same by class of the token behind; the last entry of a row are the
+    /// targets that can go on whatever comes there. The end of the text decides.
+    const std::uint32_t* aheadRows;
+    std::uint32_t tokensAhead;    ///< so many tokens are looked at
+    const std::uint8_t* classOf;  ///< by token number; 0 is end of file
+    std::uint32_t classes;        ///< at most 256
     std::uint32_t maxToken;
     const std::uint64_t*
         classSets;  ///< four words a set; sets of nodes first, then FIRST of each rule, then others
@@ -135,6 +142,8 @@ struct ParserTable {
     std::uint32_t statementStops;  ///< those, in front, that the statement rule can come to
 };
 
+constexpr std::uint32_t kMoreTokens = 0x80000000u;
+
 /// The first node at or behind one that a search stops at: those that only shape the tree are passed over.
 inline std::uint16_t searchedFrom(const ParserTable& table, std::uint16_t node) {
     const NodeRow& row = table.nodes[node];
@@ -144,7 +153,7 @@ inline std::uint16_t searchedFrom(const ParserTable& table, std::uint16_t node) 
 
 /// Where a branch of a Choice goes on.
 inline std::uint16_t branchTarget(const ParserTable& table, const NodeRow& choice, std::uint32_t branch) {
-    return searchedFrom(table, table.targets[table.choices[choice.arg].firstTarget + branch]);
+    return table.stopOf[table.choices[choice.arg].firstTarget + branch];
 }
 
 struct GrammarTable {

@@ -94,17 +94,35 @@ class TextIndex {
                 return true;  // only shapes the tree
         }
     }
-    /// The branches of a Choice that can go on at a place, as bits.
+    /// The branches of a Choice that can go on at a position, as bits: those that some reading of the next
+    /// tokens starts with.
+    std::uint32_t viable(const NodeRow& choice, std::uint32_t position) const {
+        std::uint32_t found = masks(choice)[classes_[position]];
+        while (found & kMoreTokens) found = aheadRow(found)[classes_[++position]];
+        return found;
+    }
+    /// The same by the next token alone.
+    std::uint32_t startable(const NodeRow& choice, std::uint32_t position) const {
+        return byOneToken(masks(choice)[classes_[position]]);
+    }
+    /// The same at a place.
     std::uint32_t viable(const NodeRow& choice, std::uint32_t low, std::uint32_t high) const {
-        const std::uint32_t* masks =
-            table_->choiceMask + static_cast<std::size_t>(choice.arg) * table_->classes;
-        if (low == high) return masks[classes_[low]];
-        std::uint32_t mask = masks[table_->classOf[table_->closer]];
-        if (high == runEnd(low)) mask |= masks[classes_[high]];
-        return mask;
+        if (low == high) return viable(choice, low);
+        std::uint32_t found = byOneToken(masks(choice)[table_->classOf[table_->closer]]);
+        if (high == runEnd(low)) found |= startable(choice, high);
+        return found;
     }
 
  private:
+    const std::uint32_t* masks(const NodeRow& choice) const {
+        return table_->choiceMask + static_cast<std::size_t>(choice.arg) * table_->classes;
+    }
+    const std::uint32_t* aheadRow(std::uint32_t found) const {
+        return table_->aheadRows + static_cast<std::size_t>(found & ~kMoreTokens) * (table_->classes + 1);
+    }
+    std::uint32_t byOneToken(std::uint32_t found) const {
+        return found & kMoreTokens ? aheadRow(found)[table_->classes] : found;
+    }
     void index();
     void indexGuard(std::uint16_t guard);
 
