@@ -155,8 +155,9 @@ class LexerReader {
             element.rule = item.text;
         } else if (item.kind == Item::Kind::Punct && item.text == "(") {
             element.kind = LexElement::Kind::Group;
+            in_.openGroup();
             element.alternatives = readAlternatives();
-            in_.expect(")");
+            in_.closeGroup();
         } else {
             in_.failAt(item.line, "unexpected '" + item.text + "' in a lexer rule");
         }

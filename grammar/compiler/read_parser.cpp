@@ -173,8 +173,9 @@ class ParserReader {
             if (group) in_.expect(")");
         } else if (item.text == "(" && item.kind == Item::Kind::Punct) {
             element.kind = Element::Kind::Group;
+            in_.openGroup();
             element.alternatives = readAlternatives(false);
-            in_.expect(")");
+            in_.closeGroup();
         } else {
             in_.failAt(item.line, "unexpected '" + item.text + "' in a rule");
         }

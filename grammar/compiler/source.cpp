@@ -93,6 +93,16 @@ std::string Cursor::expectName() {
     return next().text;
 }
 
+void Cursor::openGroup() {
+    constexpr int kGroups = 100;
+    if (++openGroups_ > kGroups) fail("more than " + std::to_string(kGroups) + " groups inside each other");
+}
+
+void Cursor::closeGroup() {
+    expect(")");
+    --openGroups_;
+}
+
 int Cursor::expectNumber(const std::string& after) {
     constexpr std::size_t kDigits = 9;
     if (peek().kind != Item::Kind::Number)

@@ -27,6 +27,11 @@ class Cursor {
     void expect(const std::string& punct);
     std::string expectName();
     int expectNumber(const std::string& after);
+    /// A group starts behind its parenthesis; fails where too many are open. The passes go down into groups
+    /// by calling themselves, so their depth is bounded here.
+    void openGroup();
+    /// And ends with its parenthesis.
+    void closeGroup();
     [[noreturn]] void fail(const std::string& what) const;
     [[noreturn]] void failAt(int line, const std::string& what) const;
     const std::string& file() const { return file_; }
@@ -35,6 +40,7 @@ class Cursor {
     std::string file_;
     std::vector<Item> items_;
     std::size_t at_ = 0;
+    int openGroups_ = 0;
 };
 
 /// The whole file as text; throws GrammarError when it can't be read.

@@ -104,6 +104,22 @@ TEST_P(Refusal, NamesFileAndLine) {
 INSTANTIATE_TEST_SUITE_P(Cases, Refusal, testing::ValuesIn(refusedCases()),
                          [](const auto& name) { return name.param; });
 
+TEST(GrammarCompiler, TakesAHundredGroupsInsideEachOther) {
+    OutputFolder out("groups");
+    std::string grammar = contentOf(kCases / "good" / "toy.grammar");
+    const std::string body = "tail : STAR ;";
+    const std::size_t at = grammar.find(body);
+    ASSERT_NE(at, std::string::npos);
+    grammar.replace(at, body.size(),
+                    "tail : " + std::string(100, '(') + "STAR" + std::string(100, ')') + " ;");
+    const fs::path file = out.path() / "toy.grammar";
+    std::ofstream(file, std::ios::binary) << grammar;
+    const fs::path good = kCases / "good";
+    const Outcome outcome = run("--tokens " + quoted(good / "toy.tokens") + "--lexer " +
+                                quoted(good / "toy.lexer") + quoted(file) + out.arguments());
+    EXPECT_EQ(outcome.status, 0) << outcome.said;
+}
+
 TEST(GrammarCompiler, TakesAGoodGrammar) {
     OutputFolder out("good");
     const Outcome outcome = run(inputsOf("good") + out.arguments());
