@@ -63,68 +63,6 @@ void firstSets(Program& p, const Facts& facts) {
     }
 }
 
-/// The tokens that can stand second, for every token that a node can start with.
-void secondTokens(Program& p, const Facts& facts) {
-    using Pairs = std::map<int, TokenBits>;
-    std::vector<Pairs> pairs(p.nodes.size());
-    const auto behind = [&](int node) {
-        TokenBits bits;
-        for (int t : p.nodes[index(node)].first) bits.set(index(t));
-        if (p.nodes[index(node)].canEnd) bits.set(kEof);
-        return bits;
-    };
-    for (bool changed = true; changed;) {
-        changed = false;
-        for (std::size_t i = p.nodes.size(); i-- > 0;) {
-            const Node& n = p.nodes[i];
-            const auto add = [&](int token, const TokenBits& seconds) {
-                TokenBits& known = pairs[i][token];
-                const TokenBits now = known | seconds;
-                changed = changed || now != known;
-                known = now;
-            };
-            const auto join = [&](int next) {
-                for (const auto& [token, seconds] : pairs[index(next)]) add(token, seconds);
-            };
-            switch (n.op) {
-                case Op::Token:
-                    add(n.arg, behind(n.next));
-                    break;
-                case Op::Set:
-                    for (int t : p.sets[index(n.arg)]) add(t, behind(n.next));
-                    break;
-                case Op::Call:
-                    for (auto [token, seconds] : Pairs(pairs[index(p.entry[index(n.arg)])])) {
-                        if (seconds[kEof]) seconds = seconds.reset(kEof) | behind(n.next);
-                        add(token, seconds);
-                    }
-                    if (facts.nullable[index(n.arg)] && !n.nonEmpty) join(n.next);
-                    break;
-                case Op::Choice:
-                    for (int t : n.targets) join(t);
-                    break;
-                case Op::Soft:
-                case Op::SoftStar: {
-                    TokenBits seconds = behind(n.next);
-                    if (n.op == Op::SoftStar) seconds.set(index(n.arg));
-                    add(n.arg, seconds);
-                    join(n.next);
-                    break;
-                }
-                case Op::End:
-                    break;
-                default:
-                    join(n.next);
-            }
-        }
-    }
-    p.second.resize(p.entry.size());
-    for (std::size_t r = 0; r < p.entry.size(); ++r)
-        for (const auto& [token, seconds] : pairs[index(p.entry[r])])
-            for (std::size_t t = 0; t < kMaxTokens; ++t)
-                if (seconds[t]) p.second[r][token].insert(static_cast<int>(t));
-}
-
 void runLinks(Program& p) {
     for (Node& n : p.nodes) {
         if (n.next >= 0) n.run = p.skip(n.next);
@@ -254,7 +192,6 @@ void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts,
     if (index(maxToken) >= kMaxTokens)
         throw GrammarError(grammar.name, 0, "more token numbers than the compiler holds");
     firstSets(program, facts);
-    secondTokens(program, facts);
     runLinks(program);
     guardCalls(program, facts);
     checkIsland(grammar, facts);

@@ -238,25 +238,6 @@ class Emitter {
         for (const Guard& g : program_.guards)
             guards.push_back({classSet(g.follow), classSet(g.last), classSet(g.outside)});
         const int openers = classSet(openersOf);
-        // What can stand second is only told by class: a union over the tokens of a class, so a "no" stays
-        // right.
-        std::vector<int> seconds;
-        std::map<std::array<std::uint64_t, 4>, int> knownSeconds;
-        for (const auto& ofRule : program_.second) {
-            std::vector<std::set<int>> byClass(index(program_.classes));
-            for (const auto& [token, second] : ofRule)
-                byClass[index(program_.classOf[index(token)])].insert(second.begin(), second.end());
-            for (const auto& second : byClass) {
-                if (second.empty() || second.count(kEof) != 0) {
-                    seconds.push_back(0xFFFF);
-                    continue;
-                }
-                const int made = classSet(second);
-                const auto [found, fresh] = knownSeconds.emplace(classSets_.back(), made);
-                if (!fresh) classSets_.pop_back();
-                seconds.push_back(found->second);
-            }
-        }
         const int recoverFollow = classSet(program_.recoverFollow);
 
         std::vector<std::pair<std::size_t, std::size_t>> choices;
@@ -301,7 +282,6 @@ class Emitter {
         array(o, "std::uint64_t", "classSets", words, [&](std::uint64_t w) { o << w << "u"; });
         array(o, "GuardRow", "guards", guards,
               [&](const auto& g) { o << "{" << g[0] << ", " << g[1] << ", " << g[2] << "}"; });
-        array(o, "std::uint16_t", "seconds", seconds, [&](int s) { o << s; });
         const auto number = [&](const char* name) {
             const auto found = vocabulary_.numberOf.find(name);
             return found == vocabulary_.numberOf.end() ? 0 : found->second;
@@ -314,8 +294,7 @@ class Emitter {
           << openers << ", " << recoverFollow << ", guards, " << guards.size() << ", "
           << std::max(program_.closer, 0) << ", " << parser_.start << ", " << parser_.statement << ", "
           << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule) << ", " << left << ", " << right << ", "
-          << parser_.keepTail << ", seconds, " << program_.stops << ", " << program_.statementStops
-          << "};\n\n";
+          << parser_.keepTail << ", " << program_.stops << ", " << program_.statementStops << "};\n\n";
     }
 
     void contexts(std::ostream& o) const {

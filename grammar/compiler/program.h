@@ -58,9 +58,6 @@ struct Program {
     std::vector<int> entry;  ///< by rule: first node
     std::vector<std::set<int>> sets;
     std::vector<Guard> guards;
-    /// By rule, by token that it starts with: what can come second, kEof standing for "anything, the rule may
-    /// be over". Told apart no finer than token classes are.
-    std::vector<std::map<int, std::set<int>>> second;
     /// By class of the token further on the same again, and last what fits whatever comes.
     std::vector<std::vector<std::uint32_t>> lookahead;
     static constexpr std::uint32_t kMore = 0x80000000u;

@@ -9,61 +9,67 @@ QuickSearch::Outcome QuickSearch::run(std::uint16_t rule, std::uint32_t position
     if (options_.quickSteps == 0) return Outcome::GaveUp;
     made_.start(rule, position);
     points_.clear();
-    low_ = high_ = position;
-    at_ = searchedFrom(table_, table_.rules[rule].entry);
+    place_ = {position, position, 0, 1, searchedFrom(table_, table_.rules[rule].entry)};
     std::uint32_t furthest = position;
     std::uint64_t bound = options_.quickSteps;
     while (!follow()) {
         if (tooDeep_) return Outcome::TooDeep;
         // A way that fails is followed by one that gets further, or there is more wrong.
-        if (low_ > furthest) {
-            furthest = low_;
+        if (place_.low > furthest) {
+            furthest = place_.low;
             bound = steps_ + options_.quickSteps;
         }
         if (++steps_ > bound || remembered() > options_.maxMemo || !turnBack()) return Outcome::GaveUp;
     }
     if (remembered() > options_.maxMemo) return Outcome::GaveUp;
-    made_.end(0, low_, high_);
+    made_.end(0, place_.low, place_.high);
     return Outcome::Found;
 }
 
 /// Goes on until the whole is read, which gives true, or a way fails.
 bool QuickSearch::follow() {
+    Place here = place_;
+    bool goesOn = true;
     for (;;) {
-        const NodeRow& node = table_.nodes[at_];
+        const NodeRow& node = table_.nodes[here.node];
         switch (node.op) {
             case Op::Choice: {
-                std::uint32_t mask = text_.viable(node, low_, high_);
-                if (mask == 0) return false;
+                std::uint32_t mask = text_.viable(node, here.low, here.high);
                 const auto branch = static_cast<std::uint32_t>(std::countr_zero(mask));
+                goesOn = mask != 0;
+                if (!goesOn) break;
                 mask &= mask - 1;
                 if (mask != 0)
-                    points_.push_back({low_, high_, mask, part_, depth_,
-                                       static_cast<std::uint32_t>(made_.choices.size()),
-                                       static_cast<std::uint32_t>(made_.parts.size()), at_});
-                take(branch);
+                    points_.push_back({here, mask, static_cast<std::uint32_t>(made_.choices.size()),
+                                       static_cast<std::uint32_t>(made_.parts.size())});
+                here.node = take(node, branch);
                 continue;
             }
             case Op::Call:
-                if (!call(node)) return false;
-                continue;
+                goesOn = call(here);
+                break;
             case Op::End:
-                if (part_ == 0) return high_ == text_.count();
-                if (!comeBack()) return false;
-                continue;
+                if (here.part == 0) {
+                    place_ = here;
+                    return here.high == text_.count();
+                }
+                goesOn = comeBack(here);
+                break;
             default:
-                if (!text_.take(node, low_, high_)) return false;
+                goesOn = text_.take(node, here.low, here.high);
+                here.node = node.run;
                 break;
         }
-        at_ = node.run;
+        if (!goesOn) break;
     }
+    place_ = here;
+    return false;
 }
 
-void QuickSearch::take(std::uint32_t branch) {
-    const NodeRow& choice = table_.nodes[at_];
-    const std::uint16_t target = table_.targets[table_.choices[choice.arg].firstTarget + branch];
-    made_.choices.push_back(target);
-    at_ = searchedFrom(table_, target);
+inline std::uint16_t QuickSearch::take(const NodeRow& choice, std::uint32_t branch) {
+    const std::uint32_t target = table_.choices[choice.arg].firstTarget + branch;
+    made_.choices.push_back(table_.targets[target]);
+    return table_.stopOf[target];
 }
 
 /// Back to the last choice that has a branch left.
@@ -72,45 +78,41 @@ bool QuickSearch::turnBack() {
     Point& point = points_.back();
     made_.choices.resize(point.choices);
     made_.parts.resize(point.parts);
-    low_ = point.low;
-    high_ = point.high;
-    part_ = point.part;
-    depth_ = point.depth;
-    at_ = point.node;
+    place_ = point.place;
     const auto branch = static_cast<std::uint32_t>(std::countr_zero(point.mask));
     point.mask &= point.mask - 1;
     if (point.mask == 0) points_.pop_back();
-    take(branch);
+    place_.node = take(table_.nodes[place_.node], branch);
     return true;
 }
 
-bool QuickSearch::call(const NodeRow& node) {
-    if (!text_.settle(low_, high_)) return false;
+inline bool QuickSearch::call(Place& place) {
+    const NodeRow& node = table_.nodes[place.node];
+    if (!text_.settle(place.low, place.high)) return false;
     const RuleRow& rule = table_.rules[node.arg];
     if (!rule.nullable || (node.flags & kNonEmpty)) {
-        if (!text_.inSet(table_.firstSetBase + node.arg, text_.classAt(low_)) ||
-            !text_.secondFits(node.arg, low_))
-            return false;
+        if (!text_.inSet(table_.firstSetBase + node.arg, text_.classAt(place.low))) return false;
     }
-    if (!text_.guarded(node, low_)) return false;
-    tooDeep_ = ++depth_ >= options_.maxDepth;
+    if (!text_.guarded(node, place.low)) return false;
+    tooDeep_ = ++place.depth >= options_.maxDepth;
     if (tooDeep_) return false;
     ++steps_;
-    made_.parts.push_back({part_, low_, 0, 0, 0, 0, at_, false});
-    part_ = static_cast<std::uint32_t>(made_.parts.size()) - 1;
-    at_ = searchedFrom(table_, rule.entry);
+    const auto part = static_cast<std::uint32_t>(made_.parts.size());
+    made_.parts.push_back({place.part, place.low, 0, 0, 0, 0, place.node, false});
+    place.part = part;
+    place.node = searchedFrom(table_, rule.entry);
     return true;
 }
 
 /// The rule at work is over: its caller goes on.
-bool QuickSearch::comeBack() {
-    const Derivation::Part& part = made_.parts[part_];
+inline bool QuickSearch::comeBack(Place& place) {
+    const Derivation::Part& part = made_.parts[place.part];
     const NodeRow& node = table_.nodes[part.node];
-    if (high_ == part.position && (node.flags & kNonEmpty)) return false;
-    made_.end(part_, low_, high_);
-    at_ = node.run;
-    part_ = part.outer;
-    --depth_;
+    if (place.high == part.position && (node.flags & kNonEmpty)) return false;
+    made_.end(place.part, place.low, place.high);
+    place.node = node.run;
+    place.part = part.outer;
+    --place.depth;
     return true;
 }
 

@@ -15,11 +15,16 @@ namespace zr::engine {
 
 class QuickSearch {
  public:
+    /// Where the search stands.
+    struct Place {
+        std::uint32_t low, high;
+        std::uint32_t part, depth;
+        std::uint16_t node;
+    };
     /// A choice that has branches left, and how much had been written down there.
     struct Point {
-        std::uint32_t low, high, mask, part, depth;
-        std::uint32_t choices, parts;
-        std::uint16_t node;
+        Place place;
+        std::uint32_t mask, choices, parts;
     };
 
     enum class Outcome { Found, GaveUp, TooDeep };
@@ -41,19 +46,16 @@ class QuickSearch {
  private:
     bool follow();
     bool turnBack();
-    void take(std::uint32_t branch);
-    bool call(const NodeRow& node);
-    bool comeBack();
+    std::uint16_t take(const NodeRow& choice, std::uint32_t branch);
+    bool call(Place& place);
+    bool comeBack(Place& place);
 
     const ParserTable& table_;
     TextIndex& text_;
     const Options& options_;
     Derivation& made_;
     std::vector<Point>& points_;
-    // where the search stands
-    std::uint16_t at_ = 0;
-    std::uint32_t low_ = 0, high_ = 0;
-    std::uint32_t part_ = 0, depth_ = 1;
+    Place place_{};
     std::uint64_t steps_ = 0;
     bool tooDeep_ = false;
 };

@@ -31,9 +31,7 @@ bool Reach::mayBeEmpty(const NodeRow& call) const {
 }
 
 bool Reach::mayCall(const NodeRow& call, std::uint32_t position) {
-    const bool recovers = recovery_.place != kNone;
-    if (!mayBeEmpty(call) && (!text_->inSet(table_->firstSetBase + call.arg, text_->classAt(position)) ||
-                              (!recovers && !text_->secondFits(call.arg, position))))
+    if (!mayBeEmpty(call) && !text_->inSet(table_->firstSetBase + call.arg, text_->classAt(position)))
         return false;
     return text_->guarded(call, position);
 }

@@ -134,8 +134,6 @@ struct ParserTable {
     std::uint16_t recoverRule;            ///< rule or kNone16
     std::uint16_t leftParen, rightParen;  ///< token numbers for "the same parenthesis depth", 0 for none
     std::uint8_t keepTail;
-    /// [rule * classes + class of the first token]: class set of what can come second, kNone16 for anything.
-    const std::uint16_t* seconds;
     /// Nodes that a search stops at. They stand first, each behind those that can come after it without a
     /// token in between.
     std::uint32_t stops;

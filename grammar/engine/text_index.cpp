@@ -1,5 +1,6 @@
 #include "grammar/engine/text_index.h"
 
+#include <algorithm>
 #include <cstddef>
 
 namespace zr::engine {
@@ -30,23 +31,39 @@ void TextIndex::index() {
         runEnd_[count_] = count_;
         for (std::uint32_t i = count_; i-- > 0;) runEnd_[i] = isCloser(i) ? runEnd_[i + 1] : i;
     }
-    candidates_.assign(table_->guardCount, {});
-    barriers_.assign(table_->guardCount, {});
+    guards_.assign(table_->guardCount, {});
     nextOpener_.clear();
 }
 
-void TextIndex::indexGuard(std::uint16_t number) {
+bool TextIndex::mayComeBehind(std::uint16_t number, std::uint32_t position) {
+    // Mostly one of the next few tokens decides; a pass over the whole text pays only where they don't.
+    constexpr std::uint32_t kFewTokens = 16;
     const GuardRow& guard = table_->guards[number];
-    std::vector<std::uint32_t>& candidates = candidates_[number];
-    std::vector<std::uint32_t>& barriers = barriers_[number];
-    candidates.resize(count_ + 1);
-    barriers.resize(count_ + 1);
-    candidates[count_] = kNone;
-    barriers[count_] = count_;
+    GuardIndex& known = guards_[number];
+    if (known.last == kNone)
+        for (known.last = count_ - 1; known.last != 0 && !isCandidate(guard, known.last);) --known.last;
+    if (known.last <= position) return false;
+    if (known.candidates.empty()) {
+        const std::uint32_t end = std::min(count_, position + kFewTokens);
+        for (std::uint32_t i = position; i < end; ++i) {
+            if (inSet(table_->openerSet, classes_[i]) || (i > position && isCandidate(guard, i))) return true;
+            if (!inSet(guard.outside, classes_[i]))
+                return i + 1 < count_ && inSet(table_->openerSet, classes_[i + 1]);
+        }
+        indexGuard(guard, known);
+    }
+    const std::uint32_t barrier = known.barriers[position];
+    return known.candidates[position + 1] <= barrier || nextOpener_[position] <= barrier + 1;
+}
+
+void TextIndex::indexGuard(const GuardRow& guard, GuardIndex& known) {
+    known.candidates.resize(count_ + 1);
+    known.barriers.resize(count_ + 1);
+    known.candidates[count_] = kNone;
+    known.barriers[count_] = count_;
     for (std::uint32_t i = count_; i-- > 0;) {
-        const bool here = i > 0 && inSet(guard.follow, classes_[i]) && inSet(guard.last, classes_[i - 1]);
-        candidates[i] = here ? i : candidates[i + 1];
-        barriers[i] = inSet(guard.outside, classes_[i]) ? barriers[i + 1] : i;
+        known.candidates[i] = i > 0 && isCandidate(guard, i) ? i : known.candidates[i + 1];
+        known.barriers[i] = inSet(guard.outside, classes_[i]) ? known.barriers[i + 1] : i;
     }
     if (!nextOpener_.empty()) return;
     nextOpener_.resize(count_ + 1);

@@ -36,22 +36,12 @@ class TextIndex {
         return (table_->classSets[set * 4 + cls / 64] >> (cls % 64)) & 1;
     }
 
-    /// Whether the second token fits a rule that starts at a position.
-    bool secondFits(std::uint16_t rule, std::uint32_t position) const {
-        if (position >= count_) return true;
-        const std::uint16_t set = table_->seconds[rule * table_->classes + classes_[position]];
-        return set == kNone16 || inSet(set, classes_[position + 1]);
-    }
     /// Whether the text still holds what a Call and the part behind it can't do without. A cheap "no" here
     /// saves the search of an alternative that was never going to work, such as an alias behind every column.
     bool guarded(const NodeRow& call, std::uint32_t position) {
         if (call.required != 0 && lastOf_[call.required] <= position) return false;
         if (call.guard == kNone16 || position >= count_) return true;
-        if (candidates_[call.guard].empty()) indexGuard(call.guard);
-        const std::uint32_t candidate = candidates_[call.guard][position + 1];
-        if (candidate == kNone) return false;
-        const std::uint32_t barrier = barriers_[call.guard][position];
-        return candidate <= barrier || nextOpener_[position] <= barrier + 1;
+        return mayComeBehind(call.guard, position);
     }
     // A place in the text is an interval: inside a run of closers every position from `low` to `high` can be
     // it.
@@ -123,8 +113,19 @@ class TextIndex {
     std::uint32_t byOneToken(std::uint32_t found) const {
         return found & kMoreTokens ? aheadRow(found)[table_->classes] : found;
     }
+    /// What a guard waits for, told by the tokens that it took a pass over the text to find.
+    struct GuardIndex {
+        std::uint32_t last = kNone;  ///< where it stands last, 0 for nowhere; kNone: not looked for
+        std::vector<std::uint32_t> candidates;  ///< by position: the next that could satisfy it
+        std::vector<std::uint32_t> barriers;    ///< by position: the next outside
+    };
+
     void index();
-    void indexGuard(std::uint16_t guard);
+    bool mayComeBehind(std::uint16_t guard, std::uint32_t position);
+    bool isCandidate(const GuardRow& guard, std::uint32_t position) const {
+        return inSet(guard.follow, classes_[position]) && inSet(guard.last, classes_[position - 1]);
+    }
+    void indexGuard(const GuardRow& guard, GuardIndex& index);
 
     const ParserTable* table_;
     const std::vector<std::uint16_t>* types_;
@@ -132,8 +133,7 @@ class TextIndex {
     std::vector<std::uint8_t> classes_;  ///< by position, the last one for the end of the text
     std::vector<std::uint32_t> runEnd_;  ///< by position; empty when there is no closer
     std::vector<std::uint32_t> lastOf_;  ///< by token number: one past the last position where it stands
-    std::vector<std::vector<std::uint32_t>> candidates_;  ///< by guard: next position that could satisfy it
-    std::vector<std::vector<std::uint32_t>> barriers_;    ///< by guard: next position outside
+    std::vector<GuardIndex> guards_;
     std::vector<std::uint32_t> nextOpener_;
 };
 
