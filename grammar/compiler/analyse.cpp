@@ -147,6 +147,10 @@ void tokenClasses(Program& p, const Facts& facts, int maxToken) {
         if (n.op == Op::Choice)
             for (int t : n.targets) sets.push_back(&p.nodes[index(t)].first);
     sets.push_back(&p.recoverFollow);
+    std::set<std::set<int>> required;  // each on its own: a token of its class mustn't stand for it
+    for (const Node& n : p.nodes)
+        if (n.required >= 0) required.insert({n.required});
+    for (const auto& each : required) sets.push_back(&each);
     const std::set<int> closer{p.closer};
     sets.push_back(&closer);
 

@@ -23,12 +23,17 @@ Recogniser::~Recogniser() {
 std::size_t Recogniser::Work::bytes() const {
     return derivation.parts.capacity() * sizeof(Derivation::Part) +
            derivation.choices.capacity() * sizeof(std::uint16_t) +
-           points.capacity() * sizeof(QuickSearch::Point) + full.capacity();
+           points.capacity() * sizeof(QuickSearch::Point) + (full ? full->capacity() : 0);
 }
 
 std::unique_ptr<Recogniser::Work>& Recogniser::spare() {
     static thread_local std::unique_ptr<Work> mine;
     return mine;
+}
+
+FullSearch& Recogniser::fullWork() {
+    if (!work_->full) work_->full = std::make_unique<FullSearch>();
+    return *work_->full;
 }
 
 Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
@@ -46,7 +51,7 @@ Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
 }
 
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
-    const std::uint32_t place = recoveryPlace(*table_, text_, *options_, work_->full, rule, position);
+    const std::uint32_t place = recoveryPlace(*table_, text_, *options_, fullWork(), rule, position);
     if (place == Reach::kNone) return {};
     return fullSearch(rule, position, {place, skippedTo(*table_, text_, place)});
 }
@@ -56,11 +61,12 @@ Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t positio
 Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t position,
                                           const Reach::Recovery& recovery) {
     Result result;
+    FullSearch& full = fullWork();
     for (;;) {
         const FullSearch::Outcome outcome =
-            work_->full.run(*table_, text_, *options_, recovery, rule, position, work_->derivation);
-        steps_ += work_->full.steps();
-        remembered_ = std::max(remembered_, work_->full.remembered());
+            full.run(*table_, text_, *options_, recovery, rule, position, work_->derivation);
+        steps_ += full.steps();
+        remembered_ = std::max(remembered_, full.remembered());
         if (outcome == FullSearch::Outcome::OverBudget && text_.count() > position) {
             result.overBudget = true;
             text_.cutAt(position + (text_.count() - position) / 2);
@@ -70,7 +76,7 @@ Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t posi
         result.overLimit = outcome == FullSearch::Outcome::TooDeep;
         if (outcome != FullSearch::Outcome::Found) return result;
         result.found = true;
-        result.high = work_->full.reached();
+        result.high = full.reached();
         return result;
     }
 }

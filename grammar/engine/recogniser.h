@@ -57,9 +57,10 @@ class Recogniser {
     struct Work {
         Derivation derivation;
         std::vector<QuickSearch::Point> points;
-        FullSearch full;
+        std::unique_ptr<FullSearch> full;  ///< null until a text needs it
         std::size_t bytes() const;
     };
+    FullSearch& fullWork();
     static std::unique_ptr<Work>& spare();
 
     Result fullSearch(std::uint16_t rule, std::uint32_t position, const Reach::Recovery& recovery);

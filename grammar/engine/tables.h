@@ -79,7 +79,7 @@ struct NodeRow {
     std::uint16_t next;      ///< next node of the path
     std::uint16_t run;       ///< next node that the recogniser stops at
     std::uint16_t guard;     ///< Call: guard or kNone16
-    std::uint16_t required;  ///< Call: a token number that must still come, 0 for none
+    std::uint16_t required;  ///< Call: one past the class of a token that must still come, 0 for none
 };
 
 enum NodeFlags : std::uint8_t {

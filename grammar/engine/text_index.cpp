@@ -17,11 +17,11 @@ void TextIndex::cutAt(std::uint32_t count) {
 
 void TextIndex::index() {
     classes_.resize(count_ + 1);
-    lastOf_.assign(table_->maxToken + 1, 0);
+    lastOf_.assign(table_->classes, 0);
     bool closers = false;
     for (std::uint32_t i = 0; i < count_; ++i) {
         classes_[i] = table_->classOf[type(i)];
-        lastOf_[type(i)] = i + 1;
+        lastOf_[classes_[i]] = i + 1;
         closers = closers || isCloser(i);
     }
     classes_[count_] = table_->classOf[0];
@@ -32,6 +32,7 @@ void TextIndex::index() {
         for (std::uint32_t i = count_; i-- > 0;) runEnd_[i] = isCloser(i) ? runEnd_[i + 1] : i;
     }
     guards_.assign(table_->guardCount, {});
+    guardIndexes_.clear();
     nextOpener_.clear();
 }
 
@@ -39,24 +40,27 @@ bool TextIndex::mayComeBehind(std::uint16_t number, std::uint32_t position) {
     // Mostly one of the next few tokens decides; a pass over the whole text pays only where they don't.
     constexpr std::uint32_t kFewTokens = 16;
     const GuardRow& guard = table_->guards[number];
-    GuardIndex& known = guards_[number];
+    Guarded& known = guards_[number];
     if (known.last == kNone)
         for (known.last = count_ - 1; known.last != 0 && !isCandidate(guard, known.last);) --known.last;
     if (known.last <= position) return false;
-    if (known.candidates.empty()) {
+    if (known.index == kNone) {
         const std::uint32_t end = std::min(count_, position + kFewTokens);
         for (std::uint32_t i = position; i < end; ++i) {
             if (inSet(table_->openerSet, classes_[i]) || (i > position && isCandidate(guard, i))) return true;
             if (!inSet(guard.outside, classes_[i]))
                 return i + 1 < count_ && inSet(table_->openerSet, classes_[i + 1]);
         }
-        indexGuard(guard, known);
+        known.index = static_cast<std::uint32_t>(guardIndexes_.size());
+        guardIndexes_.push_back(indexOf(guard));
     }
-    const std::uint32_t barrier = known.barriers[position];
-    return known.candidates[position + 1] <= barrier || nextOpener_[position] <= barrier + 1;
+    const GuardIndex& index = guardIndexes_[known.index];
+    const std::uint32_t barrier = index.barriers[position];
+    return index.candidates[position + 1] <= barrier || nextOpener_[position] <= barrier + 1;
 }
 
-void TextIndex::indexGuard(const GuardRow& guard, GuardIndex& known) {
+TextIndex::GuardIndex TextIndex::indexOf(const GuardRow& guard) {
+    GuardIndex known;
     known.candidates.resize(count_ + 1);
     known.barriers.resize(count_ + 1);
     known.candidates[count_] = kNone;
@@ -65,11 +69,12 @@ void TextIndex::indexGuard(const GuardRow& guard, GuardIndex& known) {
         known.candidates[i] = i > 0 && isCandidate(guard, i) ? i : known.candidates[i + 1];
         known.barriers[i] = inSet(guard.outside, classes_[i]) ? known.barriers[i + 1] : i;
     }
-    if (!nextOpener_.empty()) return;
+    if (!nextOpener_.empty()) return known;
     nextOpener_.resize(count_ + 1);
     nextOpener_[count_] = count_ + 2;
     for (std::uint32_t i = count_; i-- > 0;)
         nextOpener_[i] = inSet(table_->openerSet, classes_[i]) ? i : nextOpener_[i + 1];
+    return known;
 }
 
 }  // namespace zr::engine

@@ -39,7 +39,7 @@ class TextIndex {
     /// Whether the text still holds what a Call and the part behind it can't do without. A cheap "no" here
     /// saves the search of an alternative that was never going to work, such as an alias behind every column.
     bool guarded(const NodeRow& call, std::uint32_t position) {
-        if (call.required != 0 && lastOf_[call.required] <= position) return false;
+        if (call.required != 0 && lastOf_[call.required - 1] <= position) return false;
         if (call.guard == kNone16 || position >= count_) return true;
         return mayComeBehind(call.guard, position);
     }
@@ -113,11 +113,14 @@ class TextIndex {
     std::uint32_t byOneToken(std::uint32_t found) const {
         return found & kMoreTokens ? aheadRow(found)[table_->classes] : found;
     }
-    /// What a guard waits for, told by the tokens that it took a pass over the text to find.
+    /// Where what a guard waits for stands: a pass over the text for each.
     struct GuardIndex {
-        std::uint32_t last = kNone;  ///< where it stands last, 0 for nowhere; kNone: not looked for
         std::vector<std::uint32_t> candidates;  ///< by position: the next that could satisfy it
         std::vector<std::uint32_t> barriers;    ///< by position: the next outside
+    };
+    struct Guarded {
+        std::uint32_t last = kNone;   ///< where it stands last, 0 for nowhere; kNone: not looked for
+        std::uint32_t index = kNone;  ///< kNone: not made
     };
 
     void index();
@@ -125,15 +128,16 @@ class TextIndex {
     bool isCandidate(const GuardRow& guard, std::uint32_t position) const {
         return inSet(guard.follow, classes_[position]) && inSet(guard.last, classes_[position - 1]);
     }
-    void indexGuard(const GuardRow& guard, GuardIndex& index);
+    GuardIndex indexOf(const GuardRow& guard);
 
     const ParserTable* table_;
     const std::vector<std::uint16_t>* types_;
     std::uint32_t count_;
     std::vector<std::uint8_t> classes_;  ///< by position, the last one for the end of the text
     std::vector<std::uint32_t> runEnd_;  ///< by position; empty when there is no closer
-    std::vector<std::uint32_t> lastOf_;  ///< by token number: one past the last position where it stands
-    std::vector<GuardIndex> guards_;
+    std::vector<std::uint32_t> lastOf_;  ///< by class: one past the last position where it stands
+    std::vector<Guarded> guards_;
+    std::vector<GuardIndex> guardIndexes_;
     std::vector<std::uint32_t> nextOpener_;
 };
 
