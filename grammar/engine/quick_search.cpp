@@ -39,9 +39,11 @@ bool QuickSearch::follow() {
                 goesOn = mask != 0;
                 if (!goesOn) break;
                 mask &= mask - 1;
-                if (mask != 0)
+                if (mask != 0) {
+                    growSlowly(points_);
                     points_.push_back({here, mask, static_cast<std::uint32_t>(made_.choices.size()),
                                        static_cast<std::uint32_t>(made_.parts.size())});
+                }
                 here.node = take(node, branch);
                 continue;
             }
@@ -98,6 +100,7 @@ inline bool QuickSearch::call(Place& place) {
     if (tooDeep_) return false;
     ++steps_;
     const auto part = static_cast<std::uint32_t>(made_.parts.size());
+    growSlowly(made_.parts);
     made_.parts.push_back({place.part, place.low, 0, 0, 0, 0, place.node, false});
     place.part = part;
     place.node = searchedFrom(table_, rule.entry);

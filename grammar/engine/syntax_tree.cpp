@@ -12,8 +12,10 @@ class SyntaxTreeGrowth {
     using Node = std::uint32_t;
 
     explicit SyntaxTreeGrowth(const LexedText& text) : text_(text) {
+        constexpr std::size_t kNodesOfToken = 2;
         nodes_.swap(spare());
         nodes_.clear();
+        if (nodes_.capacity() == 0) nodes_.reserve(kNodesOfToken * text.seenCount() + 8);
     }
     ~SyntaxTreeGrowth() {
         if (nodes_.capacity() > spare().capacity() && nodes_.capacity() * sizeof(Grown) <= kSpareBytes / 2)
@@ -68,6 +70,7 @@ class SyntaxTreeGrowth {
         return mine;
     }
     Node make(SyntaxTree::Kind kind, std::uint16_t type, std::uint32_t token) {
+        growSlowly(nodes_);
         nodes_.push_back({token, 0, 0, 0, 0, 0, type, kind});
         return static_cast<Node>(nodes_.size()) - 1;
     }
