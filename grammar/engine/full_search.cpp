@@ -19,8 +19,7 @@ std::size_t FullSearch::bytes() const {
 
 std::size_t FullSearch::capacity() const {
     return reach_.capacity() + sets_.capacity() + behind_.capacity() + starts_.capacity() +
-           byVertex_.capacity() * sizeof(SetId) + vertexFrom_.capacity() * sizeof(std::uint32_t) +
-           vertexBefore_.capacity() * sizeof(std::uint16_t) + walks_.capacity() * sizeof(Walk);
+           byVertex_.capacity() * sizeof(SetId) + walks_.capacity() * sizeof(Walk);
 }
 
 void FullSearch::start(const ParserTable& table, TextIndex& text, const Options& options,
@@ -39,10 +38,8 @@ FullSearch::Outcome FullSearch::run(const ParserTable& table, TextIndex& text, c
                                     const Reach::Recovery& recovery, std::uint16_t rule,
                                     std::uint32_t position, Derivation& derivation) {
     constexpr std::size_t kFirstLook = 4;
-    if (Reach::bytesFor(table, text.count() - position) > kMemoBytes * options.maxMemo)
-        return Outcome::OverBudget;
     start(table, text, options, recovery, &derivation);
-    reach_.follow(rule, position);
+    if (!reach_.follow(rule, position, kMemoBytes * options.maxMemo)) return Outcome::OverBudget;
     const std::vector<std::uint32_t>& ends = reach_.ends();
     // Reach mostly says where the reading ends, or a little too much: the last ends it names come first.
     std::size_t count = ends.size();
@@ -65,9 +62,7 @@ std::vector<std::uint32_t> FullSearch::allEnds(const ParserTable& table, TextInd
                                                std::uint32_t position) {
     std::vector<std::uint32_t> found;
     start(table, text, options, {}, nullptr);
-    if (Reach::bytesFor(table, text.count() - position) > kMemoBytes * options.maxMemo) return found;
-    reach_.follow(rule, position);
-    if (reach_.ends().empty()) return found;
+    if (!reach_.follow(rule, position, kMemoBytes * options.maxMemo) || reach_.ends().empty()) return found;
     reach_.keep(reach_.ends().front(), reach_.ends().back());
     if (!findSets(position, reach_.ends().back())) return found;
     const SetId ends = endsOf(rule, position);
@@ -81,50 +76,34 @@ std::vector<std::uint32_t> FullSearch::allEnds(const ParserTable& table, TextInd
 bool FullSearch::findSets(std::uint32_t position, std::uint32_t end) {
     const std::uint64_t budget =
         steps() + options_->baseSteps + options_->stepsPerToken * (end - position + 1);
-    const std::size_t rowWords = reach_.words();
-    from_ = position;
     sets_.start(position, end);
     byVertex_.clear();
     byVertex_.reserve(reach_.keptCount());
-    vertexFrom_.assign(end - position + 1, 0);
-    vertexBefore_.assign((end - position + 1) * rowWords, 0);
     behind_.start(sets_, reach_.nodes());
     starts_.start();
     here_.assign(reach_.nodes(), kEmpty);
     ahead_.assign(reach_.nodes(), kEmpty);
     for (std::uint32_t p = end + 1; p-- > position;) {
-        const std::uint64_t* row = reach_.keptAt(p);
-        const std::uint32_t here = p - position;
-        vertexFrom_[here] = static_cast<std::uint32_t>(byVertex_.size());
-        std::uint16_t* before = vertexBefore_.data() + here * rowWords;
-        for (std::size_t w = 0; w < rowWords; ++w) {
-            before[w] = static_cast<std::uint16_t>(byVertex_.size() - vertexFrom_[here]);
-            // In their order each node stands behind those that its set is made of.
-            for (std::uint64_t left = row[w]; left != 0; left &= left - 1) {
-                const auto node =
-                    static_cast<std::uint16_t>(w * 64 + static_cast<unsigned>(std::countr_zero(left)));
-                const SetId set = setFor(node, p);
-                byVertex_.push_back(set);
-                here_[node] = set;
-                if (set != kEmpty && (table_->nodes[node].flags & kBehindCall)) behind_.note(node, p, set);
-            }
+        const std::span<const std::uint16_t> kept = reach_.keptAt(p);
+        // In their order each node stands behind those that its set is made of.
+        for (const std::uint16_t node : kept) {
+            const SetId set = setFor(node, p);
+            byVertex_.push_back(set);
+            here_[node] = set;
+            if (set != kEmpty && (table_->nodes[node].flags & kBehindCall)) behind_.note(node, p, set);
         }
-        for (std::size_t w = 0; p < end && w < rowWords; ++w)
-            for (std::uint64_t left = row[rowWords + w]; left != 0; left &= left - 1)
-                ahead_[w * 64 + static_cast<unsigned>(std::countr_zero(left))] = kEmpty;
+        if (p < end)
+            for (const std::uint16_t node : reach_.keptAt(p + 1)) ahead_[node] = kEmpty;
         here_.swap(ahead_);
-        steps_ += 1 + (byVertex_.size() - vertexFrom_[here]) / 8;
+        steps_ += 1 + kept.size() / 8;
         if (steps() > budget || remembered() > options_->maxMemo) return false;
     }
     return true;
 }
 
 SetId FullSearch::setAt(std::uint16_t node, std::uint32_t position) const {
-    if (!reach_.keeps(node, position)) return kEmpty;
-    const std::size_t w = node / 64;
-    const std::uint64_t below = reach_.keptAt(position)[w] & ((std::uint64_t{1} << (node % 64)) - 1);
-    const std::uint32_t here = position - from_;
-    return byVertex_[vertexFrom_[here] + vertexBefore_[here * reach_.words() + w] + countOnes(below)];
+    const std::uint32_t place = reach_.keptPlace(node, position);
+    return place == Reach::kNone ? kEmpty : byVertex_[place];
 }
 
 /// The ends that the rule of a node can come to from a position, when those of all nodes further on, and of

@@ -95,12 +95,9 @@ class FullSearch {
     Derivation* made_ = nullptr;
 
     Reach reach_;
-    std::uint32_t from_ = 0;
     PositionSets sets_;
-    std::vector<SetId> byVertex_;              ///< of the nodes that were kept, position by position
-    std::vector<std::uint32_t> vertexFrom_;    ///< by position
-    std::vector<std::uint16_t> vertexBefore_;  ///< by position and word of its row: nodes in the words before
-    std::vector<SetId> here_, ahead_;          ///< by node: of the position at hand and of the next one
+    std::vector<SetId> byVertex_;      ///< of the nodes that were kept
+    std::vector<SetId> here_, ahead_;  ///< by node: of the position at hand and of the next one
     EndsBehind behind_;
     StartsBefore starts_;
     std::vector<PositionSets::Part> gained_;

@@ -12,11 +12,11 @@ void Reach::start(const ParserTable& table, TextIndex& text, const Recovery& rec
 }
 
 std::size_t Reach::bytes() const {
-    return kept_.size() * sizeof(std::uint64_t) + (ways_.size() + steps_.size()) * sizeof(Way);
+    return kept_.size() * sizeof(std::uint16_t) + (ways_.size() + steps_.size()) * sizeof(Way);
 }
 
 std::size_t Reach::capacity() const {
-    return kept_.capacity() * sizeof(std::uint64_t) +
+    return kept_.capacity() * sizeof(std::uint16_t) + keptFrom_.capacity() * sizeof(std::uint32_t) +
            (ways_.capacity() + steps_.capacity() + skips_.capacity()) * sizeof(Way) +
            (waysFrom_.capacity() + stepsFrom_.capacity() + ends_.capacity()) * sizeof(std::uint32_t);
 }
@@ -43,7 +43,7 @@ bool Reach::comesBack(std::uint16_t call, std::uint32_t position) const {
 
 // ---- forward
 
-void Reach::follow(std::uint16_t rule, std::uint32_t position) {
+bool Reach::follow(std::uint16_t rule, std::uint32_t position, std::size_t most) {
     rule_ = rule;
     from_ = position;
     end_ = text_->count();
@@ -61,6 +61,7 @@ void Reach::follow(std::uint16_t rule, std::uint32_t position) {
     steps_.clear();
     waysFrom_.clear();
     stepsFrom_.clear();
+    kept_.clear();
     skips_.clear();
     ends_.clear();
     meet(entry);
@@ -77,9 +78,11 @@ void Reach::follow(std::uint16_t rule, std::uint32_t position) {
         }
         std::fill(met_.begin(), met_.end(), 0);
         const bool skips = !skips_.empty() && p < recovery_.to;
+        if (bytes() > most) return false;
         if (steps_.size() == stepsFrom_.back() && !skips) break;
     }
     beginPosition();
+    return true;
 }
 
 void Reach::beginPosition() {
@@ -148,41 +151,61 @@ void Reach::passCall(std::uint16_t at, std::uint32_t p) {
 // ---- back
 
 /// Whether a node is kept for something that is kept behind it at the same position.
-bool Reach::leadsOn(std::uint16_t at, const std::uint64_t* row) const {
+bool Reach::leadsOn(std::uint16_t at) const {
     const NodeRow& node = table_->nodes[at];
     if (node.op != Op::Call) return true;
-    return has(row, searchedFrom(*table_, table_->rules[node.arg].entry)) &&
-           (returns_[at] || (mayBeEmpty(node) && has(row, node.run)));
+    return has(here_.data(), searchedFrom(*table_, table_->rules[node.arg].entry)) &&
+           (returns_[at] || (mayBeEmpty(node) && has(here_.data(), node.run)));
 }
 
-void Reach::keepNode(std::uint16_t node, std::uint64_t* row) {
-    if (has(row, node)) return;
-    set(row, node);
+void Reach::keepNode(std::uint16_t node) {
+    if (has(here_.data(), node)) return;
+    set(here_.data(), node);
     open_.push_back(node);
 }
 
 void Reach::keep(std::uint32_t first, std::uint32_t last) {
     end_ = last;
-    kept_.assign((last - from_ + 1) * words_, 0);
-    keptCount_ = 0;
+    kept_.clear();
+    keptFrom_.assign(last - from_ + 2, 0);
+    here_.assign(words_, 0);
+    next_.assign(words_, 0);
     returns_.assign(nodes_, 0);
     wayTo_.assign(nodes_, kNone);
     for (std::uint32_t p = last + 1; p-- > from_;) {
         const std::uint32_t here = p - from_;
-        std::uint64_t* row = kept_.data() + here * words_;
         for (std::uint32_t i = stepsFrom_[here]; p < last && i < stepsFrom_[here + 1]; ++i)
-            if (has(row + words_, steps_[i].to)) keepNode(steps_[i].from, row);
-        if (p >= first && std::binary_search(ends_.begin(), ends_.end(), p)) keepNode(endOf_[rule_], row);
+            if (has(next_.data(), steps_[i].to)) keepNode(steps_[i].from);
+        if (p >= first && std::binary_search(ends_.begin(), ends_.end(), p)) keepNode(endOf_[rule_]);
         for (const Way& skip : skips_)
-            if (p == recovery_.place && keeps(skip.to, recovery_.to)) keepNode(skip.from, row);
+            if (p == recovery_.place && p < recovery_.to && keptPlace(skip.to, recovery_.to) != kNone)
+                keepNode(skip.from);
+        if (!open_.empty()) keepAt(p);
+        noteKept(here);
         const bool skipped = p > recovery_.place && p < recovery_.to;
-        if (open_.empty() && p < first && !skipped) return;  // nothing gets past here
-        if (!open_.empty()) keepAt(p, row);
+        if (keptFrom_[here] == keptFrom_[here + 1] && p < first && !skipped) {
+            std::fill_n(keptFrom_.begin(), here, keptFrom_[here]);
+            return;  // nothing gets past here
+        }
     }
 }
 
+/// Writes down what was kept at the position at hand, and goes on to the one before it.
+void Reach::noteKept(std::uint32_t here) {
+    keptFrom_[here + 1] = static_cast<std::uint32_t>(kept_.size());
+    for (std::size_t w = 0; w < words_; ++w)
+        for (std::uint64_t left = here_[w]; left != 0; left &= left - 1) {
+            growSlowly(kept_);
+            kept_.push_back(
+                static_cast<std::uint16_t>(w * 64 + static_cast<unsigned>(std::countr_zero(left))));
+        }
+    keptFrom_[here] = static_cast<std::uint32_t>(kept_.size());
+    here_.swap(next_);
+    std::fill(here_.begin(), here_.end(), 0);
+}
+
 /// Goes back along the ways at a position.
-void Reach::keepAt(std::uint32_t p, std::uint64_t* row) {
+void Reach::keepAt(std::uint32_t p) {
     const Way* ways = ways_.data() + waysFrom_[p - from_];
     const std::uint32_t count = waysFrom_[p - from_ + 1] - waysFrom_[p - from_];
     ended_.clear();
@@ -194,18 +217,17 @@ void Reach::keepAt(std::uint32_t p, std::uint64_t* row) {
     while (!open_.empty()) {
         const std::uint16_t node = open_.back();
         open_.pop_back();
-        ++keptCount_;
         if (table_->nodes[node].op == Op::End) ended_.push_back(table_->nodes[node].arg);
         for (std::uint32_t way = wayTo_[node]; way != kNone; way = wayBefore_[way])
-            if (leadsOn(ways[way].from, row)) keepNode(ways[way].from, row);
+            if (leadsOn(ways[way].from)) keepNode(ways[way].from);
         if (p == recovery_.place && p == recovery_.to)
             for (const Way& skip : skips_)
-                if (skip.to == node) keepNode(skip.from, row);
+                if (skip.to == node) keepNode(skip.from);
     }
     for (std::uint32_t i = 0; i < count; ++i) wayTo_[ways[i].to] = kNone;
     for (const std::uint16_t rule : ended_)
         forEachCallMet(rule, [&](std::uint16_t call) {
-            if (has(row, table_->nodes[call].run)) returns_[call] = 1;
+            if (has(here_.data(), table_->nodes[call].run)) returns_[call] = 1;
         });
 }
 

@@ -1,8 +1,11 @@
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
+#include <span>
 #include <vector>
 
+#include "grammar/engine/options.h"
 #include "grammar/engine/tables.h"
 #include "grammar/engine/text_index.h"
 
@@ -27,27 +30,26 @@ class Reach {
     /// Makes ready for a text; the table and the index must outlive what is done with them.
     void start(const ParserTable& table, TextIndex& text, const Recovery& recovery);
 
-    /// What looking at so many tokens takes at least, nearly all of it for the nodes that are kept.
-    static std::size_t bytesFor(const ParserTable& table, std::size_t tokens) {
-        return (tokens + 1) * ((table.statementStops + 63) / 64) * sizeof(std::uint64_t);
-    }
-
-    /// Finds what `rule` can pass from `position` on.
-    void follow(std::uint16_t rule, std::uint32_t position);
+    /// Finds what `rule` can pass from `position` on; false where that takes more bytes than `most`.
+    bool follow(std::uint16_t rule, std::uint32_t position, std::size_t most);
     /// Where the followed rule could end, in ascending order.
     const std::vector<std::uint32_t>& ends() const { return ends_; }
     /// Keeps what can lead to an end of the followed rule from `first` to `last`.
     void keep(std::uint32_t first, std::uint32_t last);
 
-    /// Whether a node was kept at a position.
-    bool keeps(std::uint16_t node, std::uint32_t position) const {
-        return position <= end_ && has(keptAt(position), node);
+    /// The nodes that were kept at a position, in ascending order.
+    std::span<const std::uint16_t> keptAt(std::uint32_t position) const {
+        const std::uint32_t* from = keptFrom_.data() + (position - from_);
+        return {kept_.data() + from[1], from[0] - from[1]};
     }
-    /// What was kept at a position, as bits by node, in words of which there are words().
-    const std::uint64_t* keptAt(std::uint32_t position) const {
-        return kept_.data() + (position - from_) * words_;
+    /// Which of all kept nodes, those of the last position first, is a node at a position; kNone for none.
+    std::uint32_t keptPlace(std::uint16_t node, std::uint32_t position) const {
+        if (position > end_) return kNone;
+        const std::span<const std::uint16_t> nodes = keptAt(position);
+        const auto found = std::lower_bound(nodes.begin(), nodes.end(), node);
+        if (found == nodes.end() || *found != node) return kNone;
+        return keptFrom_[position - from_ + 1] + static_cast<std::uint32_t>(found - nodes.begin());
     }
-    std::size_t words() const { return words_; }
     /// Nodes that the followed rule can come to have lower numbers.
     std::uint32_t nodes() const { return nodes_; }
     /// The branches of a Choice that are worth a look, as bits.
@@ -65,7 +67,7 @@ class Reach {
         return position == recovery_.place && call.arg == table_->recoverRule;
     }
     /// Nodes kept at all positions together.
-    std::size_t keptCount() const { return keptCount_; }
+    std::size_t keptCount() const { return kept_.size(); }
     std::size_t bytes() const;
     std::size_t capacity() const;
 
@@ -87,6 +89,7 @@ class Reach {
         open_.push_back(node);
     }
     void goOn(std::uint16_t from, std::uint16_t to) {
+        growSlowly(ways_);
         ways_.push_back({from, to});
         meet(to);
     }
@@ -96,9 +99,10 @@ class Reach {
     bool mayBeEmpty(const NodeRow& call) const;
     bool comesBack(std::uint16_t call, std::uint32_t position) const;
     void beginPosition();
-    bool leadsOn(std::uint16_t node, const std::uint64_t* row) const;
-    void keepNode(std::uint16_t node, std::uint64_t* row);
-    void keepAt(std::uint32_t position, std::uint64_t* row);
+    bool leadsOn(std::uint16_t node) const;
+    void keepNode(std::uint16_t node);
+    void keepAt(std::uint32_t position);
+    void noteKept(std::uint32_t here);
     template <typename Visit>
     void forEachCallMet(std::uint16_t rule, Visit visit) const;
 
@@ -124,9 +128,11 @@ class Reach {
     std::vector<std::uint32_t> endedAt_;     ///< by rule: where it ended last
     std::vector<std::uint16_t> endOf_;       ///< by rule: its End, once it was passed
 
-    std::vector<std::uint64_t> kept_;    ///< by position: nodes as bits
-    std::vector<std::uint8_t> returns_;  ///< by Call: something was kept behind it, further on
-    std::size_t keptCount_ = 0;
+    std::vector<std::uint16_t> kept_;  ///< nodes, those of the last position first
+    std::vector<std::uint32_t>
+        keptFrom_;  ///< by position, counted from 1; what one holds ends where that before it starts
+    std::vector<std::uint64_t> here_, next_;  ///< nodes kept at the position at hand and at the next, as bits
+    std::vector<std::uint8_t> returns_;       ///< by Call: something was kept behind it, further on
     // At the position at hand: the ways to a node, one behind the other.
     std::vector<std::uint32_t> wayTo_;      ///< by node
     std::vector<std::uint32_t> wayBefore_;  ///< by way
