@@ -21,6 +21,7 @@ void compile(const Inputs& inputs, const Output& output, std::ostream* report) {
         if (const auto found = vocabulary.numberOf.find(name); found != vocabulary.numberOf.end())
             program.opener = found->second;
     analyse(program, grammar, facts, vocabulary.maxNumber);
+    findBranches(program);
     numberNodes(program, facts, grammar);
     lookAhead(program);
     if (report)

@@ -240,8 +240,9 @@ class Emitter {
         const int openers = classSet(openersOf);
         const int recoverFollow = classSet(program_.recoverFollow);
 
-        std::vector<std::pair<std::size_t, std::size_t>> choices;
-        std::vector<int> targets;
+        std::vector<std::array<std::size_t, 4>> choices;
+        std::vector<std::array<std::size_t, 3>> branches;
+        std::vector<int> targets, paths;
         std::vector<std::uint32_t> masks;
         o << "const NodeRow nodes[] = {\n";
         for (const Node& n : program_.nodes) {
@@ -253,9 +254,13 @@ class Emitter {
             if (n.op == Op::Token && n.arg == program_.closer) op = "Hard";
             if (n.op == Op::Choice) {
                 arg = static_cast<int>(choices.size());
-                choices.emplace_back(targets.size(), n.targets.size());
+                choices.push_back({targets.size(), branches.size(), n.targets.size(), n.branches.size()});
                 targets.insert(targets.end(), n.targets.begin(), n.targets.end());
                 masks.insert(masks.end(), n.ahead.begin(), n.ahead.end());
+                for (const Branch& branch : n.branches) {
+                    branches.push_back({paths.size(), branch.path.size(), index(branch.stop)});
+                    paths.insert(paths.end(), branch.path.begin(), branch.path.end());
+                }
             }
             o << "    {Op::" << op << ", Mark::" << marks[static_cast<int>(n.mark)] << ", "
               << (n.behindCall ? 1 : 0) + (n.nonEmpty ? 2 : 0) << ", " << arg << ", "
@@ -269,10 +274,15 @@ class Emitter {
             o << "    {" << cString(parser_.rules[r].name) << ", " << program_.entry[r] << ", "
               << nullableOf[r] << "},\n";
         o << "};\n";
-        array(o, "ChoiceRow", "choices", choices,
-              [&](const auto& c) { o << "{" << c.first << ", " << c.second << "}"; });
+        array(o, "ChoiceRow", "choices", choices, [&](const auto& c) {
+            o << "{" << c[0] << ", " << c[1] << ", " << c[2] << ", " << c[3] << "}";
+        });
+        if (branches.size() > 0x10000)
+            throw GrammarError(parser_.rules[0].file, 0, "more than 65536 branches of choices");
+        array(o, "BranchRow", "branches", branches,
+              [&](const auto& b) { o << "{" << b[0] << ", " << b[1] << ", " << b[2] << "}"; });
+        array(o, "std::uint16_t", "paths", paths, [&](int t) { o << t; });
         array(o, "std::uint16_t", "targets", targets, [&](int t) { o << t; });
-        array(o, "std::uint16_t", "stopOf", targets, [&](int t) { o << program_.skip(t); });
         array(o, "std::uint32_t", "masks", masks, [&](std::uint32_t m) { o << m << "u"; });
         std::vector<std::uint32_t> rows;
         for (const auto& row : program_.lookahead) rows.insert(rows.end(), row.begin(), row.end());
@@ -290,9 +300,9 @@ class Emitter {
         const int left = std::max(number("LEFT_PAREN"), number("LEFT_PAREN_"));
         const int right = std::max(number("RIGHT_PAREN"), number("RIGHT_PAREN_"));
         o << "const ParserTable parser{kTableVersion, nodes, rules, " << parser_.rules.size() << ", choices, "
-          << choices.size() << ", targets, stopOf, masks, aheadRows, " << Program::kLookahead << ", classOf, "
-          << program_.classes << ", " << vocabulary_.maxNumber << ", classSets, " << firstBase << ", "
-          << openers << ", " << recoverFollow << ", guards, " << guards.size() << ", "
+          << choices.size() << ", targets, branches, paths, masks, aheadRows, " << Program::kLookahead
+          << ", classOf, " << program_.classes << ", " << vocabulary_.maxNumber << ", classSets, "
+          << firstBase << ", " << openers << ", " << recoverFollow << ", guards, " << guards.size() << ", "
           << std::max(program_.closer, 0) << ", " << parser_.start << ", " << parser_.statement << ", "
           << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule) << ", " << left << ", " << right << ", "
           << parser_.keepTail << ", " << program_.stops << ", " << program_.statementStops << "};\n\n";

@@ -30,8 +30,8 @@ class Lookahead {
     }
 
     void run() {
-        for (Node& n : p_.nodes)
-            if (n.op == Op::Choice) look(n);
+        for (int i = 0; i < p_.stops; ++i)
+            if (p_.nodes[index(i)].op == Op::Choice) look(p_.nodes[index(i)]);
     }
 
  private:
@@ -198,7 +198,7 @@ class Lookahead {
 
     void look(Node& n) {
         State state;
-        for (int t : n.targets) state.push_back(start(t));
+        for (const Branch& branch : n.branches) state.push_back(start(branch.stop));
         n.ahead.resize(index(p_.classes));
         for (int c = 0; c < p_.classes; ++c) n.ahead[index(c)] = decide(state, c, Program::kLookahead);
     }

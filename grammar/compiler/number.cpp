@@ -18,7 +18,7 @@ std::vector<int> withoutToken(const Program& p, const Facts& facts, int recoverR
         case Op::End:
             break;
         case Op::Choice:
-            for (int t : n.targets) to.push_back(p.skip(t));
+            for (const Branch& branch : n.branches) to.push_back(branch.stop);
             break;
         case Op::Call:
             to.push_back(p.skip(p.entry[index(n.arg)]));
@@ -92,7 +92,10 @@ void numberNodes(Program& p, const Facts& facts, const ParserGrammar& grammar) {
         if (used[index(node)]) continue;
         used[index(node)] = true;
         order.push_back(node);
-        open.push_back(p.nodes[index(node)].next);
+        // Choices that searches take together with one ahead of them stand here as well.
+        const Node& n = p.nodes[index(node)];
+        open.insert(open.end(), n.targets.begin(), n.targets.end());
+        if (n.next >= 0) open.push_back(n.next);
     }
     std::vector<int> numberOf(p.nodes.size(), -1);
     for (std::size_t i = 0; i < order.size(); ++i) numberOf[index(order[i])] = static_cast<int>(i);
@@ -106,8 +109,13 @@ void numberNodes(Program& p, const Facts& facts, const ParserGrammar& grammar) {
         renumber(nodes.back().next);
         renumber(nodes.back().run);
         for (int& t : nodes.back().targets) renumber(t);
+        for (Branch& branch : nodes.back().branches) {
+            renumber(branch.stop);
+            for (int& t : branch.path) renumber(t);
+        }
     }
     p.nodes = std::move(nodes);
+    for (std::size_t i = index(p.stops); i < p.nodes.size(); ++i) p.nodes[i].branches.clear();
     for (int& entry : p.entry) renumber(entry);
 }
 

@@ -38,12 +38,16 @@ void applyCloser(Program& program, int closer);
 /// FIRST sets, guards, token classes: everything the tables hold that follows from the nodes.
 void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts, int maxToken);
 
+/// Finds the branches of each choice, with those of choices that come right behind it. Of two that go on at
+/// one node the first stays.
+void findBranches(Program& program);
+
 /// Puts the nodes that a search stops at first, those of the statement in front, each behind those that can
 /// come after it without a token in between; those that only shape the tree follow. What nothing leads to
 /// goes.
 void numberNodes(Program& program, const Facts& facts, const ParserGrammar& grammar);
 
-/// Finds which targets of each choice fit by the tokens ahead.
+/// Finds which branches of each choice fit by the tokens ahead.
 void lookAhead(Program& program);
 
 /// Lexer: one automaton for the longest match over all rules, and one program a rule for single-rule calls.

@@ -24,6 +24,12 @@ enum class Op : std::uint8_t {
     End          ///< rule `arg` is done
 };
 
+/// One of the ways that a search can go on at a Choice.
+struct Branch {
+    int stop;               ///< the node where it goes on
+    std::vector<int> path;  ///< what the choices up to there go on at, one behind the other
+};
+
 struct Node {
     explicit Node(Op o) : op(o) {}
     Op op;
@@ -37,9 +43,10 @@ struct Node {
     bool behindCall = false;  ///< a call goes on here
     bool canEnd = false;
     std::set<int> first;
-    int guard = -1;     ///< Call: index into guards, or -1
-    int required = -1;  ///< Call: a token that must still come behind it, or -1
-    /// Choice, filled by lookAhead(), by class of the next token: the targets that fit as bits, or kMore and
+    int guard = -1;                ///< Call: index into guards, or -1
+    int required = -1;             ///< Call: a token that must still come behind it, or -1
+    std::vector<Branch> branches;  ///< Choice, filled by findBranches()
+    /// Choice, filled by lookAhead(), by class of the next token: the branches that fit as bits, or kMore and
     /// a row of Program::lookahead.
     std::vector<std::uint32_t> ahead;
 };

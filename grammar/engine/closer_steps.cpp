@@ -56,11 +56,12 @@ void settleSteps(const ParserTable& table, const Derivation& derivation, CloserR
                  std::uint32_t position, std::uint32_t exact, Cursor cursor, std::vector<Step>& steps) {
     const std::size_t base = steps.size();
     std::uint32_t low = position, high = position;
+    BranchPath path;
     for (;;) {
         const NodeRow& row = table.nodes[node];
         if (row.op == Op::End) break;
         if (row.op == Op::Choice) {
-            node = derivation.choices[cursor.choice++];
+            node = path.next(table, derivation, cursor.choice);
             continue;
         }
         Step step{node, low, high, 0, 0, 0};

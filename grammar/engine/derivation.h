@@ -3,6 +3,8 @@
 #include <cstdint>
 #include <vector>
 
+#include "grammar/engine/tables.h"
+
 /// How a derivation is written down: what a search leaves and the tree builder reads.
 namespace zr::engine {
 
@@ -21,7 +23,7 @@ struct Derivation {
         bool recovered;                ///< stands for tokens that were skipped where its rule didn't parse
     };
     std::uint16_t rule = 0;              ///< of the whole
-    std::vector<std::uint16_t> choices;  ///< the node that a Choice goes on at
+    std::vector<std::uint16_t> choices;  ///< the branch that is taken, see BranchRow
     std::vector<Part> parts;
 
     void start(std::uint16_t startRule, std::uint32_t position) {
@@ -36,6 +38,25 @@ struct Derivation {
         parts[part].choices = static_cast<std::uint32_t>(choices.size());
         parts[part].parts = static_cast<std::uint32_t>(parts.size());
     }
+};
+
+/// The targets that the choices of a branch go on at, one behind the other.
+class BranchPath {
+ public:
+    /// The target of the choice at hand: of the next in the branch at work, or of the first in another one,
+    /// which `choice` then counts.
+    std::uint16_t next(const ParserTable& table, const Derivation& derivation, std::uint32_t& choice) {
+        if (at_ == end_) {
+            const BranchRow& branch = table.branches[derivation.choices[choice++]];
+            at_ = table.paths + branch.path;
+            end_ = at_ + branch.length;
+        }
+        return *at_++;
+    }
+
+ private:
+    const std::uint16_t* at_ = nullptr;
+    const std::uint16_t* end_ = nullptr;
 };
 
 }  // namespace zr::engine

@@ -129,7 +129,7 @@ SetId FullSearch::setFor(std::uint16_t at, std::uint32_t p) {
             bool several = false;
             for (std::uint32_t mask = reach_.branches(node, p); mask != 0; mask &= mask - 1) {
                 const SetId set =
-                    here_[branchTarget(*table_, node, static_cast<std::uint32_t>(std::countr_zero(mask)))];
+                    here_[branchStop(*table_, node, static_cast<std::uint32_t>(std::countr_zero(mask)))];
                 if (set == kEmpty || set == first) continue;
                 if (first != kEmpty && !several) {
                     sets_.join(first);
@@ -243,17 +243,15 @@ bool FullSearch::walkOn(Walk& walk) {
             case Op::End:
                 return true;
             case Op::Choice: {
-                const ChoiceRow& choice = table_->choices[node.arg];
+                std::uint16_t branch = 0, stop = 0;
                 std::uint32_t mask = reach_.branches(node, walk.position);
-                std::uint16_t target = 0;
                 do {  // one of them leads on, or nobody had come here
-                    target = table_->targets[choice.firstTarget +
-                                             static_cast<std::uint32_t>(std::countr_zero(mask))];
+                    branch = branchOf(*table_, node, static_cast<std::uint32_t>(std::countr_zero(mask)));
+                    stop = table_->branches[branch].stop;
                     mask &= mask - 1;
-                } while (mask != 0 &&
-                         !leadsTo(setAt(searchedFrom(*table_, target), walk.position), walk.wanted));
-                made_->choices.push_back(target);
-                walk.node = searchedFrom(*table_, target);
+                } while (mask != 0 && !leadsTo(setAt(stop, walk.position), walk.wanted));
+                made_->choices.push_back(branch);
+                walk.node = stop;
                 break;
             }
             case Op::Call: {

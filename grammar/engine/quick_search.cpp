@@ -69,9 +69,9 @@ bool QuickSearch::follow() {
 }
 
 inline std::uint16_t QuickSearch::take(const NodeRow& choice, std::uint32_t branch) {
-    const std::uint32_t target = table_.choices[choice.arg].firstTarget + branch;
-    made_.choices.push_back(table_.targets[target]);
-    return table_.stopOf[target];
+    const std::uint16_t taken = branchOf(table_, choice, branch);
+    made_.choices.push_back(taken);
+    return table_.branches[taken].stop;
 }
 
 /// Back to the last choice that has a branch left.

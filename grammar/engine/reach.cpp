@@ -109,7 +109,7 @@ void Reach::pass(std::uint16_t at, std::uint32_t p) {
             break;
         case Op::Choice:
             for (std::uint32_t mask = branches(node, p); mask != 0; mask &= mask - 1)
-                goOn(at, branchTarget(*table_, node, static_cast<std::uint32_t>(std::countr_zero(mask))));
+                goOn(at, branchStop(*table_, node, static_cast<std::uint32_t>(std::countr_zero(mask))));
             break;
         case Op::Call:
             passCall(at, p);

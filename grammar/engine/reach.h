@@ -56,7 +56,7 @@ class Reach {
     std::uint32_t branches(const NodeRow& choice, std::uint32_t position) const {
         // The part that recovery replaces starts with none of its tokens: look at every way to it.
         if (position == recovery_.place)
-            return static_cast<std::uint32_t>((std::uint64_t{1} << table_->choices[choice.arg].count) - 1);
+            return static_cast<std::uint32_t>((std::uint64_t{1} << table_->choices[choice.arg].branches) - 1);
         // Nor need the tokens ahead of it be those that a reading goes on with.
         if (position < recovery_.place && recovery_.place - position < table_->tokensAhead)
             return text_->startable(choice, position);

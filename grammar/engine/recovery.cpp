@@ -40,8 +40,8 @@ class PlaceSeeker {
         switch (node.op) {
             case Op::Choice:
                 // The part that recovery replaces starts with none of its tokens: look at every way to it.
-                for (std::uint32_t i = 0; i < table_.choices[node.arg].count; ++i)
-                    meet(branchTarget(table_, node, i), p);
+                for (std::uint32_t i = 0; i < table_.choices[node.arg].branches; ++i)
+                    meet(branchStop(table_, node, i), p);
                 break;
             case Op::Soft:
             case Op::SoftStar:

@@ -94,8 +94,15 @@ struct RuleRow {
 };
 
 struct ChoiceRow {
-    std::uint32_t firstTarget;
-    std::uint16_t count;  ///< at most 31
+    std::uint32_t firstTarget, firstBranch;
+    std::uint16_t targets, branches;  ///< how many; at most 31 branches, and 65,536 of all choices
+};
+
+/// One of the ways that a search can go on at a Choice, through the choices right behind it.
+struct BranchRow {
+    std::uint32_t path;    ///< in ParserTable::paths: the target taken by each of these choices
+    std::uint16_t length;  ///< of the path
+    std::uint16_t stop;    ///< the node that a search stops at then
 };
 
 /// Class sets, see ParserTable::classSets.
@@ -111,12 +118,13 @@ struct ParserTable {
     const ChoiceRow* choices;
     std::uint32_t choiceCount;
     const std::uint16_t* targets;
-    const std::uint16_t* stopOf;  ///< by target: the node at or behind it that a search stops at
-    /// [choice * classes + class]: bit i set when target i can go on there, or kMoreTokens and a row of
+    const BranchRow* branches;
+    const std::uint16_t* paths;
+    /// [choice * classes + class]: bit i set when branch i can go on there, or kMoreTokens and a row of
     /// `aheadRows`.
     const std::uint32_t* choiceMask;
     /// [row * (classes + 1) + class]: the same by class of the token behind; the last entry of a row are the
-    /// targets that can go on whatever comes there. The end of the text decides.
+    /// branches that can go on whatever comes there. The end of the text decides.
     const std::uint32_t* aheadRows;
     std::uint32_t tokensAhead;    ///< so many tokens are looked at
     const std::uint8_t* classOf;  ///< by token number; 0 is end of file
@@ -149,9 +157,13 @@ inline std::uint16_t searchedFrom(const ParserTable& table, std::uint16_t node) 
     return shapes ? row.run : node;
 }
 
-/// Where a branch of a Choice goes on.
-inline std::uint16_t branchTarget(const ParserTable& table, const NodeRow& choice, std::uint32_t branch) {
-    return table.stopOf[table.choices[choice.arg].firstTarget + branch];
+/// Which of all branches a branch of a Choice is.
+inline std::uint16_t branchOf(const ParserTable& table, const NodeRow& choice, std::uint32_t branch) {
+    return static_cast<std::uint16_t>(table.choices[choice.arg].firstBranch + branch);
+}
+/// Where it goes on.
+inline std::uint16_t branchStop(const ParserTable& table, const NodeRow& choice, std::uint32_t branch) {
+    return table.branches[branchOf(table, choice, branch)].stop;
 }
 
 struct GrammarTable {

@@ -145,11 +145,12 @@ void TreeBuilder<Tree>::walk() {
     const NodeRow* const nodes = table_.nodes;
     std::uint16_t at = frame.node;
     std::uint32_t position = frame.at;
+    BranchPath path;
     for (;;) {
         const NodeRow& node = nodes[at];
         switch (node.op) {
             case Op::Choice:
-                at = derivation_.choices[cursor_.choice++];
+                at = path.next(table_, derivation_, cursor_.choice);
                 continue;
             case Op::Token:
             case Op::Set:

@@ -87,7 +87,7 @@ ReferenceRecogniser::Items ReferenceRecogniser::find(const Place& place) {
     switch (node.op) {
         case Op::Choice: {
             const engine::ChoiceRow& choice = table_.choices[node.arg];
-            for (std::uint32_t i = 0; i < choice.count; ++i)
+            for (std::uint32_t i = 0; i < choice.targets; ++i)
                 add(i, itemsFrom({table_.targets[choice.firstTarget + i], position, ofFirst}));
             break;
         }

@@ -77,7 +77,7 @@ std::uint64_t SentenceSource::lengthOf(std::uint16_t at) const {
         case Op::Choice: {
             std::uint64_t best = kNever;
             const engine::ChoiceRow& choice = table_.choices[node.arg];
-            for (std::uint32_t i = 0; i < choice.count; ++i)
+            for (std::uint32_t i = 0; i < choice.targets; ++i)
                 best = std::min(best, shortest_[table_.targets[choice.firstTarget + i]]);
             return best;
         }
@@ -101,7 +101,7 @@ void SentenceSource::measure() {
         const NodeRow& node = table_.nodes[at];
         if (node.op == Op::Choice) {
             const engine::ChoiceRow& choice = table_.choices[node.arg];
-            for (std::uint32_t i = 0; i < choice.count; ++i)
+            for (std::uint32_t i = 0; i < choice.targets; ++i)
                 work.push_back(table_.targets[choice.firstTarget + i]);
         } else if (node.op != Op::End) {
             work.push_back(node.next);
@@ -146,9 +146,9 @@ void SentenceSource::derive(std::uint16_t at, std::size_t size, std::vector<std:
                 const engine::ChoiceRow& choice = table_.choices[node.arg];
                 const std::uint16_t* targets = table_.targets + choice.firstTarget;
                 std::uint16_t shortest = targets[0];
-                for (std::uint32_t i = 1; i < choice.count; ++i)
+                for (std::uint32_t i = 1; i < choice.targets; ++i)
                     if (shortest_[targets[i]] < shortest_[shortest]) shortest = targets[i];
-                const std::uint16_t any = targets[number(choice.count)];
+                const std::uint16_t any = targets[number(choice.targets)];
                 // Most choices go the short way, or one rule would take all tokens there are.
                 at = out.size() >= size || shortest_[any] >= kNever || number(5) < 2 ? shortest : any;
                 continue;
