@@ -158,6 +158,11 @@ SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p) {
     const SetId all = here_[searchedFrom(*table_, table_->rules[call.arg].entry)];
     const EndsBehind::Word* behind = behind_.words(call.run);
     if (all == kEmpty || behind == nullptr) return kEmpty;
+    // One end is what plain text has.
+    if (sets_.size(all) == 1) {
+        const std::uint32_t end = sets_.last(all);
+        return end == p && (call.flags & kNonEmpty) ? kEmpty : setAt(call.run, end);
+    }
     // An end that takes no token counts for some calls and not for others.
     const bool mayBeEmpty = sets_.contains(all, p);
     const SetId ends = mayBeEmpty ? sets_.without(all, p) : all;
@@ -299,6 +304,7 @@ bool FullSearch::leadsTo(SetId set, const Wanted& wanted) const {
 /// The ends of a call that its walk can go on from.
 FullSearch::Wanted FullSearch::wantedBy(const Walk& walk, const NodeRow& call) {
     const SetId ends = endsOf(call.arg, walk.position);
+    if (sets_.size(ends) == 1) return {{sets_.last(ends)}, 1, kEmpty};
     const PositionSets::Range range = sets_.range(ends);
     const EndsBehind::Word* behind = behind_.words(call.run);
     const auto endsIn = [&](std::uint32_t word) {
