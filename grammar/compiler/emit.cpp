@@ -192,8 +192,6 @@ class Emitter {
         });
         if (lexerProgram_.classes > 255)
             throw GrammarError(lexer_.file, 0, "more than 255 character classes");
-        if (lexerProgram_.accept.size() >= 0xFFFF)
-            throw GrammarError(lexer_.file, 0, "too many lexer states");
         const auto& cls = lexerProgram_.unitClass;
         array(o, "std::uint8_t", "asciiClass", std::vector<int>(cls.begin(), cls.begin() + 128),
               [&](int c) { o << c; });

@@ -1,6 +1,7 @@
 #include <algorithm>
 #include <functional>
 #include <map>
+#include <string>
 
 #include "grammar/compiler/error.h"
 #include "grammar/compiler/passes.h"
@@ -9,6 +10,10 @@ namespace zr::gc {
 namespace {
 
 constexpr int kUnits = 0x10000;
+
+/// Sets of instructions can be without number, and a state must fit 16 bits; a lexer as people write it has a
+/// tenth of these.
+constexpr std::size_t kMostStates = 10000;
 
 class LexerBuilder {
  public:
@@ -186,6 +191,8 @@ class LexerBuilder {
             close(set);
             const auto [found, fresh] = known.emplace(set, static_cast<int>(sets.size()));
             if (fresh) sets.push_back(std::move(set));
+            if (sets.size() > kMostStates)
+                throw GrammarError(grammar_.file, 0, "more than " + std::to_string(kMostStates) + " lexer states");
             return found->second;
         };
         state(std::move(start));
