@@ -125,7 +125,7 @@ void guardCalls(Program& p, const Facts& facts) {
         n.required = best;
         const Node& after = p.nodes[index(n.run)];
         if (after.canEnd || facts.nullable[index(n.arg)] || after.first.size() > kSelective) continue;
-        Guard guard{after.first, facts.last[index(n.arg)], facts.outside[index(n.arg)]};
+        Guard guard{after.first, facts.last[index(n.arg)], facts.outside[index(n.arg)], n.arg, {}};
         const auto found = std::find(p.guards.begin(), p.guards.end(), guard);
         n.guard = static_cast<int>(found - p.guards.begin());
         if (found == p.guards.end()) p.guards.push_back(std::move(guard));
@@ -207,6 +207,7 @@ void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts,
                 program.recoverFollow.insert(first.begin(), first.end());
             }
     tokenClasses(program, facts, maxToken);
+    lastPairs(program, facts);
 }
 
 }  // namespace zr::gc

@@ -216,11 +216,14 @@ class Emitter {
     }
 
     int classSet(const std::set<int>& tokens) {
+        std::set<int> classes;
+        for (int t : tokens) classes.insert(program_.classOf[index(t)]);
+        return setOfClasses(classes);
+    }
+
+    int setOfClasses(const std::set<int>& classes) {
         std::array<std::uint64_t, 4> words{};
-        for (int t : tokens) {
-            const int c = program_.classOf[index(t)];
-            words[index(c / 64)] |= std::uint64_t{1} << (c % 64);
-        }
+        for (int c : classes) words[index(c / 64)] |= std::uint64_t{1} << (c % 64);
         classSets_.push_back(words);
         return static_cast<int>(classSets_.size()) - 1;
     }
@@ -233,8 +236,16 @@ class Emitter {
         const auto firstBase = classSets_.size();
         for (const auto& s : firstOfRules) classSet(s);
         std::vector<std::array<int, 3>> guards;
-        for (const Guard& g : program_.guards)
+        std::vector<int> before;
+        std::map<std::set<int>, int> setOfBefore;
+        for (const Guard& g : program_.guards) {
             guards.push_back({classSet(g.follow), classSet(g.last), classSet(g.outside)});
+            for (const auto& classes : g.before) {
+                const auto [found, fresh] = setOfBefore.emplace(classes, 0xFFFF);
+                if (fresh && !classes.empty()) found->second = setOfClasses(classes);
+                before.push_back(found->second);
+            }
+        }
         const int openers = classSet(openersOf);
         const int recoverFollow = classSet(program_.recoverFollow);
 
@@ -289,6 +300,7 @@ class Emitter {
         std::vector<std::uint64_t> words;
         for (const auto& s : classSets_) words.insert(words.end(), s.begin(), s.end());
         array(o, "std::uint64_t", "classSets", words, [&](std::uint64_t w) { o << w << "u"; });
+        array(o, "std::uint16_t", "guardBefore", before, [&](int set) { o << set; });
         array(o, "GuardRow", "guards", guards,
               [&](const auto& g) { o << "{" << g[0] << ", " << g[1] << ", " << g[2] << "}"; });
         const auto number = [&](const char* name) {
@@ -300,10 +312,11 @@ class Emitter {
         o << "const ParserTable parser{kTableVersion, nodes, rules, " << parser_.rules.size() << ", choices, "
           << choices.size() << ", targets, branches, paths, masks, aheadRows, " << Program::kLookahead
           << ", classOf, " << program_.classes << ", " << vocabulary_.maxNumber << ", classSets, "
-          << firstBase << ", " << openers << ", " << recoverFollow << ", guards, " << guards.size() << ", "
-          << std::max(program_.closer, 0) << ", " << parser_.start << ", " << parser_.statement << ", "
-          << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule) << ", " << left << ", " << right << ", "
-          << parser_.keepTail << ", " << program_.stops << ", " << program_.statementStops << "};\n\n";
+          << firstBase << ", " << openers << ", " << recoverFollow << ", guards, " << guards.size()
+          << ", guardBefore, " << std::max(program_.closer, 0) << ", " << parser_.start << ", "
+          << parser_.statement << ", " << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule) << ", "
+          << left << ", " << right << ", " << parser_.keepTail << ", " << program_.stops << ", "
+          << program_.statementStops << "};\n\n";
     }
 
     void contexts(std::ostream& o) const {

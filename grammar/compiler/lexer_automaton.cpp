@@ -11,9 +11,9 @@ namespace {
 
 constexpr int kUnits = 0x10000;
 
-/// Sets of instructions can be without number, and a state must fit 16 bits; a lexer as people write it has a
-/// tenth of these.
-constexpr std::size_t kMostStates = 10000;
+/// Sets of instructions can be without number, and a state must fit 16 bits; the lexers here have
+/// some thousand.
+constexpr std::size_t kMostStates = 4000;
 
 class LexerBuilder {
  public:
@@ -192,7 +192,8 @@ class LexerBuilder {
             const auto [found, fresh] = known.emplace(set, static_cast<int>(sets.size()));
             if (fresh) sets.push_back(std::move(set));
             if (sets.size() > kMostStates)
-                throw GrammarError(grammar_.file, 0, "more than " + std::to_string(kMostStates) + " lexer states");
+                throw GrammarError(grammar_.file, 0,
+                                   "more than " + std::to_string(kMostStates) + " lexer states");
             return found->second;
         };
         state(std::move(start));

@@ -1,6 +1,9 @@
 #include <algorithm>
+#include <bitset>
+#include <cstddef>
 #include <map>
-#include <set>
+#include <unordered_map>
+#include <unordered_set>
 #include <utility>
 
 #include "grammar/compiler/passes.h"
@@ -38,19 +41,17 @@ class Lookahead {
     /// A node in front of a token, with the nodes that the calls around it go on at, innermost first.
     using Configuration = std::pair<int, int>;
     using Configurations = std::vector<Configuration>;
-    static constexpr int kDead = 0, kAnything = 1, kNoStack = 0;
+    using Classes = std::bitset<256>;
+    static constexpr int kDead = 0, kAnything = 1, kNoStack = 0, kUnknown = -1;
 
     void tokens() {
         takes_.resize(p_.nodes.size());
         for (std::size_t i = 0; i < p_.nodes.size(); ++i) {
             const Node& n = p_.nodes[i];
-            std::set<int> classes;
             if (n.op == Op::Token || n.op == Op::Soft || n.op == Op::SoftStar)
-                classes.insert(p_.classOf[index(n.arg)]);
+                takes_[i].set(index(p_.classOf[index(n.arg)]));
             if (n.op == Op::Set)
-                for (int t : p_.sets[index(n.arg)]) classes.insert(p_.classOf[index(t)]);
-            takes_[i].assign(index(p_.classes), false);
-            for (int c : classes) takes_[i][index(c)] = true;
+                for (int t : p_.sets[index(n.arg)]) takes_[i].set(index(p_.classOf[index(t)]));
         }
     }
 
@@ -61,8 +62,21 @@ class Lookahead {
         return found->second;
     }
 
+    struct Hash {
+        std::size_t operator()(const Configuration& each) const {
+            return static_cast<std::size_t>(each.first) * 0x9E3779B97F4A7C15u +
+                   static_cast<std::size_t>(each.second);
+        }
+        std::size_t operator()(const Configurations& all) const {
+            std::size_t hash = all.size();
+            for (const Configuration& each : all) hash = hash * 31 + operator()(each);
+            return hash;
+        }
+    };
+    using Met = std::unordered_set<Configuration, Hash>;
+
     /// Adds what can be come to from a node without a token; false where the rule of the choice can end.
-    bool close(int node, int stack, std::set<Configuration>& met, Configurations& made) {
+    bool close(int node, int stack, Met& met, Configurations& made) {
         std::vector<Configuration> open{{node, stack}};
         while (!open.empty()) {
             auto [at, behind] = open.back();
@@ -107,7 +121,7 @@ class Lookahead {
     }
 
     int start(int node) {
-        std::set<Configuration> met;
+        Met met;
         Configurations made;
         return close(node, kNoStack, met, made) ? intern(std::move(made)) : kAnything;
     }
@@ -115,9 +129,10 @@ class Lookahead {
     /// The configurations behind a token of class `c`.
     int step(int set, int c) {
         if (set <= kAnything) return set;
-        const auto known = steps_.find({set, c});
-        if (known != steps_.end()) return known->second;
-        std::set<Configuration> met;
+        if (steps_.size() < sets_.size())
+            steps_.resize(sets_.size(), std::vector<int>(index(p_.classes), kUnknown));
+        if (steps_[index(set)][index(c)] != kUnknown) return steps_[index(set)][index(c)];
+        Met met;
         Configurations made;
         bool ends = false;
         const Configurations from = sets_[index(set)];
@@ -130,7 +145,7 @@ class Lookahead {
             }
         }
         const int found = ends ? kAnything : intern(std::move(made));
-        steps_[{set, c}] = found;
+        steps_[index(set)][index(c)] = found;
         return found;
     }
 
@@ -155,16 +170,22 @@ class Lookahead {
         return size;
     }
 
-    /// The alternatives that can take a token of class `c`.
-    std::uint32_t fits(const State& state, int c) const {
-        std::uint32_t mask = 0;
-        for (std::size_t i = 0; i < state.size(); ++i) {
-            const Configurations& set = sets_[index(state[i])];
-            if (state[i] == kAnything || std::any_of(set.begin(), set.end(), [&](const Configuration& each) {
-                    return takes_[index(each.first)][index(c)];
-                }))
-                mask |= std::uint32_t{1} << i;
+    /// The classes of tokens that some configuration of a set takes.
+    const Classes& taken(int set) {
+        while (taken_.size() < sets_.size()) {
+            Classes classes;
+            for (const Configuration& each : sets_[taken_.size()]) classes |= takes_[index(each.first)];
+            if (taken_.size() == kAnything) classes.set();
+            taken_.push_back(classes);
         }
+        return taken_[index(set)];
+    }
+
+    /// The alternatives that can take a token of class `c`.
+    std::uint32_t fits(const State& state, int c) {
+        std::uint32_t mask = 0;
+        for (std::size_t i = 0; i < state.size(); ++i)
+            if (taken(state[i])[index(c)]) mask |= std::uint32_t{1} << i;
         return mask;
     }
 
@@ -204,12 +225,13 @@ class Lookahead {
     }
 
     Program& p_;
-    std::vector<std::vector<bool>> takes_;
+    std::vector<Classes> takes_;  ///< by node
+    std::vector<Classes> taken_;  ///< by set
     std::vector<std::pair<int, int>> stacks_;
-    std::map<std::pair<int, int>, int> stackOf_;
+    std::unordered_map<Configuration, int, Hash> stackOf_;
     std::vector<Configurations> sets_;
-    std::map<Configurations, int> setOf_;
-    std::map<std::pair<int, int>, int> steps_;
+    std::unordered_map<Configurations, int, Hash> setOf_;
+    std::vector<std::vector<int>> steps_;  ///< by set and class
     std::map<std::pair<State, int>, std::uint32_t> decided_;
     std::map<std::vector<std::uint32_t>, int> rowOf_;
 };

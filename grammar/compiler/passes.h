@@ -42,6 +42,9 @@ void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts,
 /// one node the first stays.
 void findBranches(Program& program);
 
+/// Finds what can stand in front of the last token of what a guard waits for the end of.
+void lastPairs(Program& program, const Facts& facts);
+
 /// Puts the nodes that a search stops at first, those of the statement in front, each behind those that can
 /// come after it without a token in between; those that only shape the tree follow. What nothing leads to
 /// goes.

@@ -55,6 +55,10 @@ struct Node {
 /// `last`, before anything outside `outside`.
 struct Guard {
     std::set<int> follow, last, outside;
+    int rule;  ///< the one that is called
+    /// By class of the last token, filled by lastPairs(): the classes of those that can stand in front of it;
+    /// none for any.
+    std::vector<std::set<int>> before;
     bool operator==(const Guard&) const = default;
 };
 

@@ -137,6 +137,9 @@ struct ParserTable {
     std::uint32_t recoverFollowSet;
     const GuardRow* guards;
     std::uint32_t guardCount;
+    /// [guard * classes + class of the last token]: class set of what can stand in front of it, kNone16 for
+    /// anything.
+    const std::uint16_t* guardBefore;
     std::uint16_t closer;  ///< token number or 0
     std::uint16_t startRule, statementRule;
     std::uint16_t recoverRule;            ///< rule or kNone16

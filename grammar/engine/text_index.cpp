@@ -42,31 +42,33 @@ bool TextIndex::mayComeBehind(std::uint16_t number, std::uint32_t position) {
     const GuardRow& guard = table_->guards[number];
     Guarded& known = guards_[number];
     if (known.last == kNone)
-        for (known.last = count_ - 1; known.last != 0 && !isCandidate(guard, known.last);) --known.last;
+        for (known.last = count_ - 1; known.last != 0 && !isCandidate(number, known.last);) --known.last;
     if (known.last <= position) return false;
     if (known.index == kNone) {
         const std::uint32_t end = std::min(count_, position + kFewTokens);
         for (std::uint32_t i = position; i < end; ++i) {
-            if (inSet(table_->openerSet, classes_[i]) || (i > position && isCandidate(guard, i))) return true;
+            if (inSet(table_->openerSet, classes_[i]) || (i > position && isCandidate(number, i)))
+                return true;
             if (!inSet(guard.outside, classes_[i]))
                 return i + 1 < count_ && inSet(table_->openerSet, classes_[i + 1]);
         }
         known.index = static_cast<std::uint32_t>(guardIndexes_.size());
-        guardIndexes_.push_back(indexOf(guard));
+        guardIndexes_.push_back(indexOf(number));
     }
     const GuardIndex& index = guardIndexes_[known.index];
     const std::uint32_t barrier = index.barriers[position];
     return index.candidates[position + 1] <= barrier || nextOpener_[position] <= barrier + 1;
 }
 
-TextIndex::GuardIndex TextIndex::indexOf(const GuardRow& guard) {
+TextIndex::GuardIndex TextIndex::indexOf(std::uint16_t number) {
+    const GuardRow& guard = table_->guards[number];
     GuardIndex known;
     known.candidates.resize(count_ + 1);
     known.barriers.resize(count_ + 1);
     known.candidates[count_] = kNone;
     known.barriers[count_] = count_;
     for (std::uint32_t i = count_; i-- > 0;) {
-        known.candidates[i] = i > 0 && isCandidate(guard, i) ? i : known.candidates[i + 1];
+        known.candidates[i] = i > 0 && isCandidate(number, i) ? i : known.candidates[i + 1];
         known.barriers[i] = inSet(guard.outside, classes_[i]) ? known.barriers[i + 1] : i;
     }
     if (!nextOpener_.empty()) return known;

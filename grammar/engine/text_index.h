@@ -125,10 +125,16 @@ class TextIndex {
 
     void index();
     bool mayComeBehind(std::uint16_t guard, std::uint32_t position);
-    bool isCandidate(const GuardRow& guard, std::uint32_t position) const {
-        return inSet(guard.follow, classes_[position]) && inSet(guard.last, classes_[position - 1]);
+    /// Whether what a guard waits for can come at a position: such a token, behind what can be the last two
+    /// of the call.
+    bool isCandidate(std::uint16_t number, std::uint32_t position) const {
+        const GuardRow& guard = table_->guards[number];
+        if (!inSet(guard.follow, classes_[position]) || !inSet(guard.last, classes_[position - 1]))
+            return false;
+        const std::uint16_t before = table_->guardBefore[number * table_->classes + classes_[position - 1]];
+        return before == kNone16 || (position > 1 && inSet(before, classes_[position - 2]));
     }
-    GuardIndex indexOf(const GuardRow& guard);
+    GuardIndex indexOf(std::uint16_t number);
 
     const ParserTable* table_;
     const std::vector<std::uint16_t>* types_;
