@@ -26,9 +26,8 @@ constexpr std::size_t kFewConfigurations = 40;
 class Lookahead {
  public:
     explicit Lookahead(Program& program) : p_(program) {
-        stacks_.push_back({-1, -1});
-        sets_.push_back({});  // kDead
-        sets_.push_back({});  // kAnything
+        stacks_.emplace_back(-1, -1);
+        sets_.resize(2);  // kDead and kAnything
         tokens();
     }
 
@@ -58,7 +57,7 @@ class Lookahead {
     int push(int node, int stack) {
         const auto [found, fresh] =
             stackOf_.emplace(std::pair(node, stack), static_cast<int>(stacks_.size()));
-        if (fresh) stacks_.push_back({node, stack});
+        if (fresh) stacks_.emplace_back(node, stack);
         return found->second;
     }
 
@@ -197,6 +196,7 @@ class Lookahead {
         const auto known = decided_.find({state, left});
         if (known != decided_.end()) return known->second;
         std::vector<std::uint32_t> row;
+        row.reserve(index(p_.classes) + 1);
         const bool last = left == 1 || sizeOf(state) > kFewConfigurations;
         for (int c = 0; c < p_.classes; ++c) row.push_back(last ? fits(state, c) : decide(state, c, left));
         const bool same = std::all_of(row.begin(), row.end(), [&](std::uint32_t m) { return m == mask; });
