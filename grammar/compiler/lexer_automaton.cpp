@@ -14,6 +14,8 @@ constexpr int kUnits = 0x10000;
 /// Sets of instructions can be without number, and a state must fit 16 bits; the lexers here have
 /// some thousand.
 constexpr std::size_t kMostStates = 4000;
+/// Instructions in all these sets.
+constexpr std::size_t kMostHeld = 1000000;
 
 class LexerBuilder {
  public:
@@ -187,10 +189,16 @@ class LexerBuilder {
         }
         std::map<std::vector<int>, int> known;
         std::vector<std::vector<int>> sets;
+        std::size_t held = 0;
         const auto state = [&](std::vector<int> set) {
             close(set);
             const auto [found, fresh] = known.emplace(set, static_cast<int>(sets.size()));
-            if (fresh) sets.push_back(std::move(set));
+            if (fresh) {
+                held += set.size();
+                sets.push_back(std::move(set));
+            }
+            if (held > kMostHeld)
+                throw GrammarError(grammar_.file, 0, "the lexer's states take too much memory");
             if (sets.size() > kMostStates)
                 throw GrammarError(grammar_.file, 0,
                                    "more than " + std::to_string(kMostStates) + " lexer states");
