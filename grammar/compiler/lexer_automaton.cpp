@@ -198,7 +198,9 @@ class LexerBuilder {
                 sets.push_back(std::move(set));
             }
             if (held > kMostHeld)
-                throw GrammarError(grammar_.file, 0, "the lexer's states take too much memory");
+                throw GrammarError(
+                    grammar_.file, 0,
+                    "more than " + std::to_string(kMostHeld) + " instructions in lexer states");
             if (sets.size() > kMostStates)
                 throw GrammarError(grammar_.file, 0,
                                    "more than " + std::to_string(kMostStates) + " lexer states");

@@ -134,7 +134,7 @@ class Lookahead {
         Met met;
         Configurations made;
         bool ends = false;
-        const Configurations from = sets_[index(set)];
+        const Configurations& from = sets_[index(set)];
         for (const auto& [node, stack] : from) {
             if (!takes_[index(node)][index(c)]) continue;
             const Node& n = p_.nodes[index(node)];

@@ -73,7 +73,7 @@ struct Program {
     std::vector<std::vector<std::uint32_t>> lookahead;
     static constexpr std::uint32_t kMore = 0x80000000u;
     static constexpr std::size_t kTargets = 31;  ///< of a Choice at most, one bit each beside kMore
-    static constexpr int kLookahead = 4;
+    static constexpr int kLookahead = 4;         ///< tokens that decide at a Choice at most
     int closer = -1;
     int opener = -1;  ///< the left parenthesis
     std::set<int> recoverFollow;

@@ -31,11 +31,4 @@ struct Options {
 /// builder and the nodes that it joins have half of a tree's each.
 constexpr std::size_t kSpareBytes = std::size_t{32} << 20;
 
-/// Makes room for one more. What a text needs is mostly guessed well, so half as much again is enough, where
-/// a vector would take twice as much.
-template <typename Vector>
-void growSlowly(Vector& vector) {
-    if (vector.size() == vector.capacity()) vector.reserve(vector.size() + vector.size() / 2 + 8);
-}
-
 }  // namespace zr::engine

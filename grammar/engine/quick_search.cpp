@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <bit>
 
+#include "grammar/engine/grow.h"
+
 namespace zr::engine {
 
 QuickSearch::Outcome QuickSearch::run(std::uint16_t rule, std::uint32_t position) {

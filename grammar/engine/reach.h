@@ -5,7 +5,7 @@
 #include <span>
 #include <vector>
 
-#include "grammar/engine/options.h"
+#include "grammar/engine/grow.h"
 #include "grammar/engine/tables.h"
 #include "grammar/engine/text_index.h"
 

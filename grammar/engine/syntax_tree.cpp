@@ -1,6 +1,7 @@
 #include "grammar/engine/syntax_tree.h"
 
 #include "grammar/engine/diagnostics.h"
+#include "grammar/engine/grow.h"
 #include "grammar/engine/reports.h"
 #include "grammar/engine/rule_reading.h"
 
@@ -12,7 +13,7 @@ class SyntaxTreeGrowth {
     using Node = std::uint32_t;
 
     explicit SyntaxTreeGrowth(const LexedText& text) : text_(text) {
-        constexpr std::size_t kNodesOfToken = 2;
+        constexpr std::size_t kNodesOfToken = 2;  // what is guessed too high stays unused
         nodes_.swap(spare());
         nodes_.clear();
         if (nodes_.capacity() == 0) nodes_.reserve(kNodesOfToken * text.seenCount() + 8);
