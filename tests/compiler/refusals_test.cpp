@@ -104,19 +104,33 @@ TEST_P(Refusal, NamesFileAndLine) {
 INSTANTIATE_TEST_SUITE_P(Cases, Refusal, testing::ValuesIn(refusedCases()),
                          [](const auto& name) { return name.param; });
 
-TEST(GrammarCompiler, TakesAHundredGroupsInsideEachOther) {
-    OutputFolder out("groups");
+/// The good grammar with another body of its rule "tail".
+Outcome runWithTail(const std::string& body) {
+    OutputFolder out("tail");
     std::string grammar = contentOf(kCases / "good" / "toy.grammar");
-    const std::string body = "tail : STAR ;";
-    const std::size_t at = grammar.find(body);
-    ASSERT_NE(at, std::string::npos);
-    grammar.replace(at, body.size(),
-                    "tail : " + std::string(100, '(') + "STAR" + std::string(100, ')') + " ;");
+    const std::string old = "tail : STAR ;";
+    const std::size_t at = grammar.find(old);
+    EXPECT_NE(at, std::string::npos);
+    grammar.replace(at, old.size(), "tail : " + body + " ;");
     const fs::path file = out.path() / "toy.grammar";
     std::ofstream(file, std::ios::binary) << grammar;
     const fs::path good = kCases / "good";
-    const Outcome outcome = run("--tokens " + quoted(good / "toy.tokens") + "--lexer " +
-                                quoted(good / "toy.lexer") + quoted(file) + out.arguments());
+    return run("--tokens " + quoted(good / "toy.tokens") + "--lexer " + quoted(good / "toy.lexer") +
+               quoted(file) + out.arguments());
+}
+
+TEST(GrammarCompiler, TakesAHundredGroupsInsideEachOther) {
+    const Outcome outcome = runWithTail(std::string(100, '(') + "STAR" + std::string(100, ')'));
+    EXPECT_EQ(outcome.status, 0) << outcome.said;
+}
+
+TEST(GrammarCompiler, TakesMoreAlternativesThanAChoiceHasBranches) {
+    std::string body = "STAR";
+    for (int stars = 2; stars <= 100; ++stars) {
+        body += " |";
+        for (int i = 0; i < stars; ++i) body += " STAR";
+    }
+    const Outcome outcome = runWithTail(body);
     EXPECT_EQ(outcome.status, 0) << outcome.said;
 }
 
