@@ -189,6 +189,13 @@ class Report(unittest.TestCase):
         self.browser.wait_until(f"document.getElementById('{anchor}').open")
         self.assertIn("customers", self.shown_names())
 
+    def test_what_was_opened_behind_a_search_stays(self):
+        self.search("by_city" + webdriver.ENTER)
+        self.run_script("location.hash = arguments[0]", self.anchor("customers"))
+        self.browser.wait_until(f"document.getElementById('{self.anchor('customers')}').open")
+        time.sleep(0.4)  # longer than the page waits for more keys
+        self.assertIn("customers", self.shown_names())
+
     def test_keys_alone_are_enough(self):
         for stop in ("skip", "search", "next", "theme"):
             self.browser.press(webdriver.TAB)

@@ -96,7 +96,9 @@ const nameOf = object => object.querySelector('summary b').textContent.toLowerCa
 const search = byId('search');
 let hits = [];
 let hitAt = -1;
+let timer = 0;
 function find() {
+  clearTimeout(timer);  // a search that comes late would hide what was opened since
   const wanted = search.value.trim().toLowerCase();
   hits = [];
   hitAt = -1;
@@ -109,7 +111,6 @@ function find() {
   }
   byId('found').textContent = wanted === '' ? '' : hits.length + ' found';
 }
-let timer = 0;
 search.addEventListener('input', () => { clearTimeout(timer); timer = setTimeout(find, 150); });
 search.addEventListener('keydown', event => {
   if (event.key !== 'Enter' || search.value.trim() === '') return;
