@@ -16,7 +16,7 @@ int softToken(const Program& p, int index) {
     const Node& node = at(p, index);
     if (node.op != Op::Choice || node.targets.size() != 2) return -1;
     const Node& body = at(p, node.targets[0]);
-    if (body.op != Op::Token || body.mark == Mark::Root) return -1;
+    if (body.op != Op::Token || body.mark == Mark::Root || body.ownSpan) return -1;
     const bool isLoop = body.next == index && body.mark == Mark::Drop;
     return body.next == node.targets[1] || isLoop ? body.arg : -1;
 }

@@ -272,7 +272,7 @@ class Emitter {
                 }
             }
             o << "    {Op::" << op << ", Mark::" << marks[static_cast<int>(n.mark)] << ", "
-              << (n.behindCall ? 1 : 0) + (n.nonEmpty ? 2 : 0) << ", " << arg << ", "
+              << (n.behindCall ? 1 : 0) + (n.nonEmpty ? 2 : 0) + (n.ownSpan ? 4 : 0) << ", " << arg << ", "
               << (n.next < 0 ? 0xFFFF : n.next) << ", " << (n.run < 0 ? 0xFFFF : n.run) << ", "
               << (n.guard < 0 ? 0xFFFF : n.guard) << ", "
               << (n.required < 0 ? 0 : program_.classOf[index(n.required)] + 1) << "},\n";

@@ -16,7 +16,7 @@ class Lowering {
  public:
     /// `calledOnce` are inlined whatever their size.
     Lowering(const ParserGrammar& grammar, const Facts& facts, const std::set<int>& calledOnce)
-        : grammar_(grammar), facts_(facts) {
+        : grammar_(grammar), facts_(facts), scopeNeeds_(scopeNeeds(grammar)) {
         chooseInlined();
         for (int rule : calledOnce) inlined_[static_cast<std::size_t>(rule)] = true;
     }
@@ -31,7 +31,7 @@ class Lowering {
                 program_.entry[i] = end;
                 continue;
             }
-            program_.entry[i] = body(grammar_.rules[i].alternatives, end, Mark::None);
+            program_.entry[i] = body(grammar_.rules[i].alternatives, end, Mark::None, false);
         }
         return std::move(program_);
     }
@@ -151,8 +151,8 @@ class Lowering {
     }
 
     /// Alternatives that lead to `next`. `outer` is a mark of the group around them: it holds for what is
-    /// inside.
-    int body(const std::vector<Alternative>& alternatives, int next, Mark outer) {
+    /// inside. With `ownSpan` they are the tree of a rule without a scope.
+    int body(const std::vector<Alternative>& alternatives, int next, Mark outer, bool ownSpan) {
         if (alternatives.size() > 1) {
             std::set<int> tokens;
             const bool plain =
@@ -165,7 +165,7 @@ class Lowering {
                 });
             if (plain) {
                 const Mark own = alternatives[0].elements[0].mark;
-                return tokenNode(tokens, own != Mark::None ? own : outer, next);
+                return tokenNode(tokens, own != Mark::None ? own : outer, next, ownSpan);
             }
         }
         std::vector<int> targets;
@@ -176,7 +176,9 @@ class Lowering {
                 node(at).arg = a.root;
                 node(at).next = next;
             }
-            for (auto e = a.elements.rbegin(); e != a.elements.rend(); ++e) at = element(*e, at, outer);
+            const bool alone = a.elements.size() == 1;
+            for (auto e = a.elements.rbegin(); e != a.elements.rend(); ++e)
+                at = element(*e, at, outer, ownSpan && alone);
             targets.push_back(at);
         }
         if (targets.size() == 1) return targets[0];
@@ -195,30 +197,33 @@ class Lowering {
         return at;
     }
 
-    int element(const Element& e, int next, Mark outer) {
+    int element(const Element& e, int next, Mark outer, bool ownSpan) {
         switch (e.repeat) {
             case Repeat::Once:
-                return once(e, next, outer, false);
+                return once(e, next, outer, false, ownSpan);
             case Repeat::Optional:
-                return choice({once(e, next, outer, true), next});
+                return choice({once(e, next, outer, true, false), next});
             case Repeat::Star:
             case Repeat::Plus:
                 break;
         }
         const int loop = add(Node(Op::Choice));
-        const int round = once(e, loop, outer, true);
+        const int round = once(e, loop, outer, true, false);
         node(loop).targets = {round, next};
         return e.repeat == Repeat::Star ? loop : round;
     }
 
-    int once(const Element& e, int next, Mark outer, bool nonEmpty) {
+    int once(const Element& e, int next, Mark outer, bool nonEmpty, bool ownSpan) {
         const Mark mark = e.mark != Mark::None ? e.mark : outer;
-        if (e.kind == Element::Kind::Tokens) return tokenNode(e.tokens, mark, next);
-        if (e.kind == Element::Kind::Group) return body(e.alternatives, next, mark);
+        if (e.kind == Element::Kind::Tokens) return tokenNode(e.tokens, mark, next, ownSpan);
+        if (e.kind == Element::Kind::Group) return body(e.alternatives, next, mark, ownSpan);
         if (inlined_[static_cast<std::size_t>(e.ruleIndex)]) {
+            const ScopeNeed need = scopeNeeds_[static_cast<std::size_t>(e.ruleIndex)];
+            if (need == ScopeNeed::Never || (need == ScopeNeed::Marked && mark == Mark::None))
+                return body(rule(e.ruleIndex).alternatives, next, mark, true);
             const int end = add(Node(Op::ScopeEnd));
             node(end).next = next;
-            const int inner = body(rule(e.ruleIndex).alternatives, end, Mark::None);
+            const int inner = body(rule(e.ruleIndex).alternatives, end, Mark::None, false);
             const int begin = add(Node(Op::ScopeBegin));
             node(begin).mark = mark;
             node(begin).next = inner;
@@ -232,11 +237,12 @@ class Lowering {
         return call;
     }
 
-    int tokenNode(const std::set<int>& tokens, Mark mark, int next) {
+    int tokenNode(const std::set<int>& tokens, Mark mark, int next, bool ownSpan) {
         const int at = add(Node(tokens.size() == 1 ? Op::Token : Op::Set));
         node(at).arg = tokens.size() == 1 ? *tokens.begin() : set(tokens);
         node(at).mark = mark;
         node(at).next = next;
+        node(at).ownSpan = ownSpan;
         return at;
     }
 
@@ -244,6 +250,7 @@ class Lowering {
 
     const ParserGrammar& grammar_;
     const Facts& facts_;
+    const std::vector<ScopeNeed> scopeNeeds_;
     Program program_;
     std::vector<int> size_;
     std::vector<bool> inlined_;

@@ -25,6 +25,15 @@ struct Facts {
 };
 Facts collectFacts(const ParserGrammar& grammar);
 
+/// Where an inlined rule needs a scope for its tree.
+enum class ScopeNeed : std::uint8_t {
+    Never,   ///< it is one token, which can carry the mark of whoever calls the rule
+    Marked,  ///< only where it is called with a mark
+    Always
+};
+/// By rule.
+std::vector<ScopeNeed> scopeNeeds(const ParserGrammar& grammar);
+
 /// Lowers the rules to one program of nodes; see program.h.
 Program lower(const ParserGrammar& grammar, const Facts& facts);
 

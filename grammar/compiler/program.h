@@ -36,6 +36,7 @@ struct Node {
     Mark mark = Mark::None;
     int arg = 0;
     bool nonEmpty = false;  ///< Call: only results that take a token count
+    bool ownSpan = false;   ///< Token, Set: is the whole tree of a rule and notes its span
     int next = -1;
     std::vector<int> targets;  ///< Choice
     // filled by analyse()

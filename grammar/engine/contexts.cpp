@@ -98,7 +98,9 @@ class RuntimeTree {
                                                      tokenAt(to > from ? to - 1 : from),
                                                      recogniser->state->exception));
     }
-    void adopt(Node root, Node child) { adaptor_->addChild(adaptor_, root, child); }
+    void adopt(Node root, const Node* children, std::uint32_t count) {
+        for (std::uint32_t i = 0; i < count; ++i) adaptor_->addChild(adaptor_, root, children[i]);
+    }
     void bound(Node node, std::uint32_t from, std::uint32_t to) {
         adaptor_->setTokenBoundaries(adaptor_, node, tokens_.list[from], tokens_.list[to - 1]);
     }

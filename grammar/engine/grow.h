@@ -1,5 +1,7 @@
 #pragma once
 
+#include <cstddef>
+
 namespace zr::engine {
 
 /// Makes room for one more. What a text needs is mostly guessed well, so half as much again is enough, where
@@ -7,6 +9,13 @@ namespace zr::engine {
 template <typename Vector>
 void growSlowly(Vector& vector) {
     if (vector.size() == vector.capacity()) vector.reserve(vector.size() + vector.size() / 2 + 8);
+}
+
+/// The same for several more.
+template <typename Vector>
+void growSlowly(Vector& vector, std::size_t more) {
+    const std::size_t wanted = vector.size() + more;
+    if (wanted > vector.capacity()) vector.reserve(wanted + vector.size() / 2 + 8);
 }
 
 }  // namespace zr::engine

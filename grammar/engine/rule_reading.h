@@ -75,8 +75,7 @@ RuleTree<typename Tree::Node> readRule(const GrammarTable& grammar, const std::v
     }
     // One root stands for itself, several go under a list.
     typename Tree::Node root = roots.size() == 1 ? roots[0] : tree.list();
-    if (roots.size() != 1)
-        for (const auto each : roots) tree.adopt(root, each);
+    if (roots.size() != 1) tree.adopt(root, roots.data(), static_cast<std::uint32_t>(roots.size()));
     if (end != 0) tree.bound(root, 0, end);
     return {root, false, end};
 }

@@ -7,7 +7,7 @@
 /// engine never runs tables of another layout.
 namespace zr::engine {
 
-constexpr std::uint32_t kTableVersion = 8;
+constexpr std::uint32_t kTableVersion = 9;
 
 constexpr std::uint16_t kNone16 = 0xFFFF;
 
@@ -85,6 +85,7 @@ struct NodeRow {
 enum NodeFlags : std::uint8_t {
     kBehindCall = 1,  ///< a Call goes on here
     kNonEmpty = 2,    ///< Call: only results that take a token count
+    kOwnSpan = 4,     ///< Token, Set: notes its span, as the whole tree of a rule does
 };
 
 struct RuleRow {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <vector>
@@ -14,12 +15,17 @@ namespace zr::engine {
 
 /// `Tree` makes the nodes, the runtime's or the engine's own:
 ///
-///     Tree::Node                              a node, or the absence of one
+///     Tree::Node                              a node, or the absence of one; cheap to copy
 ///     token(position)                         a node for a token
 ///     imaginary(type)                         a node for none
 ///     error(from, to)                         what stands for tokens that were skipped
-///     adopt(root, child)                      adds a last child
+///     adopt(root, children, count)            gives a root its children, all of them; these don't change
+///                                             any more
 ///     bound(node, from, to)                   notes the tokens from one position up to another
+///
+/// A node gets its children once it can't get any more: until then they stand behind it among the values. That
+/// costs each node one step for each rule that hands its tree on as a root (`rule^`) with all that hangs on it,
+/// so a rule that did so within itself would cost the square of its depth.
 template <class Tree>
 class TreeBuilder {
  public:
@@ -43,43 +49,53 @@ class TreeBuilder {
     std::vector<Node>& build();
 
  private:
-    /// A part that is being walked. As long as every place in it is one position, it is followed as it
-    /// stands; where places become intervals, the rest of it is settled first.
-    struct Frame {
-        std::uint16_t node;  ///< where it goes on; kNone16 once its steps are settled
-        std::uint32_t at;    ///< position there
-        std::uint32_t end;   ///< where the part ends
-        std::uint32_t part;
-        std::uint32_t nextStep, stepsBase;
+    /// A rule at work, called or inlined, and its tree so far: the values from `base` on. Once it has a root,
+    /// that is the first of them and the others are the root's children.
+    struct Scope {
+        std::uint32_t base;
+        std::uint32_t start;   ///< first token
+        std::uint32_t part;    ///< of a call: what is called; else kInlined
+        std::uint32_t end;     ///< of a call: where that ends
+        std::uint16_t behind;  ///< of a call: where its caller goes on; kNone16 along settled steps
+        Mark mark;
+        bool rooted;
     };
 
-    struct Scope {
-        Mark mark;
-        bool rooted;          ///< the first value is a root: what comes behind it are its children
-        std::uint32_t base;   ///< first value of this scope
-        std::uint32_t start;  ///< first token
+    static constexpr std::uint32_t kInlined = 0xFFFFFFFF;
+
+    /// A part is followed as it stands as long as every place in it is one position. Where places become
+    /// intervals, the rest of it is settled first and followed step by step.
+    struct Settled {
+        std::uint32_t nextStep, firstStep;
+        std::uint32_t part, end;
+    };
+
+    /// Where the builder stands; at `kNone16` it follows the steps settled last.
+    struct Place {
+        std::uint16_t node;
+        std::uint32_t position;
     };
 
     /// What grows with a text; a thread keeps that of its last tree for the next one.
     struct Work {
-        std::vector<Frame> frames;
         std::vector<Step> steps;
+        std::vector<Settled> settled;
         std::vector<Scope> scopes;
         std::vector<Node> values;
 
         std::size_t bytes() const {
-            return frames.capacity() * sizeof(Frame) + steps.capacity() * sizeof(Step) +
+            return steps.capacity() * sizeof(Step) + settled.capacity() * sizeof(Settled) +
                    scopes.capacity() * sizeof(Scope) + values.capacity() * sizeof(Node);
         }
         void clear() {
-            frames.clear();
             steps.clear();
+            settled.clear();
             scopes.clear();
             values.clear();
         }
         void swap(Work& other) {
-            frames.swap(other.frames);
             steps.swap(other.steps);
+            settled.swap(other.settled);
             scopes.swap(other.scopes);
             values.swap(other.values);
         }
@@ -89,23 +105,35 @@ class TreeBuilder {
         return mine;
     }
 
-    void open(std::uint32_t part, std::uint16_t rule, std::uint32_t end);
-    void walk();
-    void walkSettled();
-    void settle();
-    void call(const NodeRow& node, std::uint32_t from, std::uint32_t to);
+    Place follow(Place place);
+    Place followSettled();
+    Place settle(Place place);
+    Place enter(const NodeRow& call, std::uint32_t from, std::uint32_t to, std::uint16_t behind);
     bool isCloserAt(std::uint32_t position) const {
         return position < types_.size() && types_[position] == table_.closer;
     }
 
-    void token(const NodeRow& node, std::uint32_t at);
-    void root(const NodeRow& node) {
-        if (dropped_ == 0) becomeRoot(work_.scopes.back(), valueCount(), tree_.imaginary(node.arg));
+    void token(const NodeRow& node, std::uint32_t at) {
+        if (node.mark == Mark::Drop || dropped_ != 0) return;
+        work_.values.push_back(tree_.token(at));
+        if (node.flags & kOwnSpan) tree_.bound(work_.values.back(), at, at + 1);
+        if (node.mark == Mark::Root) becomeRoot(valueCount() - 1);
     }
-    void openScope(Mark mark, std::uint32_t at);
+    void root(const NodeRow& node) {
+        if (dropped_ != 0) return;
+        work_.values.push_back(tree_.imaginary(node.arg));
+        becomeRoot(valueCount() - 1);
+    }
+    void openScope(Mark mark, std::uint32_t at) {
+        if (mark == Mark::Drop) ++dropped_;
+        work_.scopes.push_back({valueCount(), at, kInlined, 0, 0, mark, false});
+    }
     void closeScope(std::uint32_t at);
-    void adoptAll(Node root, std::uint32_t base, std::uint32_t end);
-    void becomeRoot(Scope& scope, std::uint32_t end, Node root);
+    void closeShapedScope(std::uint32_t at);
+    void becomeRoot(std::uint32_t from);
+    void adopt(std::uint32_t root, std::uint32_t end) {
+        tree_.adopt(work_.values[root], work_.values.data() + root + 1, end - root - 1);
+    }
     std::uint32_t valueCount() const { return static_cast<std::uint32_t>(work_.values.size()); }
 
     const ParserTable& table_;
@@ -114,40 +142,26 @@ class TreeBuilder {
     Tree& tree_;
     CloserRun run_;
     Work work_;
-    Cursor cursor_{0, 0};
+    Cursor cursor_{0, 1};
     std::uint32_t dropped_ = 0;  ///< scopes at work whose tree is left out
 };
 
 template <class Tree>
 std::vector<typename Tree::Node>& TreeBuilder<Tree>::build() {
     const Derivation::Part& whole = derivation_.parts[0];
-    cursor_ = {0, 1};
-    openScope(Mark::None, whole.position);
-    open(0, derivation_.rule, whole.high);
-    while (!work_.frames.empty()) {
-        if (work_.frames.back().node == kNone16)
-            walkSettled();
-        else
-            walk();
-    }
+    work_.scopes.push_back({0, whole.position, 0, whole.high, kNone16, Mark::None, false});
+    Place place{table_.rules[derivation_.rule].entry, whole.position};
+    while (!work_.scopes.empty()) place = place.node == kNone16 ? followSettled() : follow(place);
     return work_.values;
 }
 
+/// Follows parts as they stand until one has to be settled, a settled one goes on or the whole has ended.
 template <class Tree>
-void TreeBuilder<Tree>::open(std::uint32_t part, std::uint16_t rule, std::uint32_t end) {
-    work_.frames.push_back({table_.rules[rule].entry, derivation_.parts[part].position, end, part, 0, 0});
-}
-
-/// Goes on with the part opened last until it has ended or opened another one.
-template <class Tree>
-void TreeBuilder<Tree>::walk() {
-    Frame& frame = work_.frames.back();
-    const NodeRow* const nodes = table_.nodes;
-    std::uint16_t at = frame.node;
-    std::uint32_t position = frame.at;
+typename TreeBuilder<Tree>::Place TreeBuilder<Tree>::follow(Place place) {
+    auto [at, position] = place;
     BranchPath path;
     for (;;) {
-        const NodeRow& node = nodes[at];
+        const NodeRow& node = table_.nodes[at];
         switch (node.op) {
             case Op::Choice:
                 at = path.next(table_, derivation_, cursor_.choice);
@@ -168,43 +182,45 @@ void TreeBuilder<Tree>::walk() {
             case Op::Soft:
             case Op::SoftStar:
             case Op::Hard:
-                if (!isCloserAt(position)) break;
-                frame.node = at;
-                frame.at = position;
-                return settle();
+                if (isCloserAt(position)) return settle({at, position});
+                break;
             case Op::Call: {
                 const Derivation::Part& part = derivation_.parts[cursor_.part];
-                if (part.low != part.high) {
-                    frame.node = at;
-                    frame.at = position;
-                    return settle();
-                }
-                frame.node = node.next;
-                frame.at = part.high;
-                return call(node, position, part.high);
+                if (part.low != part.high) return settle({at, position});
+                const Place next = enter(node, position, part.high, node.next);
+                at = next.node;
+                position = next.position;
+                continue;
             }
-            case Op::End:
-                work_.frames.pop_back();
-                return closeScope(position);
+            case Op::End: {
+                const std::uint16_t behind = work_.scopes.back().behind;
+                closeScope(position);
+                if (behind == kNone16) return {kNone16, position};
+                at = behind;
+                continue;
+            }
         }
         at = node.next;
     }
 }
 
+/// Settles what is left of the part at work.
 template <class Tree>
-void TreeBuilder<Tree>::settle() {
-    Frame& frame = work_.frames.back();
-    frame.stepsBase = frame.nextStep = static_cast<std::uint32_t>(work_.steps.size());
-    settleSteps(table_, derivation_, run_, frame.node, frame.at, frame.end, cursor_, work_.steps);
-    frame.node = kNone16;
+typename TreeBuilder<Tree>::Place TreeBuilder<Tree>::settle(Place place) {
+    auto call = work_.scopes.rbegin();
+    while (call->part == kInlined) ++call;
+    const auto first = static_cast<std::uint32_t>(work_.steps.size());
+    work_.settled.push_back({first, first, call->part, call->end});
+    settleSteps(table_, derivation_, run_, place.node, place.position, call->end, cursor_, work_.steps);
+    return {kNone16, place.position};
 }
 
-/// The same as walk() along settled steps.
+/// The same as follow() along the steps settled last, until one of them calls a rule or they are over.
 template <class Tree>
-void TreeBuilder<Tree>::walkSettled() {
-    Frame& frame = work_.frames.back();
-    while (frame.nextStep < work_.steps.size()) {
-        const Step& step = work_.steps[frame.nextStep++];
+typename TreeBuilder<Tree>::Place TreeBuilder<Tree>::followSettled() {
+    Settled& settled = work_.settled.back();
+    while (settled.nextStep < work_.steps.size()) {
+        const Step& step = work_.steps[settled.nextStep++];
         const NodeRow& node = table_.nodes[step.node];
         switch (node.op) {
             case Op::Token:
@@ -226,84 +242,76 @@ void TreeBuilder<Tree>::walkSettled() {
                 break;
             case Op::Call:
                 cursor_ = {step.choice, step.part};
-                return call(node, step.at, step.high);
+                return enter(node, step.at, step.high, kNone16);
             default:
                 break;
         }
     }
-    const std::uint32_t end = frame.end;
-    cursor_ = {derivation_.parts[frame.part].choices, derivation_.parts[frame.part].parts};
-    work_.steps.resize(frame.stepsBase);
-    work_.frames.pop_back();
+    const std::uint32_t end = settled.end;
+    cursor_ = {derivation_.parts[settled.part].choices, derivation_.parts[settled.part].parts};
+    work_.steps.resize(settled.firstStep);
+    work_.settled.pop_back();
+    const std::uint16_t behind = work_.scopes.back().behind;
     closeScope(end);
+    return {behind, end};
 }
 
-/// Enters the part that comes next.
+/// Enters the part that comes next, which `call` calls.
 template <class Tree>
-void TreeBuilder<Tree>::call(const NodeRow& node, std::uint32_t from, std::uint32_t to) {
+typename TreeBuilder<Tree>::Place TreeBuilder<Tree>::enter(const NodeRow& call, std::uint32_t from,
+                                                           std::uint32_t to, std::uint16_t behind) {
     const std::uint32_t part = cursor_.part++;
-    openScope(node.mark, from);
-    if (!derivation_.parts[part].recovered) return open(part, node.arg, to);
-    work_.values.push_back(tree_.error(from, to));
-    closeScope(from);
+    openScope(call.mark, from);
+    if (derivation_.parts[part].recovered) {
+        work_.values.push_back(tree_.error(from, to));
+        closeScope(from);
+        return {behind, to};
+    }
+    Scope& scope = work_.scopes.back();
+    scope.part = part;
+    scope.end = to;
+    scope.behind = behind;
+    return {table_.rules[call.arg].entry, from};
 }
 
 template <class Tree>
-void TreeBuilder<Tree>::token(const NodeRow& node, std::uint32_t at) {
-    if (node.mark == Mark::Drop || dropped_ != 0) return;
-    const Node made = tree_.token(at);
-    if (node.mark == Mark::Root)
-        becomeRoot(work_.scopes.back(), valueCount(), made);
-    else
-        work_.values.push_back(made);
+inline void TreeBuilder<Tree>::closeScope(std::uint32_t at) {
+    const Scope& scope = work_.scopes.back();
+    if (scope.rooted || scope.mark != Mark::None) return closeShapedScope(at);
+    if (valueCount() == scope.base + 1 && at > scope.start)
+        tree_.bound(work_.values.back(), scope.start, at);
+    work_.scopes.pop_back();
 }
 
+/// The same where the scope has a root or a mark.
 template <class Tree>
-void TreeBuilder<Tree>::openScope(Mark mark, std::uint32_t at) {
-    if (mark == Mark::Drop) ++dropped_;
-    work_.scopes.push_back({mark, false, valueCount(), at});
-}
-
-template <class Tree>
-void TreeBuilder<Tree>::closeScope(std::uint32_t at) {
+void TreeBuilder<Tree>::closeShapedScope(std::uint32_t at) {
     const Scope scope = work_.scopes.back();
     work_.scopes.pop_back();
-    std::vector<Node>& values = work_.values;
-    std::uint32_t end = valueCount();
-    if (scope.rooted && end > scope.base + 1) {
-        adoptAll(values[scope.base], scope.base + 1, end);
-        end = scope.base + 1;
-        values.resize(end);
+    const std::uint32_t end = valueCount();
+    if (scope.rooted && scope.mark != Mark::Root && end > scope.base + 1) {
+        adopt(scope.base, end);
+        work_.values.resize(scope.base + 1);
     }
-    if (end == scope.base + 1 && at > scope.start) tree_.bound(values.back(), scope.start, at);
-    if (scope.mark == Mark::None) return;
-    if (scope.mark == Mark::Drop) {
-        --dropped_;
-    } else if (scope.mark == Mark::Root && end > scope.base) {
-        // The rule's tree becomes the root of what the scope around it has built so far.
-        const Node root = values[scope.base];
-        adoptAll(root, scope.base + 1, end);
-        values.resize(scope.base);
-        becomeRoot(work_.scopes.back(), scope.base, root);
-    }
+    const bool isOne = scope.rooted || end == scope.base + 1;
+    if (isOne && at > scope.start) tree_.bound(work_.values[scope.base], scope.start, at);
+    if (scope.mark == Mark::Drop) --dropped_;
+    // The rule's tree becomes the root of what the scope around it has built so far.
+    if (scope.mark == Mark::Root && end > scope.base) becomeRoot(scope.base);
 }
 
+/// Makes a value and those behind it the root of the innermost scope and its first children.
 template <class Tree>
-void TreeBuilder<Tree>::adoptAll(Node root, std::uint32_t base, std::uint32_t end) {
-    for (std::uint32_t i = base; i < end; ++i) tree_.adopt(root, work_.values[i]);
-}
-
-/// `root` becomes the root of the scope's values up to `end`; values behind `end` must be gone already.
-template <class Tree>
-void TreeBuilder<Tree>::becomeRoot(Scope& scope, std::uint32_t end, Node root) {
+void TreeBuilder<Tree>::becomeRoot(std::uint32_t from) {
+    Scope& scope = work_.scopes.back();
     std::vector<Node>& values = work_.values;
-    if (scope.rooted) {
-        adoptAll(values[scope.base], scope.base + 1, end);
-        end = scope.base + 1;
+    const auto base = values.begin() + scope.base;
+    if (scope.rooted && from > scope.base + 1) {
+        adopt(scope.base, from);
+        values.erase(base + 1, values.begin() + from);
+        from = scope.base + 1;
     }
-    adoptAll(root, scope.base, end);
-    values.resize(scope.base);
-    values.push_back(root);
+    std::rotate(base, values.begin() + from, values.end());
     scope.rooted = true;
 }
 
