@@ -106,6 +106,12 @@ std::vector<TokenBits> requiredTokens(const Program& p) {
     return must;
 }
 
+/// Whether what must follow a call is worth asking for: it must follow, and few tokens are it.
+bool isGuarded(const Program& p, const Facts& facts, const Node& call) {
+    const Node& after = p.nodes[index(call.run)];
+    return !after.canEnd && !facts.nullable[index(call.arg)] && after.first.size() <= kSelective;
+}
+
 void guardCalls(Program& p, const Facts& facts) {
     const std::vector<TokenBits> must = requiredTokens(p);
     std::map<int, int> uses;  // how often the program takes a token: rare ones make the better question
@@ -123,9 +129,9 @@ void guardCalls(Program& p, const Facts& facts) {
                 (best < 0 || uses[static_cast<int>(t)] < uses[best]))
                 best = static_cast<int>(t);
         n.required = best;
-        const Node& after = p.nodes[index(n.run)];
-        if (after.canEnd || facts.nullable[index(n.arg)] || after.first.size() > kSelective) continue;
-        Guard guard{after.first, facts.last[index(n.arg)], facts.outside[index(n.arg)], n.arg, {}};
+        if (!isGuarded(p, facts, n)) continue;
+        Guard guard{
+            p.nodes[index(n.run)].first, facts.last[index(n.arg)], facts.outside[index(n.arg)], n.arg, {}};
         const auto found = std::find(p.guards.begin(), p.guards.end(), guard);
         n.guard = static_cast<int>(found - p.guards.begin());
         if (found == p.guards.end()) p.guards.push_back(std::move(guard));
@@ -191,6 +197,14 @@ void checkIsland(const ParserGrammar& grammar, const Facts& facts) {
 }
 
 }  // namespace
+
+std::vector<bool> guardedCalls(Program program, const Facts& facts) {
+    firstSets(program, facts);
+    runLinks(program);
+    std::vector<bool> guarded;
+    for (const Node& n : program.nodes) guarded.push_back(n.op == Op::Call && isGuarded(program, facts, n));
+    return guarded;
+}
 
 void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts, int maxToken) {
     if (index(maxToken) >= kMaxTokens)

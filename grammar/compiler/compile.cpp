@@ -14,6 +14,7 @@ void compile(const Inputs& inputs, const Output& output, std::ostream* report) {
     resolve(grammar);
     const Facts facts = collectFacts(grammar);
     Program program = lower(grammar, facts);
+    inlineCalls(program, grammar, facts);
     std::string why;
     const int closer = findCloser(grammar, facts, program, why);
     if (closer >= 0) applyCloser(program, closer);

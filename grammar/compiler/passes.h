@@ -37,12 +37,18 @@ std::vector<ScopeNeed> scopeNeeds(const ParserGrammar& grammar);
 /// Lowers the rules to one program of nodes; see program.h.
 Program lower(const ParserGrammar& grammar, const Facts& facts);
 
+/// Puts small rules in the place of calls that ask for nothing behind them.
+void inlineCalls(Program& program, const ParserGrammar& grammar, const Facts& facts);
+
 /// The token whose optional, dropped occurrences may be taken as a run (see docs/recogniser.md), or -1 when
 /// the grammar doesn't allow it. Fills the reason why not.
 int findCloser(const ParserGrammar& grammar, const Facts& facts, const Program& program, std::string& why);
 
 /// Turns plain optional nodes of the closer into Soft nodes.
 void applyCloser(Program& program, int closer);
+
+/// By node: whether it is a Call that asks for what must follow it.
+std::vector<bool> guardedCalls(Program program, const Facts& facts);
 
 /// FIRST sets, guards, token classes: everything the tables hold that follows from the nodes.
 void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts, int maxToken);

@@ -20,8 +20,7 @@ bool isSingle(const Alternative& a) {
 
 class Scopes {
  public:
-    explicit Scopes(const ParserGrammar& grammar)
-        : least_(grammar.rules.size(), 0) {
+    explicit Scopes(const ParserGrammar& grammar) : least_(grammar.rules.size(), 0) {
         for (bool changed = true; changed;) {
             changed = false;
             for (std::size_t i = 0; i < least_.size(); ++i) {

@@ -23,9 +23,9 @@ namespace zr::engine {
 ///                                             any more
 ///     bound(node, from, to)                   notes the tokens from one position up to another
 ///
-/// A node gets its children once it can't get any more: until then they stand behind it among the values. That
-/// costs each node one step for each rule that hands its tree on as a root (`rule^`) with all that hangs on it,
-/// so a rule that did so within itself would cost the square of its depth.
+/// A node gets its children once it can't get any more: until then they stand behind it among the values.
+/// That costs each node one step for each rule that hands its tree on as a root (`rule^`) with all that hangs
+/// on it, so a rule that did so within itself would cost the square of its depth.
 template <class Tree>
 class TreeBuilder {
  public:
@@ -278,8 +278,7 @@ template <class Tree>
 inline void TreeBuilder<Tree>::closeScope(std::uint32_t at) {
     const Scope& scope = work_.scopes.back();
     if (scope.rooted || scope.mark != Mark::None) return closeShapedScope(at);
-    if (valueCount() == scope.base + 1 && at > scope.start)
-        tree_.bound(work_.values.back(), scope.start, at);
+    if (valueCount() == scope.base + 1 && at > scope.start) tree_.bound(work_.values.back(), scope.start, at);
     work_.scopes.pop_back();
 }
 
