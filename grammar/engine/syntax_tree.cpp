@@ -1,5 +1,7 @@
 #include "grammar/engine/syntax_tree.h"
 
+#include <utility>
+
 #include "grammar/engine/diagnostics.h"
 #include "grammar/engine/grow.h"
 #include "grammar/engine/reports.h"
@@ -13,15 +15,10 @@ class SyntaxTreeGrowth {
     using Node = SyntaxTree::Node;
 
     explicit SyntaxTreeGrowth(const LexedText& text) : text_(text) {
-        nodes_.swap(spare());
+        // Most texts have one to two nodes for a token.
+        nodes_.reserve(text.seenCount() * std::size_t{7} / 4 + 8);
         nodes_.resize(1);  // the place of the root
     }
-    ~SyntaxTreeGrowth() {
-        if (nodes_.capacity() > spare().capacity() && nodes_.capacity() * sizeof(Node) <= kSpareBytes / 2)
-            nodes_.swap(spare());
-    }
-    SyntaxTreeGrowth(const SyntaxTreeGrowth&) = delete;
-    SyntaxTreeGrowth& operator=(const SyntaxTreeGrowth&) = delete;
 
     Node token(std::uint32_t position) const {
         return make(SyntaxTree::Kind::Token, text_.types()[position], text_.indexOf(position));
@@ -44,18 +41,13 @@ class SyntaxTreeGrowth {
         node.last = text_.indexOf(to - 1);
     }
 
-    /// All nodes of the tree.
+    /// All nodes of the tree; no more can be made then.
     std::vector<Node> whole(const Node& root) {
         nodes_[SyntaxTree::root()] = root;
-        return {nodes_.begin(), nodes_.end()};
+        return std::move(nodes_);
     }
 
  private:
-    /// The nodes of a thread's last tree, kept for its next one.
-    static std::vector<Node>& spare() {
-        static thread_local std::vector<Node> mine;
-        return mine;
-    }
     static Node make(SyntaxTree::Kind kind, std::uint16_t type, std::uint32_t token) {
         return {token, 0, 0, 0, 0, type, kind};
     }
