@@ -18,4 +18,10 @@ void growSlowly(Vector& vector, std::size_t more) {
     if (wanted > vector.capacity()) vector.reserve(wanted + vector.size() / 2 + 8);
 }
 
+/// Gives back what a vector holds; assigning an empty list would keep its memory.
+template <typename Vector>
+void giveBack(Vector& vector) {
+    Vector().swap(vector);
+}
+
 }  // namespace zr::engine

@@ -4,6 +4,7 @@
 #include <string_view>
 #include <vector>
 
+#include "grammar/engine/grow.h"
 #include "grammar/engine/options.h"
 #include "grammar/engine/tables.h"
 
@@ -42,7 +43,7 @@ class LexedText {
     /// Which of all tokens the one at a parser's position is.
     std::uint32_t indexOf(std::uint32_t position) const { return hasHidden_ ? seen_[position] : position; }
     /// Gives back the memory of what only a parser asks.
-    void dropTypes() { types_ = {}; }
+    void dropTypes() { giveBack(types_); }
 
  private:
     void read(const Options& options);

@@ -46,6 +46,9 @@ class Recogniser {
     /// What was found last.
     const Derivation& derivation() const { return work_->derivation; }
 
+    /// Gives back what only a search needs. Nothing can be run from here on; the derivation stays.
+    void finish() { text_.release(); }
+
     /// Work done so far, in search steps; a benchmark figure.
     std::uint64_t steps() const { return steps_; }
     /// What the last search had to remember, as Options::maxMemo counts it.

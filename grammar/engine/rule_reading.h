@@ -28,6 +28,7 @@ class RuleDerivation {
             recogniser_.emplace(table, types, options);
             result_ = recogniser_->recover(wanted, 0);
         }
+        recogniser_->finish();
         if (result_.overBudget) zr::diagnose(u"the search for the furthest reading was cut short");
     }
 

@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <cstddef>
 
+#include "grammar/engine/grow.h"
+
 namespace zr::engine {
 
 TextIndex::TextIndex(const ParserTable& table, const std::vector<std::uint16_t>& types)
@@ -13,6 +15,15 @@ TextIndex::TextIndex(const ParserTable& table, const std::vector<std::uint16_t>&
 void TextIndex::cutAt(std::uint32_t count) {
     count_ = count;
     index();
+}
+
+void TextIndex::release() {
+    giveBack(classes_);
+    giveBack(runEnd_);
+    giveBack(lastOf_);
+    giveBack(guards_);
+    giveBack(guardIndexes_);
+    giveBack(nextOpener_);
 }
 
 void TextIndex::index() {

@@ -20,6 +20,9 @@ class TextIndex {
     /// Takes the text to end at `count`, for all questions from here on.
     void cutAt(std::uint32_t count);
 
+    /// Gives back what was made to answer; nothing can be asked from here on.
+    void release();
+
     std::uint32_t count() const { return count_; }
     std::uint32_t fullCount() const { return static_cast<std::uint32_t>(types_->size()); }
     std::uint16_t type(std::uint32_t position) const { return (*types_)[position]; }
