@@ -8,6 +8,8 @@ namespace {
 
 /// So many of 64 positions are many.
 constexpr std::uint32_t kManyEnds = 2;
+/// A derivation is completed inside so many calls at most: the ends of each of them are looked at.
+constexpr std::size_t kManyCalls = 64;
 /// Ends over fewer words than this are looked at one by one.
 constexpr std::uint32_t kFarWords = 4;
 
@@ -55,6 +57,22 @@ FullSearch::Outcome FullSearch::run(const ParserTable& table, TextIndex& text, c
         return writeDown(rule, position);
     }
     return Outcome::NotFound;
+}
+
+FullSearch::Outcome FullSearch::complete(const ParserTable& table, TextIndex& text, const Options& options,
+                                         const Place& from, Derivation& derivation) {
+    start(table, text, options, {}, &derivation);
+    inside_.clear();
+    for (std::uint32_t part = from.part; part != 0; part = derivation.parts[part].outer)
+        inside_.push_back({derivation.parts[part].node, derivation.parts[part].position});
+    if (inside_.size() > kManyCalls) return Outcome::NotFound;
+    if (!reach_.goOn(derivation.rule, from.node, from.position, inside_, kMemoBytes * options.maxMemo))
+        return Outcome::OverBudget;
+    reached_ = text.count();
+    if (reach_.ends().empty() || reach_.ends().back() != reached_) return Outcome::NotFound;
+    reach_.keep(reached_, reached_);
+    if (!findSets(from.position, reached_)) return Outcome::OverBudget;
+    return setOut(from) ? walkDown() : Outcome::NotFound;
 }
 
 std::vector<std::uint32_t> FullSearch::allEnds(const ParserTable& table, TextIndex& text,
@@ -141,7 +159,9 @@ SetId FullSearch::setFor(std::uint16_t at, std::uint32_t p) {
             return several ? sets_.joined(first) : first;
         }
         case Op::Call:
-            return isSkipped(node, p) ? setAt(node.run, recovery_.to) : setBehind(node, p);
+            return isSkipped(node, p)
+                       ? setAt(node.run, recovery_.to)
+                       : setBehind(node, p, here_[searchedFrom(*table_, table_->rules[node.arg].entry)]);
         case Op::End:
             return sets_.single(p);
         default:
@@ -154,8 +174,8 @@ bool FullSearch::isSkipped(const NodeRow& call, std::uint32_t p) const {
     return reach_.mayRecover(call, p) && endsOf(call.arg, p) == kEmpty;
 }
 
-SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p) {
-    const SetId all = here_[searchedFrom(*table_, table_->rules[call.arg].entry)];
+/// What lies behind a call at a position whose rule has the ends `all`.
+SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p, SetId all) {
     const EndsBehind::Word* behind = behind_.words(call.run);
     if (all == kEmpty || behind == nullptr) return kEmpty;
     // One end is what plain text has.
@@ -164,7 +184,7 @@ SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p) {
         return end == p && (call.flags & kNonEmpty) ? kEmpty : setAt(call.run, end);
     }
     // An end that takes no token counts for some calls and not for others.
-    const bool mayBeEmpty = sets_.contains(all, p);
+    const bool mayBeEmpty = p >= sets_.from() && sets_.contains(all, p);
     const SetId ends = mayBeEmpty ? sets_.without(all, p) : all;
     // Rules inside each other mostly share the ends further on: only what is new is looked at.
     EndsBehind::Known& known = behind_.known(call.run);
@@ -202,7 +222,8 @@ void FullSearch::joinBehind(std::uint16_t node, const EndsBehind::Word& behind, 
 /// Those ends in a word that count for a call: some calls want one that takes a token.
 std::uint64_t FullSearch::counted(const NodeRow& call, std::uint32_t p, std::uint32_t word,
                                   std::uint64_t bits) const {
-    return (call.flags & kNonEmpty) && word == sets_.wordOf(p) ? bits & ~sets_.bitOf(p) : bits;
+    const bool isEmpty = (call.flags & kNonEmpty) && p >= sets_.from() && word == sets_.wordOf(p);
+    return isEmpty ? bits & ~sets_.bitOf(p) : bits;
 }
 
 // ---- the walk down
@@ -212,6 +233,35 @@ FullSearch::Outcome FullSearch::writeDown(std::uint16_t rule, std::uint32_t posi
     whole.few[whole.count++] = reached_;
     made_->start(rule, position);
     walks_.assign(1, {0, whole, searchedFrom(*table_, table_->rules[rule].entry), position});
+    return walkDown();
+}
+
+/// Makes ready to walk on from a place with the calls around it; false where that leads nowhere.
+bool FullSearch::setOut(const Place& from) {
+    const auto& parts = made_->parts;
+    // What the rest of the innermost call can come to, what that of the one around it can then, and so on.
+    std::vector<SetId> ends{setAt(from.node, from.position)};
+    for (const Reach::Called& each : inside_)
+        ends.push_back(setBehind(table_->nodes[each.call], each.position, ends.back()));
+    if (!sets_.contains(ends.back(), reached_)) return false;
+    Wanted wanted;
+    wanted.few[wanted.count++] = reached_;
+    walks_.assign(inside_.size() + 1, {from.part, {}, from.node, from.position});
+    std::uint32_t part = from.part;
+    for (std::size_t i = 0; i < inside_.size(); ++i, part = parts[part].outer) {
+        walks_[inside_.size() - i].part = part;
+        walks_[inside_.size() - 1 - i].node = inside_[i].call;
+    }
+    walks_[0].part = 0;
+    walks_[0].wanted = wanted;
+    for (std::size_t i = inside_.size(); i-- > 0;) {
+        wanted = wantedBy(wanted, table_->nodes[inside_[i].call], inside_[i].position, ends[i]);
+        walks_[inside_.size() - i].wanted = wanted;
+    }
+    return true;
+}
+
+FullSearch::Outcome FullSearch::walkDown() {
     for (;;) {
         if (!walkOn(walks_.back())) {
             if (walks_.size() >= options_->maxDepth) return Outcome::TooDeep;
@@ -266,7 +316,8 @@ bool FullSearch::walkOn(Walk& walk) {
                     comeBack(walk, part, recovery_.to);
                     break;
                 }
-                walks_.push_back({part, wantedBy(walk, node),
+                walks_.push_back({part,
+                                  wantedBy(walk.wanted, node, walk.position, endsOf(node.arg, walk.position)),
                                   searchedFrom(*table_, table_->rules[node.arg].entry), walk.position});
                 return false;
             }
@@ -301,38 +352,36 @@ bool FullSearch::leadsTo(SetId set, const Wanted& wanted) const {
     return false;
 }
 
-/// The ends of a call that its walk can go on from.
-FullSearch::Wanted FullSearch::wantedBy(const Walk& walk, const NodeRow& call) {
-    const SetId ends = endsOf(call.arg, walk.position);
+/// Of the ends of a call at a position those from which what is wanted can be come to.
+FullSearch::Wanted FullSearch::wantedBy(const Wanted& wanted, const NodeRow& call, std::uint32_t position,
+                                        SetId ends) {
     if (sets_.size(ends) == 1) return {{sets_.last(ends)}, 1, kEmpty};
     const PositionSets::Range range = sets_.range(ends);
     const EndsBehind::Word* behind = behind_.words(call.run);
     const auto endsIn = [&](std::uint32_t word) {
-        return counted(call, walk.position, word, sets_.word(ends, word));
+        return counted(call, position, word, sets_.word(ends, word));
     };
     // Of many ends mostly one or two lead on to what is wanted: it takes less to look from there.
-    const bool isFew = walk.wanted.count <= Wanted::kFew;
+    const bool isFew = wanted.count <= Wanted::kFew;
     const std::uint32_t many = kManyEnds * (range.to - range.from);
     const std::uint32_t elsewhere = behind_.known(call.run).elsewhere;
     const bool backwards =
         isFew && range.to - range.from >= kFarWords && sets_.size(ends) >= many && elsewhere >= many;
     const bool forwards = !backwards && !(isFew && elsewhere == 0);
-    for (std::uint32_t i = 0; isFew && i < walk.wanted.count; ++i) {
-        const std::uint32_t end = walk.wanted.few[i], wordOfEnd = sets_.wordOf(end);
+    for (std::uint32_t i = 0; isFew && i < wanted.count; ++i) {
+        const std::uint32_t end = wanted.few[i], wordOfEnd = sets_.wordOf(end);
         sets_.joinWord(wordOfEnd, endsIn(wordOfEnd) & behind[wordOfEnd].here & sets_.bitOf(end));
         if (!backwards) continue;
-        const StartsBefore::Starts starts =
-            starts_.of(sets_, call.run, behind, range, end,
-                       [&](std::uint32_t position) { return setAt(call.run, position); });
+        const StartsBefore::Starts starts = starts_.of(sets_, call.run, behind, range, end,
+                                                       [&](std::uint32_t at) { return setAt(call.run, at); });
         const std::uint32_t to = std::min(range.to, starts.words.to);
         for (std::uint32_t word = std::max(range.from, starts.words.from); word < to; ++word)
             sets_.joinWord(word, endsIn(word) & starts.in(word));
     }
     for (std::uint32_t word = range.from; forwards && word < range.to; ++word) {
-        if (!isFew)
-            sets_.joinWord(word, endsIn(word) & behind[word].here & sets_.word(walk.wanted.many, word));
+        if (!isFew) sets_.joinWord(word, endsIn(word) & behind[word].here & sets_.word(wanted.many, word));
         for (std::uint64_t left = endsIn(word) & behind[word].elsewhere; left != 0; left &= left - 1)
-            if (leadsTo(setAt(call.run, sets_.positionOf(word, left)), walk.wanted))
+            if (leadsTo(setAt(call.run, sets_.positionOf(word, left)), wanted))
                 sets_.joinWord(word, left & (~left + 1));
     }
     steps_ += (range.to - range.from) / kWordsAStep;

@@ -21,11 +21,30 @@ QuickSearch::Outcome QuickSearch::run(std::uint16_t rule, std::uint32_t position
             furthest = place_.low;
             bound = steps_ + options_.quickSteps;
         }
-        if (++steps_ > bound || remembered() > options_.maxMemo || !turnBack()) return Outcome::GaveUp;
+        if (++steps_ > bound || remembered() > options_.maxMemo || !turnBack()) return giveUp();
     }
     if (remembered() > options_.maxMemo) return Outcome::GaveUp;
     made_.end(0, place_.low, place_.high);
     return Outcome::Found;
+}
+
+QuickSearch::Outcome QuickSearch::giveUp() {
+    // The outermost call that starts behind a good part of the text, such as that of a whole condition.
+    constexpr std::uint32_t kGoodPart = 4;
+    std::uint32_t astray = 0;
+    for (std::uint32_t part = place_.part; part != 0; part = made_.parts[part].outer)
+        if (made_.parts[part].position >= text_.count() / kGoodPart) astray = part;
+    // Up to its first choice there was only one way. In a run of closers a place isn't one position.
+    const auto point = std::find_if(points_.begin(), points_.end(), [astray](const Point& each) {
+        return each.parts > astray && each.place.low == each.place.high;
+    });
+    rests_ = astray != 0 && point != points_.end();
+    if (rests_) {
+        place_ = point->place;
+        made_.choices.resize(point->choices);
+        made_.parts.resize(point->parts);
+    }
+    return Outcome::GaveUp;
 }
 
 /// Goes on until the whole is read, which gives true, or a way fails.

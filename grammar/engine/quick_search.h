@@ -39,11 +39,17 @@ class QuickSearch {
     /// about the text.
     Outcome run(std::uint16_t rule, std::uint32_t position);
 
+    /// Where a search that gave up can be taken up by another one: a choice from which on no reading was
+    /// found yet, while all that stand ahead of it in written order have failed. The derivation is cut there.
+    /// Null where so little was read ahead of it that it isn't worth that.
+    const Place* resting() const { return rests_ ? &place_ : nullptr; }
+
     std::uint64_t steps() const { return steps_; }
     /// What the search has to remember, as Options::maxMemo counts it.
     std::size_t remembered() const { return made_.parts.size() + made_.choices.size() / 16 + points_.size(); }
 
  private:
+    Outcome giveUp();
     bool follow();
     bool turnBack();
     std::uint16_t take(const NodeRow& choice, std::uint32_t branch);
@@ -56,6 +62,7 @@ class QuickSearch {
     Derivation& made_;
     std::vector<Point>& points_;
     Place place_{};
+    bool rests_ = false;
     std::uint64_t steps_ = 0;
     bool tooDeep_ = false;
 };

@@ -43,12 +43,14 @@ bool Reach::comesBack(std::uint16_t call, std::uint32_t position) const {
 
 // ---- forward
 
-bool Reach::follow(std::uint16_t rule, std::uint32_t position, std::size_t most) {
+bool Reach::goOn(std::uint16_t rule, std::uint16_t node, std::uint32_t position,
+                 std::span<const Called> inside, std::size_t most) {
     rule_ = rule;
     from_ = position;
     end_ = text_->count();
-    const std::uint16_t entry = searchedFrom(*table_, table_->rules[rule].entry);
-    nodes_ = entry < table_->statementStops ? table_->statementStops : table_->stops;
+    nodes_ = searchedFrom(*table_, table_->rules[rule].entry) < table_->statementStops
+                 ? table_->statementStops
+                 : table_->stops;
     words_ = (nodes_ + 63) / 64;
     met_.assign(words_, 0);
     open_.clear();  // a search that memory ran out for leaves some
@@ -64,7 +66,8 @@ bool Reach::follow(std::uint16_t rule, std::uint32_t position, std::size_t most)
     kept_.clear();
     skips_.clear();
     ends_.clear();
-    meet(entry);
+    for (const Called& each : inside) meetCall(each.call, each.position);
+    meet(node);
     for (std::uint32_t p = position; p <= end_; ++p) {
         const std::size_t ahead = stepsFrom_.empty() ? 0 : stepsFrom_.back();
         beginPosition();
@@ -72,9 +75,9 @@ bool Reach::follow(std::uint16_t rule, std::uint32_t position, std::size_t most)
         if (p == recovery_.to)
             for (const Way& skip : skips_) meet(skip.to);
         while (!open_.empty()) {
-            const std::uint16_t node = open_.back();
+            const std::uint16_t at = open_.back();
             open_.pop_back();
-            pass(node, p);
+            pass(at, p);
         }
         std::fill(met_.begin(), met_.end(), 0);
         const bool skips = !skips_.empty() && p < recovery_.to;
@@ -105,11 +108,11 @@ void Reach::pass(std::uint16_t at, std::uint32_t p) {
         case Op::Soft:
         case Op::SoftStar:
             if (text_->isCloser(p)) steps_.push_back({at, node.op == Op::Soft ? node.run : at});
-            goOn(at, node.run);
+            lead(at, node.run);
             break;
         case Op::Choice:
             for (std::uint32_t mask = branches(node, p); mask != 0; mask &= mask - 1)
-                goOn(at, branchStop(*table_, node, static_cast<std::uint32_t>(std::countr_zero(mask))));
+                lead(at, branchStop(*table_, node, static_cast<std::uint32_t>(std::countr_zero(mask))));
             break;
         case Op::Call:
             passCall(at, p);
@@ -119,7 +122,7 @@ void Reach::pass(std::uint16_t at, std::uint32_t p) {
             endOf_[node.arg] = at;
             if (node.arg == rule_) ends_.push_back(p);
             forEachCallMet(node.arg, [&](std::uint16_t call) {
-                if (comesBack(call, p)) goOn(at, table_->nodes[call].run);
+                if (comesBack(call, p)) lead(at, table_->nodes[call].run);
             });
             break;
         case Op::Root:
@@ -129,6 +132,16 @@ void Reach::pass(std::uint16_t at, std::uint32_t p) {
     }
 }
 
+/// Notes that a call is met: behind it everything goes on that its rule ends with from there on.
+void Reach::meetCall(std::uint16_t at, std::uint32_t p) {
+    if (metAt_[at] == kNone) {
+        const std::uint16_t rule = table_->nodes[at].arg;
+        callBefore_[at] = called_[rule];
+        called_[rule] = at;
+    }
+    metAt_[at] = p;
+}
+
 void Reach::passCall(std::uint16_t at, std::uint32_t p) {
     const NodeRow& call = table_->nodes[at];
     if (mayRecover(call, p)) {
@@ -136,16 +149,12 @@ void Reach::passCall(std::uint16_t at, std::uint32_t p) {
         if (recovery_.to == p) meet(call.run);
     }
     if (!mayCall(call, p)) return;
-    if (metAt_[at] == kNone) {
-        metAt_[at] = p;
-        callBefore_[at] = called_[call.arg];
-        called_[call.arg] = at;
-    }
-    if (endedAt_[call.arg] == p && comesBack(at, p)) goOn(endOf_[call.arg], call.run);
+    if (metAt_[at] == kNone) meetCall(at, p);
+    if (endedAt_[call.arg] == p && comesBack(at, p)) lead(endOf_[call.arg], call.run);
     // Whether a call leads on that need not take a token depends on what is behind it at the same position,
     // too.
     if (mayBeEmpty(call)) ways_.push_back({at, call.run});
-    goOn(at, searchedFrom(*table_, table_->rules[call.arg].entry));
+    lead(at, searchedFrom(*table_, table_->rules[call.arg].entry));
 }
 
 // ---- back

@@ -41,13 +41,31 @@ Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
     const QuickSearch::Outcome outcome = quick.run(rule, position);
     steps_ += quick.steps();
     remembered_ = quick.remembered();
-    if (outcome == QuickSearch::Outcome::GaveUp) return fullSearch(rule, position, {});
+    bool tooDeep = outcome == QuickSearch::Outcome::TooDeep;
+    if (outcome == QuickSearch::Outcome::GaveUp) {
+        const FullSearch::Outcome completed = complete(quick);
+        if (completed != FullSearch::Outcome::Found && completed != FullSearch::Outcome::TooDeep)
+            return fullSearch(rule, position, {});
+        tooDeep = completed == FullSearch::Outcome::TooDeep;
+    }
     Result result;
-    result.overLimit = outcome == QuickSearch::Outcome::TooDeep;
+    result.overLimit = tooDeep;
     if (result.overLimit) return result;
     result.found = true;
     result.high = text_.count();
     return result;
+}
+
+/// What the quick search has read ahead of the place where it rests stands if it can be completed at all.
+FullSearch::Outcome Recogniser::complete(const QuickSearch& quick) {
+    if (quick.resting() == nullptr) return FullSearch::Outcome::NotFound;
+    const QuickSearch::Place& at = *quick.resting();
+    FullSearch& full = fullWork();
+    const FullSearch::Outcome outcome =
+        full.complete(*table_, text_, *options_, {at.part, at.node, at.low}, work_->derivation);
+    steps_ += full.steps();
+    remembered_ = std::max(remembered_, full.remembered());
+    return outcome;
 }
 
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {

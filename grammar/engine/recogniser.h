@@ -66,6 +66,7 @@ class Recogniser {
     FullSearch& fullWork();
     static std::unique_ptr<Work>& spare();
 
+    FullSearch::Outcome complete(const QuickSearch& quick);
     Result fullSearch(std::uint16_t rule, std::uint32_t position, const Reach::Recovery& recovery);
 
     const ParserTable* table_;
