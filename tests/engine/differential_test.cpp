@@ -45,7 +45,9 @@ void compare(const Grammar& grammar, const std::u16string& text, Counts& counts,
         ++counts.recovered;
     else if (expected.taken == tokens.size())
         ++counts.whole;
-    EXPECT_EQ(grammar.readBySets(text).flat(), expected.tree.flat()) << quoteJson(text);
+    for (const std::uint32_t quickSteps : {0, 1, 16})
+        EXPECT_EQ(grammar.readHandedOn(text, quickSteps).flat(), expected.tree.flat())
+            << quickSteps << " " << quoteJson(text);
     EXPECT_EQ(found.statement.flat(), expected.tree.flat()) << quoteJson(text);
     if (expected.found && !expected.recovered) {
         EXPECT_EQ(found.taken, expected.taken) << quoteJson(text);

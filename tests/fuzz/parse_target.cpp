@@ -23,6 +23,9 @@ int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     constexpr std::size_t kFewTokens = 60;
     if (reading.tokens.size() > kFewTokens) return 0;
     require(grammar.readAgain(text).tree.flat() == tree, "the same tree again");
-    require(grammar.readBySets(text).flat() == reading.statement.flat(), "the same tree by either search");
+    require(grammar.readHandedOn(text, 0).flat() == reading.statement.flat(),
+            "the same tree by either search");
+    require(grammar.readHandedOn(text, 8).flat() == reading.statement.flat(),
+            "the same tree by both together");
     return 0;
 }

@@ -202,18 +202,18 @@ const engine::GrammarTable& tables() {
 }
 
 template <typename G>
-SyntaxDump readBySets(std::u16string_view text) {
+SyntaxDump readHandedOn(std::u16string_view text, std::uint32_t quickSteps) {
     Reading reading;
     Pipeline<G> pipeline(text);
     engine::Options& options = optionsOf(pipeline.parser());
-    options.quickSteps = 0;
+    options.quickSteps = quickSteps;
     copyTree(pipeline.parser()->start_rule(pipeline.parser()).tree, reading);
     return reading.statement;
 }
 
 template <typename G>
 constexpr Grammar grammar(std::string_view corpus, const char* (*tokenName)(int)) {
-    return {corpus, tokenName, &lex<G>, &read<G>, &readAgain<G>, &tables<G>, &readBySets<G>};
+    return {corpus, tokenName, &lex<G>, &read<G>, &readAgain<G>, &tables<G>, &readHandedOn<G>};
 }
 
 #define ZR_GRAMMAR(NAME, CORPUS, STATEMENT_RULE)                                          \

@@ -3,6 +3,7 @@
 #include <antlr3.h>
 
 #include <cstddef>
+#include <cstdint>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -42,9 +43,9 @@ struct Grammar {
     /// The same, with lexer, token stream and parser asked twice: what the second call returns.
     Reading (*readAgain)(std::u16string_view text);
     const engine::GrammarTable& (*tables)();
-    /// The statement's tree alone, found by the search that never turns back, which other texts come to only
-    /// when they are hard.
-    SyntaxDump (*readBySets)(std::u16string_view text);
+    /// The statement's tree alone, with a quick search that gives up after so few steps: what hard texts come
+    /// to. With none the full search reads the whole; with a few it completes what the quick one has read.
+    SyntaxDump (*readHandedOn)(std::u16string_view text, std::uint32_t quickSteps);
 };
 
 /// Every test that is about all grammars goes over this list.
