@@ -227,6 +227,50 @@ TEST_P(SameTree, MoreTokensThanAllowedAreAnErrorNode) {
     EXPECT_EQ(within.nodeCount(), unbounded.nodeCount());
 }
 
+// A node tells the tokens that its rule took: a root made in one those of all its operands and what stood
+// around them, such as parentheses that were dropped.
+
+std::string spansBelow(const SyntaxTree& tree, SyntaxNode node) {
+    std::string text;
+    if (tree.isToken(node))
+        for (const char16_t unit : tree.tokenText(node)) text += static_cast<char>(unit);
+    else
+        text = tree.name(node);
+    const SyntaxTree::Span span = tree.span(node);
+    if (span.last != 0) text += " " + std::to_string(span.first) + "-" + std::to_string(span.last);
+    for (std::uint32_t i = 0; i < tree.childCount(node); ++i)
+        text += (i == 0 ? " (" : ", ") + spansBelow(tree, tree.firstChild(node) + i);
+    return tree.childCount(node) == 0 ? text : text + ")";
+}
+
+std::string spansOf(std::string_view corpus, std::u16string_view text) {
+    const auto* grammar = std::find_if(kGrammars, kGrammars + kGrammarCount,
+                                       [corpus](const Grammar& each) { return each.corpus == corpus; });
+    const SyntaxTree tree(grammar->tables(), text);
+    return spansBelow(tree, SyntaxTree::root());
+}
+
+TEST(Spans, AreThoseOfTheRulesThatANodeCameFrom) {
+    EXPECT_EQ(spansOf("mssql", u"SELECT a.b,(1+c) FROM t WHERE x IS NULL"),
+              "SELECT_QUERY_ 0-15 (SELECT_LIST 1-9 (COLUMN_SPECIFICATION 1-3 (TABLE_NAME 1-1 (a 1-1), "
+              "COLUMN_NAME 3-3 "
+              "(b 3-3)), + 5-9 (SQL_LITERAL 6-6 (NUMBER_LITERAL 6-6 (1 6-6)), COLUMN_SPECIFICATION 8-8 "
+              "(COLUMN_NAME "
+              "8-8 (c 8-8)))), FROM_DEF_ 10-11 (TABLE_SPECIFICATION 11-11 (TABLE_NAME 11-11 (t 11-11))), "
+              "WHERE_CONDITION 12-15 (SEARCH_CONDITION 12-15 (IS 13-15 (COLUMN_SPECIFICATION 13-13 "
+              "(COLUMN_NAME 13-13 "
+              "(x 13-13)), SQL_LITERAL 15-15 (NUMBER_LITERAL 15-15 (NULL 15-15))))))");
+}
+
+TEST(Spans, CountTokensThatTheParserDoesNotSee) {
+    EXPECT_EQ(
+        spansOf("msaccess", u"SELECT a.b FROM t WHERE x > (1)"),
+        "nil 0-18 (SELECT_QUERY 0-18 (SELECT_LIST 2-4 (COLUMN_SPECIFICATION 2-4 (TABLE_NAME 2-2 (a 2-2), "
+        "COLUMN_NAME 4-4 (b 4-4))), FROM_DEF_ 6-8 (TABLE_SPECIFICATION 8-8 (TABLE_NAME 8-8 (t 8-8))), "
+        "WHERE_CONDITION 10-18 (SEARCH_CONDITION 10-18 (> 12-18 (COLUMN_SPECIFICATION 12-12 (COLUMN_NAME "
+        "12-12 (x 12-12)), ( 16-18 (SQL_LITERAL 17-17 (NUMBER_LITERAL 17-17 (1 17-17)), )))))), <EOF>)");
+}
+
 INSTANTIATE_TEST_SUITE_P(Grammars, SameTree, testing::ValuesIn(kRoads),
                          [](const auto& road) { return std::string(road.param.corpus); });
 
