@@ -36,18 +36,21 @@ void FullSearch::start(const ParserTable& table, TextIndex& text, const Options&
     reach_.start(table, text, recovery);
 }
 
-FullSearch::Outcome FullSearch::run(const ParserTable& table, TextIndex& text, const Options& options,
-                                    const Reach::Recovery& recovery, std::uint16_t rule,
-                                    std::uint32_t position, Derivation& derivation) {
+bool FullSearch::look(const ParserTable& table, TextIndex& text, const Options& options,
+                      const Reach::Recovery& recovery, std::uint16_t rule, std::uint32_t position) {
+    start(table, text, options, recovery, nullptr);
+    return reach_.follow(rule, position, kMemoBytes * options.maxMemo);
+}
+
+FullSearch::Outcome FullSearch::read(std::uint16_t rule, std::uint32_t position, Derivation& derivation) {
     constexpr std::size_t kFirstLook = 4;
-    start(table, text, options, recovery, &derivation);
-    if (!reach_.follow(rule, position, kMemoBytes * options.maxMemo)) return Outcome::OverBudget;
+    made_ = &derivation;
     const std::vector<std::uint32_t>& ends = reach_.ends();
     // Reach mostly says where the reading ends, or a little too much: the last ends it names come first.
     std::size_t count = ends.size();
     for (std::size_t look = std::min(kFirstLook, count); count != 0; count -= look, look = count) {
         const std::uint32_t last = ends[count - 1];
-        if (last < text.count()) text.cutAt(last);
+        if (last < text_->count()) text_->cutAt(last);
         reach_.keep(ends[count - look], last);
         if (!findSets(position, last)) return Outcome::OverBudget;
         const SetId found = endsOf(rule, position);

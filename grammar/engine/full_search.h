@@ -25,17 +25,21 @@ class FullSearch {
  public:
     enum class Outcome { Found, NotFound, TooDeep, OverBudget };
 
-    /// Reads `rule` from `position` as far as any derivation reaches, and writes the derivation down. The
-    /// index is left cut somewhere behind that place. What the search remembers is kept for the next one.
-    Outcome run(const ParserTable& table, TextIndex& text, const Options& options,
-                const Reach::Recovery& recovery, std::uint16_t rule, std::uint32_t position,
-                Derivation& derivation);
+    /// Looks how far `rule` can be read from `position`; false past the options' bounds. What the search
+    /// remembers is kept for the next one. The table, the index and the options must outlive what follows.
+    bool look(const ParserTable& table, TextIndex& text, const Options& options,
+              const Reach::Recovery& recovery, std::uint16_t rule, std::uint32_t position);
+    /// No derivation ends behind this; kNone where there is none at all.
+    std::uint32_t furthest() const { return reach_.ends().empty() ? Reach::kNone : reach_.ends().back(); }
+    /// Reads as far as any derivation of what was looked at reaches, and writes the derivation down. The
+    /// index is left cut somewhere behind that place.
+    Outcome read(std::uint16_t rule, std::uint32_t position, Derivation& derivation);
 
     /// Where a derivation that was begun stands: at a node of one of its parts, in front of a token.
     struct Place {
-        std::uint32_t part;
-        std::uint16_t node;
-        std::uint32_t position;
+        std::uint32_t part = 0;
+        std::uint16_t node = 0;
+        std::uint32_t position = 0;
     };
     /// Completes a derivation that was begun, such that it ends with the text. Where it can't be completed or
     /// too much is at work there, what was begun is left as it is.

@@ -37,35 +37,42 @@ FullSearch& Recogniser::fullWork() {
 }
 
 Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
-    QuickSearch quick(*table_, text_, *options_, work_->derivation, work_->points);
-    const QuickSearch::Outcome outcome = quick.run(rule, position);
-    steps_ += quick.steps();
-    remembered_ = quick.remembered();
-    bool tooDeep = outcome == QuickSearch::Outcome::TooDeep;
-    if (outcome == QuickSearch::Outcome::GaveUp) {
-        const FullSearch::Outcome completed = complete(quick);
-        if (completed != FullSearch::Outcome::Found && completed != FullSearch::Outcome::TooDeep)
-            return fullSearch(rule, position, {});
-        tooDeep = completed == FullSearch::Outcome::TooDeep;
-    }
+    FullSearch::Outcome outcome = quickSearch(rule, position);
+    if (outcome == FullSearch::Outcome::NotFound) outcome = complete();
+    if (outcome == FullSearch::Outcome::NotFound) return fullSearch(rule, position, {});
+    return resultOf(outcome, text_.count());
+}
+
+Recogniser::Result Recogniser::resultOf(FullSearch::Outcome outcome, std::uint32_t end) {
     Result result;
-    result.overLimit = tooDeep;
-    if (result.overLimit) return result;
-    result.found = true;
-    result.high = text_.count();
+    result.overLimit = outcome == FullSearch::Outcome::TooDeep;
+    result.overBudget = outcome == FullSearch::Outcome::OverBudget;
+    result.found = outcome == FullSearch::Outcome::Found;
+    if (result.found) result.high = end;
     return result;
 }
 
+/// Reads the text to its end, or doesn't find out how.
+FullSearch::Outcome Recogniser::quickSearch(std::uint16_t rule, std::uint32_t position) {
+    QuickSearch quick(*table_, text_, *options_, work_->derivation, work_->points);
+    const QuickSearch::Outcome outcome = quick.run(rule, position);
+    steps_ += quick.steps();
+    remembered_ = std::max(remembered_, quick.remembered());
+    rests_ = {};
+    if (const QuickSearch::Place* const at = quick.resting()) rests_ = {at->part, at->node, at->low};
+    if (outcome == QuickSearch::Outcome::Found) return FullSearch::Outcome::Found;
+    return outcome == QuickSearch::Outcome::TooDeep ? FullSearch::Outcome::TooDeep
+                                                    : FullSearch::Outcome::NotFound;
+}
+
 /// What the quick search has read ahead of the place where it rests stands if it can be completed at all.
-FullSearch::Outcome Recogniser::complete(const QuickSearch& quick) {
-    if (quick.resting() == nullptr) return FullSearch::Outcome::NotFound;
-    const QuickSearch::Place& at = *quick.resting();
+FullSearch::Outcome Recogniser::complete() {
+    if (rests_.part == 0) return FullSearch::Outcome::NotFound;
     FullSearch& full = fullWork();
-    const FullSearch::Outcome outcome =
-        full.complete(*table_, text_, *options_, {at.part, at.node, at.low}, work_->derivation);
+    const FullSearch::Outcome outcome = full.complete(*table_, text_, *options_, rests_, work_->derivation);
     steps_ += full.steps();
     remembered_ = std::max(remembered_, full.remembered());
-    return outcome;
+    return outcome == FullSearch::Outcome::OverBudget ? FullSearch::Outcome::NotFound : outcome;
 }
 
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
@@ -78,23 +85,32 @@ Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t positio
 /// quarter.
 Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t position,
                                           const Reach::Recovery& recovery) {
-    Result result;
     FullSearch& full = fullWork();
+    bool overBudget = false;
     for (;;) {
-        const FullSearch::Outcome outcome =
-            full.run(*table_, text_, *options_, recovery, rule, position, work_->derivation);
+        FullSearch::Outcome outcome = FullSearch::Outcome::OverBudget;
+        if (full.look(*table_, text_, *options_, recovery, rule, position)) {
+            outcome = FullSearch::Outcome::NotFound;
+            if (full.furthest() < text_.count() && recovery.place == Reach::kNone) {
+                // What can't be read whole is often read quickly up to where that ends.
+                text_.cutAt(full.furthest());
+                outcome = quickSearch(rule, position);
+            }
+        }
+        std::uint32_t end = text_.count();
+        if (outcome == FullSearch::Outcome::NotFound) {
+            outcome = full.read(rule, position, work_->derivation);
+            end = full.reached();
+        }
         steps_ += full.steps();
         remembered_ = std::max(remembered_, full.remembered());
         if (outcome == FullSearch::Outcome::OverBudget && text_.count() > position) {
-            result.overBudget = true;
+            overBudget = true;
             text_.cutAt(position + (text_.count() - position) / 2);
             continue;
         }
-        result.overBudget = result.overBudget || outcome == FullSearch::Outcome::OverBudget;
-        result.overLimit = outcome == FullSearch::Outcome::TooDeep;
-        if (outcome != FullSearch::Outcome::Found) return result;
-        result.found = true;
-        result.high = full.reached();
+        Result result = resultOf(outcome, end);
+        result.overBudget = result.overBudget || overBudget;
         return result;
     }
 }

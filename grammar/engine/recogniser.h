@@ -66,13 +66,16 @@ class Recogniser {
     FullSearch& fullWork();
     static std::unique_ptr<Work>& spare();
 
-    FullSearch::Outcome complete(const QuickSearch& quick);
+    static Result resultOf(FullSearch::Outcome outcome, std::uint32_t end);
+    FullSearch::Outcome quickSearch(std::uint16_t rule, std::uint32_t position);
+    FullSearch::Outcome complete();
     Result fullSearch(std::uint16_t rule, std::uint32_t position, const Reach::Recovery& recovery);
 
     const ParserTable* table_;
     const Options* options_;
     TextIndex text_;
     std::unique_ptr<Work> work_;
+    FullSearch::Place rests_{};  ///< where the quick search rests, if in a part
     std::uint64_t steps_ = 0;
     std::size_t remembered_ = 0;
 };
