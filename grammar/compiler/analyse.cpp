@@ -14,10 +14,6 @@ using TokenBits = std::bitset<kMaxTokens>;
 /// A guard costs a backward scan of the text once, so it is only made where few tokens can follow.
 constexpr std::size_t kSelective = 90;
 
-std::size_t index(int i) {
-    return static_cast<std::size_t>(i);
-}
-
 void firstSets(Program& p, const Facts& facts) {
     for (bool changed = true; changed;) {
         changed = false;

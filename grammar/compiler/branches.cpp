@@ -7,10 +7,6 @@
 namespace zr::gc {
 namespace {
 
-std::size_t index(int i) {
-    return static_cast<std::size_t>(i);
-}
-
 using Branches = std::vector<Branch>;
 
 /// Adds a branch unless an earlier one goes on at the same node: that reads the same, and is preferred.

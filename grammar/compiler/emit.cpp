@@ -10,10 +10,6 @@
 namespace zr::gc {
 namespace {
 
-std::size_t index(int i) {
-    return static_cast<std::size_t>(i);
-}
-
 std::string cString(const std::string& text) {
     std::string out = "\"";
     for (char c : text) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <map>
 #include <set>
@@ -9,6 +10,11 @@
 /// The grammar as read from its files, before any lowering. Every pass of the compiler reads this model; only
 /// the readers write it.
 namespace zr::gc {
+
+/// Numbers of nodes, rules and tokens are int, with -1 for none; this makes one an index.
+constexpr std::size_t index(int number) {
+    return static_cast<std::size_t>(number);
+}
 
 /// Token numbers: 0 stands for end of file in sets (the runtime's -1), 4 and up are the vocabulary's.
 constexpr int kEof = 0;

@@ -10,10 +10,6 @@
 namespace zr::gc {
 namespace {
 
-std::size_t index(int i) {
-    return static_cast<std::size_t>(i);
-}
-
 /// Larger rules save little and make the tables large.
 constexpr std::size_t kSmallRule = 40;
 /// Nodes that a rule may come to in all places that call it.

@@ -13,10 +13,6 @@ constexpr std::size_t kClasses = 256;
 using Classes = std::bitset<kClasses + 1>;
 constexpr std::size_t kStart = kClasses;  ///< in front of the first token
 
-std::size_t index(int i) {
-    return static_cast<std::size_t>(i);
-}
-
 /// The last two tokens of what was read up to a node: by the last one, those in front of it. Nothing was read
 /// where only kStart has one.
 class Pairs {

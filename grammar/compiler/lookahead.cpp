@@ -14,10 +14,6 @@
 namespace zr::gc {
 namespace {
 
-std::size_t index(int i) {
-    return static_cast<std::size_t>(i);
-}
-
 /// A set of more configurations than this isn't followed: everything fits.
 constexpr std::size_t kManyConfigurations = 4000;
 /// Of more than these only one more token is looked at.

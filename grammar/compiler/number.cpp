@@ -5,10 +5,6 @@
 namespace zr::gc {
 namespace {
 
-std::size_t index(int i) {
-    return static_cast<std::size_t>(i);
-}
-
 /// Nodes that a search can come to behind one at the same position of the text.
 std::vector<int> withoutToken(const Program& p, const Facts& facts, int recoverRule, const Node& n) {
     std::vector<int> to;
