@@ -14,7 +14,8 @@ CString ViewStore::textOf(engine::SyntaxNode node) {
     constexpr std::size_t kLongestShared = 24;
     const std::u16string_view text = tree_->tokenText(node);
     if (text.size() > kLongestShared) return CString(text);
-    CString& known = texts_[CString::hash(text) % texts_.size()];
+    if (!texts_) texts_ = std::make_unique<std::array<CString, 64>>();
+    CString& known = (*texts_)[CString::hash(text) % texts_->size()];
     if (known.View() != text) known = text;
     return known;
 }

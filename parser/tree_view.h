@@ -47,7 +47,7 @@ class ViewStore {
 
     const engine::SyntaxTree* tree_;  // not owned
     std::unique_ptr<std::byte[]> views_;
-    std::array<CString, 64> texts_;  // those asked for last, by hash
+    std::unique_ptr<std::array<CString, 64>> texts_;  // those asked for last, by hash; made with the first
     std::unordered_map<Place, std::unique_ptr<CZRSQLTree>, PlaceHash> beyond_;
 };
 

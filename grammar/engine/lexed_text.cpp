@@ -51,6 +51,7 @@ void LexedText::add(const LexedToken& token) {
         seen_.resize(count());
         std::iota(seen_.begin(), seen_.end(), 0u);
     }
+    growSlowly(tokens_);
     tokens_.push_back(token);
 }
 
