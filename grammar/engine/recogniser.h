@@ -6,6 +6,7 @@
 
 #include "grammar/engine/derivation.h"
 #include "grammar/engine/full_search.h"
+#include "grammar/engine/grow.h"
 #include "grammar/engine/options.h"
 #include "grammar/engine/quick_search.h"
 #include "grammar/engine/tables.h"
@@ -47,7 +48,10 @@ class Recogniser {
     const Derivation& derivation() const { return work_->derivation; }
 
     /// Gives back what only a search needs. Nothing can be run from here on; the derivation stays.
-    void finish() { text_.release(); }
+    void finish() {
+        text_.release();
+        giveBack(work_->points);
+    }
 
     /// Work done so far, in search steps; a benchmark figure.
     std::uint64_t steps() const { return steps_; }
