@@ -14,8 +14,8 @@ constexpr int kUnits = 0x10000;
 /// Sets of instructions can be without number, and a state must fit 16 bits; the lexers here have
 /// some thousand.
 constexpr std::size_t kMostStates = 4000;
-/// Instructions in all these sets.
-constexpr std::size_t kMostHeld = 1000000;
+/// Instructions in all these sets; the lexers here have some ten thousand.
+constexpr std::size_t kMostHeld = 200000;
 
 class LexerBuilder {
  public:
