@@ -10,7 +10,8 @@
 
 /// Which alternatives of a choice still fit once a few more tokens are known. This is the construction of
 /// strong LL(k) lookahead as an automaton over sets of configurations (Parr and Fisher, LL(*): The Foundation
-/// of the ANTLR Parser Generator, 2011), cut off at kTokens: it only ever says "no" to what can't be read.
+/// of the ANTLR Parser Generator, 2011), cut off at Program::kLookahead tokens: it only ever says
+/// "no" to what can't be read.
 namespace zr::gc {
 namespace {
 

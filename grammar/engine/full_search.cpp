@@ -67,7 +67,7 @@ FullSearch::Outcome FullSearch::complete(const ParserTable& table, TextIndex& te
     start(table, text, options, {}, &derivation);
     inside_.clear();
     for (std::uint32_t part = from.part; part != 0; part = derivation.parts[part].outer)
-        inside_.push_back({derivation.parts[part].node, derivation.parts[part].position});
+        inside_.push_back({derivation.parts[part].node, derivation.parts[part].position, part});
     if (inside_.size() > kManyCalls) return Outcome::NotFound;
     if (!reach_.goOn(derivation.rule, from.node, from.position, inside_, kMemoBytes * options.maxMemo))
         return Outcome::OverBudget;
@@ -241,7 +241,6 @@ FullSearch::Outcome FullSearch::writeDown(std::uint16_t rule, std::uint32_t posi
 
 /// Makes ready to walk on from a place with the calls around it; false where that leads nowhere.
 bool FullSearch::setOut(const Place& from) {
-    const auto& parts = made_->parts;
     // What the rest of the innermost call can come to, what that of the one around it can then, and so on.
     std::vector<SetId> ends{setAt(from.node, from.position)};
     for (const Reach::Called& each : inside_)
@@ -249,17 +248,13 @@ bool FullSearch::setOut(const Place& from) {
     if (!sets_.contains(ends.back(), reached_)) return false;
     Wanted wanted;
     wanted.few[wanted.count++] = reached_;
-    walks_.assign(inside_.size() + 1, {from.part, {}, from.node, from.position});
-    std::uint32_t part = from.part;
-    for (std::size_t i = 0; i < inside_.size(); ++i, part = parts[part].outer) {
-        walks_[inside_.size() - i].part = part;
-        walks_[inside_.size() - 1 - i].node = inside_[i].call;
-    }
-    walks_[0].part = 0;
-    walks_[0].wanted = wanted;
+    // The whole stands at the outermost call, each call at the one further in, the innermost at the place.
+    walks_.assign(1, {0, wanted, from.node, from.position});
     for (std::size_t i = inside_.size(); i-- > 0;) {
-        wanted = wantedBy(wanted, table_->nodes[inside_[i].call], inside_[i].position, ends[i]);
-        walks_[inside_.size() - i].wanted = wanted;
+        const Reach::Called& inside = inside_[i];
+        walks_.back().node = inside.call;
+        wanted = wantedBy(wanted, table_->nodes[inside.call], inside.position, ends[i]);
+        walks_.push_back({inside.part, wanted, from.node, from.position});
     }
     return true;
 }

@@ -34,6 +34,7 @@ class Reach {
     struct Called {
         std::uint16_t call;
         std::uint32_t position;
+        std::uint32_t part;  ///< of a derivation; for whoever asks
     };
     /// Finds what `rule` can pass from `position` on; false where that takes more bytes than `most`.
     bool follow(std::uint16_t rule, std::uint32_t position, std::size_t most) {

@@ -55,7 +55,7 @@ class Recogniser {
 
     /// Work done so far, in search steps; a benchmark figure.
     std::uint64_t steps() const { return steps_; }
-    /// What the last search had to remember, as Options::maxMemo counts it.
+    /// The most that one of the searches had to remember, as Options::maxMemo counts it.
     std::size_t remembered() const { return remembered_; }
 
  private:
