@@ -8,8 +8,6 @@ namespace {
 
 /// So many of 64 positions are many.
 constexpr std::uint32_t kManyEnds = 2;
-/// A derivation is completed inside so many calls at most: the ends of each of them are looked at.
-constexpr std::size_t kManyCalls = 64;
 /// Ends over fewer words than this are looked at one by one.
 constexpr std::uint32_t kFarWords = 4;
 
@@ -25,12 +23,11 @@ std::size_t FullSearch::capacity() const {
 }
 
 void FullSearch::start(const ParserTable& table, TextIndex& text, const Options& options,
-                       const Reach::Recovery& recovery, Derivation* derivation) {
+                       const Reach::Recovery& recovery) {
     table_ = &table;
     text_ = &text;
     options_ = &options;
     recovery_ = recovery;
-    made_ = derivation;
     steps_ = 0;
     joinedBefore_ = sets_.wordsJoined();
     reach_.start(table, text, recovery);
@@ -38,7 +35,7 @@ void FullSearch::start(const ParserTable& table, TextIndex& text, const Options&
 
 bool FullSearch::look(const ParserTable& table, TextIndex& text, const Options& options,
                       const Reach::Recovery& recovery, std::uint16_t rule, std::uint32_t position) {
-    start(table, text, options, recovery, nullptr);
+    start(table, text, options, recovery);
     return reach_.follow(rule, position, kMemoBytes * options.maxMemo);
 }
 
@@ -62,27 +59,11 @@ FullSearch::Outcome FullSearch::read(std::uint16_t rule, std::uint32_t position,
     return Outcome::NotFound;
 }
 
-FullSearch::Outcome FullSearch::complete(const ParserTable& table, TextIndex& text, const Options& options,
-                                         const Place& from, Derivation& derivation) {
-    start(table, text, options, {}, &derivation);
-    inside_.clear();
-    for (std::uint32_t part = from.part; part != 0; part = derivation.parts[part].outer)
-        inside_.push_back({derivation.parts[part].node, derivation.parts[part].position, part});
-    if (inside_.size() > kManyCalls) return Outcome::NotFound;
-    if (!reach_.goOn(derivation.rule, from.node, from.position, inside_, kMemoBytes * options.maxMemo))
-        return Outcome::OverBudget;
-    reached_ = text.count();
-    if (reach_.ends().empty() || reach_.ends().back() != reached_) return Outcome::NotFound;
-    reach_.keep(reached_, reached_);
-    if (!findSets(from.position, reached_)) return Outcome::OverBudget;
-    return setOut(from) ? walkDown() : Outcome::NotFound;
-}
-
 std::vector<std::uint32_t> FullSearch::allEnds(const ParserTable& table, TextIndex& text,
                                                const Options& options, std::uint16_t rule,
                                                std::uint32_t position) {
     std::vector<std::uint32_t> found;
-    start(table, text, options, {}, nullptr);
+    start(table, text, options, {});
     if (!reach_.follow(rule, position, kMemoBytes * options.maxMemo) || reach_.ends().empty()) return found;
     reach_.keep(reach_.ends().front(), reach_.ends().back());
     if (!findSets(position, reach_.ends().back())) return found;
@@ -162,9 +143,7 @@ SetId FullSearch::setFor(std::uint16_t at, std::uint32_t p) {
             return several ? sets_.joined(first) : first;
         }
         case Op::Call:
-            return isSkipped(node, p)
-                       ? setAt(node.run, recovery_.to)
-                       : setBehind(node, p, here_[searchedFrom(*table_, table_->rules[node.arg].entry)]);
+            return isSkipped(node, p) ? setAt(node.run, recovery_.to) : setBehind(node, p);
         case Op::End:
             return sets_.single(p);
         default:
@@ -177,8 +156,8 @@ bool FullSearch::isSkipped(const NodeRow& call, std::uint32_t p) const {
     return reach_.mayRecover(call, p) && endsOf(call.arg, p) == kEmpty;
 }
 
-/// What lies behind a call at a position whose rule has the ends `all`.
-SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p, SetId all) {
+SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p) {
+    const SetId all = here_[searchedFrom(*table_, table_->rules[call.arg].entry)];
     const EndsBehind::Word* behind = behind_.words(call.run);
     if (all == kEmpty || behind == nullptr) return kEmpty;
     // One end is what plain text has.
@@ -187,7 +166,7 @@ SetId FullSearch::setBehind(const NodeRow& call, std::uint32_t p, SetId all) {
         return end == p && (call.flags & kNonEmpty) ? kEmpty : setAt(call.run, end);
     }
     // An end that takes no token counts for some calls and not for others.
-    const bool mayBeEmpty = p >= sets_.from() && sets_.contains(all, p);
+    const bool mayBeEmpty = sets_.contains(all, p);
     const SetId ends = mayBeEmpty ? sets_.without(all, p) : all;
     // Rules inside each other mostly share the ends further on: only what is new is looked at.
     EndsBehind::Known& known = behind_.known(call.run);
@@ -225,8 +204,7 @@ void FullSearch::joinBehind(std::uint16_t node, const EndsBehind::Word& behind, 
 /// Those ends in a word that count for a call: some calls want one that takes a token.
 std::uint64_t FullSearch::counted(const NodeRow& call, std::uint32_t p, std::uint32_t word,
                                   std::uint64_t bits) const {
-    const bool isEmpty = (call.flags & kNonEmpty) && p >= sets_.from() && word == sets_.wordOf(p);
-    return isEmpty ? bits & ~sets_.bitOf(p) : bits;
+    return (call.flags & kNonEmpty) && word == sets_.wordOf(p) ? bits & ~sets_.bitOf(p) : bits;
 }
 
 // ---- the walk down
@@ -236,30 +214,6 @@ FullSearch::Outcome FullSearch::writeDown(std::uint16_t rule, std::uint32_t posi
     whole.few[whole.count++] = reached_;
     made_->start(rule, position);
     walks_.assign(1, {0, whole, searchedFrom(*table_, table_->rules[rule].entry), position});
-    return walkDown();
-}
-
-/// Makes ready to walk on from a place with the calls around it; false where that leads nowhere.
-bool FullSearch::setOut(const Place& from) {
-    // What the rest of the innermost call can come to, what that of the one around it can then, and so on.
-    std::vector<SetId> ends{setAt(from.node, from.position)};
-    for (const Reach::Called& each : inside_)
-        ends.push_back(setBehind(table_->nodes[each.call], each.position, ends.back()));
-    if (!sets_.contains(ends.back(), reached_)) return false;
-    Wanted wanted;
-    wanted.few[wanted.count++] = reached_;
-    // The whole stands at the outermost call, each call at the one further in, the innermost at the place.
-    walks_.assign(1, {0, wanted, from.node, from.position});
-    for (std::size_t i = inside_.size(); i-- > 0;) {
-        const Reach::Called& inside = inside_[i];
-        walks_.back().node = inside.call;
-        wanted = wantedBy(wanted, table_->nodes[inside.call], inside.position, ends[i]);
-        walks_.push_back({inside.part, wanted, from.node, from.position});
-    }
-    return true;
-}
-
-FullSearch::Outcome FullSearch::walkDown() {
     for (;;) {
         if (!walkOn(walks_.back())) {
             if (walks_.size() >= options_->maxDepth) return Outcome::TooDeep;
@@ -314,8 +268,7 @@ bool FullSearch::walkOn(Walk& walk) {
                     comeBack(walk, part, recovery_.to);
                     break;
                 }
-                walks_.push_back({part,
-                                  wantedBy(walk.wanted, node, walk.position, endsOf(node.arg, walk.position)),
+                walks_.push_back({part, wantedBy(walk, node),
                                   searchedFrom(*table_, table_->rules[node.arg].entry), walk.position});
                 return false;
             }
@@ -350,14 +303,15 @@ bool FullSearch::leadsTo(SetId set, const Wanted& wanted) const {
     return false;
 }
 
-/// Of the ends of a call at a position those from which what is wanted can be come to.
-FullSearch::Wanted FullSearch::wantedBy(const Wanted& wanted, const NodeRow& call, std::uint32_t position,
-                                        SetId ends) {
+/// The ends of a call that its walk can go on from.
+FullSearch::Wanted FullSearch::wantedBy(const Walk& walk, const NodeRow& call) {
+    const Wanted& wanted = walk.wanted;
+    const SetId ends = endsOf(call.arg, walk.position);
     if (sets_.size(ends) == 1) return {{sets_.last(ends)}, 1, kEmpty};
     const PositionSets::Range range = sets_.range(ends);
     const EndsBehind::Word* behind = behind_.words(call.run);
     const auto endsIn = [&](std::uint32_t word) {
-        return counted(call, position, word, sets_.word(ends, word));
+        return counted(call, walk.position, word, sets_.word(ends, word));
     };
     // Of many ends mostly one or two lead on to what is wanted: it takes less to look from there.
     const bool isFew = wanted.count <= Wanted::kFew;

@@ -35,17 +35,6 @@ class FullSearch {
     /// index is left cut somewhere behind that place.
     Outcome read(std::uint16_t rule, std::uint32_t position, Derivation& derivation);
 
-    /// Where a derivation that was begun stands: at a node of one of its parts, in front of a token.
-    struct Place {
-        std::uint32_t part = 0;
-        std::uint16_t node = 0;
-        std::uint32_t position = 0;
-    };
-    /// Completes a derivation that was begun, such that it ends with the text. Where it can't be completed or
-    /// too much is at work there, what was begun is left as it is.
-    Outcome complete(const ParserTable& table, TextIndex& text, const Options& options, const Place& from,
-                     Derivation& derivation);
-
     /// All ends that `rule` can come to from `position`, in ascending order; none past the options' bounds.
     std::vector<std::uint32_t> allEnds(const ParserTable& table, TextIndex& text, const Options& options,
                                        std::uint16_t rule, std::uint32_t position);
@@ -66,12 +55,12 @@ class FullSearch {
     static constexpr std::size_t kMemoBytes = 32;
 
     void start(const ParserTable& table, TextIndex& text, const Options& options,
-               const Reach::Recovery& recovery, Derivation* derivation);
+               const Reach::Recovery& recovery);
 
     bool findSets(std::uint32_t position, std::uint32_t end);
     SetId setFor(std::uint16_t node, std::uint32_t position);
     bool isSkipped(const NodeRow& call, std::uint32_t position) const;
-    SetId setBehind(const NodeRow& call, std::uint32_t position, SetId all);
+    SetId setBehind(const NodeRow& call, std::uint32_t position);
     void joinBehind(std::uint16_t node, const EndsBehind::Word& behind, std::uint32_t word,
                     std::uint64_t from);
     std::uint64_t counted(const NodeRow& call, std::uint32_t position, std::uint32_t word,
@@ -98,12 +87,10 @@ class FullSearch {
     };
 
     Outcome writeDown(std::uint16_t rule, std::uint32_t position);
-    Outcome walkDown();
-    bool setOut(const Place& from);
     void comeBack(Walk& walk, std::uint32_t part, std::uint32_t end);
     std::uint32_t addPart(const Walk& walk, bool recovered);
     bool walkOn(Walk& walk);
-    Wanted wantedBy(const Wanted& wanted, const NodeRow& call, std::uint32_t position, SetId ends);
+    Wanted wantedBy(const Walk& walk, const NodeRow& call);
 
     const ParserTable* table_ = nullptr;
     TextIndex* text_ = nullptr;
@@ -120,7 +107,6 @@ class FullSearch {
     std::vector<PositionSets::Part> gained_;
 
     std::vector<Walk> walks_;
-    std::vector<Reach::Called> inside_;
     std::uint64_t steps_ = 0, joinedBefore_ = 0;
     std::uint32_t reached_ = 0;
 };

@@ -7,47 +7,56 @@
 
 namespace zr::engine {
 
+std::size_t QuickSearch::Work::capacity() const {
+    return points.capacity() * sizeof(Point) + (known ? known->capacity() : 0) +
+           callsAt.capacity() * sizeof(std::uint32_t);
+}
+
 QuickSearch::Outcome QuickSearch::run(std::uint16_t rule, std::uint32_t position) {
     if (options_.quickSteps == 0) return Outcome::GaveUp;
     made_.start(rule, position);
-    points_.clear();
+    work_.points.clear();
     place_ = {position, position, 0, 1, searchedFrom(table_, table_.rules[rule].entry)};
     std::uint32_t furthest = position;
     std::uint64_t bound = options_.quickSteps;
-    while (!follow()) {
+    while (!follow<false>()) {
         if (tooDeep_) return Outcome::TooDeep;
         // A way that fails is followed by one that gets further, or there is more wrong.
         if (place_.low > furthest) {
             furthest = place_.low;
             bound = steps_ + options_.quickSteps;
         }
-        if (++steps_ > bound || remembered() > options_.maxMemo || !turnBack()) return giveUp();
+        if (remembered() > options_.maxMemo) return Outcome::GaveUp;
+        if (!turnBack()) return Outcome::NotFound;
+        if (++steps_ > bound) return runRemembering();
     }
     if (remembered() > options_.maxMemo) return Outcome::GaveUp;
     made_.end(0, place_.low, place_.high);
     return Outcome::Found;
 }
 
-QuickSearch::Outcome QuickSearch::giveUp() {
-    // The outermost call that starts behind a good part of the text, such as that of a whole condition.
-    constexpr std::uint32_t kGoodPart = 4;
-    std::uint32_t astray = 0;
-    for (std::uint32_t part = place_.part; part != 0; part = made_.parts[part].outer)
-        if (made_.parts[part].position >= text_.count() / kGoodPart) astray = part;
-    // Up to its first choice there was only one way. In a run of closers a place isn't one position.
-    const auto point = std::find_if(points_.begin(), points_.end(), [astray](const Point& each) {
-        return each.parts > astray && each.place.low == each.place.high;
-    });
-    rests_ = astray != 0 && point != points_.end();
-    if (rests_) {
-        place_ = point->place;
-        made_.choices.resize(point->choices);
-        made_.parts.resize(point->parts);
+/// Goes on from where the search stands.
+QuickSearch::Outcome QuickSearch::runRemembering() {
+    const std::uint64_t bound = steps_ + options_.rememberingSteps * (std::uint64_t{text_.count()} + 16);
+    if (bound == steps_) return Outcome::GaveUp;
+    if (!work_.known) work_.known = std::make_unique<KnownReadings>();
+    KnownReadings& known = *work_.known;
+    known_ = &known;
+    known.start(std::size_t{text_.count()} + 1, made_.parts.size());
+    work_.callsAt.assign(work_.points.size(), 0);
+    while (!follow<true>()) {
+        if (tooDeep_) return Outcome::TooDeep;
+        if (gaveUp_ || ++steps_ + known.steps() > bound || remembered() > options_.maxMemo)
+            return Outcome::GaveUp;
+        if (!turnBackRemembering()) return Outcome::NotFound;
     }
-    return Outcome::GaveUp;
+    made_.end(0, place_.low, place_.high);
+    known.fillIn(made_);
+    return Outcome::Found;
 }
 
 /// Goes on until the whole is read, which gives true, or a way fails.
+template <bool kRemembers>
 bool QuickSearch::follow() {
     Place here = place_;
     bool goesOn = true;
@@ -61,22 +70,24 @@ bool QuickSearch::follow() {
                 if (!goesOn) break;
                 mask &= mask - 1;
                 if (mask != 0) {
-                    growSlowly(points_);
-                    points_.push_back({here, mask, static_cast<std::uint32_t>(made_.choices.size()),
-                                       static_cast<std::uint32_t>(made_.parts.size())});
+                    goesOn = !kRemembers || visit(here);
+                    if (!goesOn) break;
+                    addPoint<kRemembers>(here, mask);
                 }
                 here.node = take(node, branch);
                 continue;
             }
             case Op::Call:
-                goesOn = call(here);
+                goesOn = call<kRemembers>(here);
                 break;
             case Op::End:
                 if (here.part == 0) {
                     place_ = here;
+                    if (furthestEnd_ == KnownReadings::kNone || here.high > furthestEnd_)
+                        furthestEnd_ = here.high;
                     return here.high == text_.count();
                 }
-                goesOn = comeBack(here);
+                goesOn = comeBack<kRemembers>(here);
                 break;
             default:
                 goesOn = text_.take(node, here.low, here.high);
@@ -89,6 +100,14 @@ bool QuickSearch::follow() {
     return false;
 }
 
+template <bool kRemembers>
+inline void QuickSearch::addPoint(const Place& place, std::uint32_t left) {
+    growSlowly(work_.points);
+    work_.points.push_back({place, left, static_cast<std::uint32_t>(made_.choices.size()),
+                            static_cast<std::uint32_t>(made_.parts.size())});
+    if constexpr (kRemembers) work_.callsAt.push_back(known_->calledCount());
+}
+
 inline std::uint16_t QuickSearch::take(const NodeRow& choice, std::uint32_t branch) {
     const std::uint16_t taken = branchOf(table_, choice, branch);
     made_.choices.push_back(taken);
@@ -97,18 +116,27 @@ inline std::uint16_t QuickSearch::take(const NodeRow& choice, std::uint32_t bran
 
 /// Back to the last choice that has a branch left.
 bool QuickSearch::turnBack() {
-    if (points_.empty()) return false;
-    Point& point = points_.back();
-    made_.choices.resize(point.choices);
-    made_.parts.resize(point.parts);
-    place_ = point.place;
-    const auto branch = static_cast<std::uint32_t>(std::countr_zero(point.mask));
-    point.mask &= point.mask - 1;
-    if (point.mask == 0) points_.pop_back();
-    place_.node = take(table_.nodes[place_.node], branch);
+    if (work_.points.empty()) return false;
+    takeAgain(work_.points.back());
     return true;
 }
 
+/// Goes back to a choice and takes its next branch.
+void QuickSearch::takeAgain(Point& point) {
+    goBackTo(point);
+    const auto branch = static_cast<std::uint32_t>(std::countr_zero(point.mask));
+    point.mask &= point.mask - 1;
+    if (point.mask == 0) work_.points.pop_back();
+    place_.node = take(table_.nodes[place_.node], branch);
+}
+
+void QuickSearch::goBackTo(const Point& point) {
+    made_.choices.resize(point.choices);
+    made_.parts.resize(point.parts);
+    place_ = point.place;
+}
+
+template <bool kRemembers>
 inline bool QuickSearch::call(Place& place) {
     const NodeRow& node = table_.nodes[place.node];
     if (!text_.settle(place.low, place.high)) return false;
@@ -117,19 +145,30 @@ inline bool QuickSearch::call(Place& place) {
         if (!text_.inSet(table_.firstSetBase + node.arg, text_.classAt(place.low))) return false;
     }
     if (!text_.guarded(node, place.low)) return false;
+    if constexpr (kRemembers) {
+        const std::uint32_t known = known_->find(node.arg, place.low);
+        if (known != KnownReadings::kNone) return useKnown(place, known);
+    }
     tooDeep_ = ++place.depth >= options_.maxDepth;
     if (tooDeep_) return false;
     ++steps_;
     const auto part = static_cast<std::uint32_t>(made_.parts.size());
     growSlowly(made_.parts);
     made_.parts.push_back({place.part, place.low, 0, 0, 0, 0, place.node, false});
+    if constexpr (kRemembers) {
+        known_->add(made_, node.arg, place.depth);
+        deepest_ = std::max(deepest_, place.depth);
+    }
     place.part = part;
     place.node = searchedFrom(table_, rule.entry);
     return true;
 }
 
 /// The rule at work is over: its caller goes on.
+template <bool kRemembers>
 inline bool QuickSearch::comeBack(Place& place) {
+    // What its caller does with an end is the same the second time.
+    if (kRemembers && !known_->addEnd(made_, place.part, place.low, place.high)) return false;
     const Derivation::Part& part = made_.parts[place.part];
     const NodeRow& node = table_.nodes[part.node];
     if (place.high == part.position && (node.flags & kNonEmpty)) return false;
@@ -138,6 +177,64 @@ inline bool QuickSearch::comeBack(Place& place) {
     place.part = part.outer;
     --place.depth;
     return true;
+}
+
+// ---- remembering
+
+/// Whether the search stands at a place for the first time; each other time it comes to what it came to then.
+bool QuickSearch::visit(const Place& place) {
+    constexpr std::uint32_t kOpenBefore = 0x80000000;  // parts from before it began to remember
+    const std::uint32_t call = known_->callOf(place.part);
+    const std::uint32_t inside = call == KnownReadings::kNone ? kOpenBefore | place.part : call;
+    return known_->visit(inside, place.node, place.low, place.high);
+}
+
+/// Goes on behind a call whose ends are known, at the first of them.
+bool QuickSearch::useKnown(Place& place, std::uint32_t call) {
+    const KnownReadings::Called& known = known_->called(call);
+    if (known.firstEnd == KnownReadings::kNone) return false;
+    // Nobody knows how deep it was in there.
+    gaveUp_ = place.depth > known.depth && place.depth - known.depth + deepest_ >= options_.maxDepth;
+    if (gaveUp_) return false;
+    const std::uint32_t next = known_->end(known.firstEnd).next;
+    if (next != KnownReadings::kNone) {
+        if (!visit(place)) return false;
+        addPoint<true>(place, next);
+    }
+    return comeBackWith(place, known.firstEnd);
+}
+
+/// The same at one of the ends.
+bool QuickSearch::comeBackWith(Place& place, std::uint32_t number) {
+    const NodeRow& node = table_.nodes[place.node];
+    const KnownReadings::End& end = known_->end(number);
+    ++steps_;
+    if (end.high == place.low && (node.flags & kNonEmpty)) return false;
+    known_->use(number, made_, place.part, place.node, place.low);
+    place.low = end.low;
+    place.high = end.high;
+    place.node = node.run;
+    return true;
+}
+
+bool QuickSearch::turnBackRemembering() {
+    while (!work_.points.empty()) {
+        Point& point = work_.points.back();
+        const std::size_t at = work_.points.size() - 1;
+        known_->complete(work_.callsAt[at]);
+        if (table_.nodes[point.place.node].op == Op::Choice) {
+            takeAgain(point);
+            work_.callsAt.resize(work_.points.size());
+            return true;
+        }
+        goBackTo(point);
+        const std::uint32_t end = point.mask;
+        point.mask = known_->end(end).next;
+        if (point.mask == KnownReadings::kNone) work_.points.pop_back();
+        work_.callsAt.resize(work_.points.size());
+        if (comeBackWith(place_, end)) return true;
+    }
+    return false;
 }
 
 }  // namespace zr::engine

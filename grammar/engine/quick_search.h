@@ -1,16 +1,20 @@
 #pragma once
 
 #include <cstdint>
+#include <memory>
 #include <vector>
 
 #include "grammar/engine/derivation.h"
+#include "grammar/engine/known_readings.h"
 #include "grammar/engine/options.h"
 #include "grammar/engine/tables.h"
 #include "grammar/engine/text_index.h"
 
 /// The search for plain text: it follows the first reading in written order and turns back to the last choice
-/// where that fails. It remembers nothing of what failed, so it costs little a token as long as it seldom
-/// turns back, and gives up where it does so often; the full search gives the same derivation then.
+/// where that fails. At first it remembers nothing of what failed, so it costs little a token as long as it
+/// seldom turns back. Where it goes astray it goes on in the same way, but remembers what each rule that it
+/// calls can come to. Where that takes many steps as well, it gives up; the full search gives the same
+/// derivation then.
 namespace zr::engine {
 
 class QuickSearch {
@@ -21,50 +25,79 @@ class QuickSearch {
         std::uint32_t part, depth;
         std::uint16_t node;
     };
-    /// A choice that has branches left, and how much had been written down there.
+    /// A choice that has branches left, and how much had been written down there; or a call that has known
+    /// ends left, and the next of them.
     struct Point {
         Place place;
         std::uint32_t mask, choices, parts;
     };
 
-    enum class Outcome { Found, GaveUp, TooDeep };
+    /// What it needs memory for that grows with the text.
+    struct Work {
+        std::vector<Point> points;
+        std::unique_ptr<KnownReadings> known;  ///< null until a text needs it
+        std::vector<std::uint32_t> callsAt;    ///< by point: calls known when it was come to
+        std::size_t capacity() const;
+    };
 
-    /// The table, the index, the derivation that is to be filled and the memory for the points must outlive
-    /// this object.
+    enum class Outcome {
+        Found,
+        NotFound,  ///< there is none
+        GaveUp,    ///< says nothing about the text
+        TooDeep
+    };
+
+    /// The table, the index, the derivation that is to be filled and the memory must outlive this object.
     QuickSearch(const ParserTable& table, TextIndex& text, const Options& options, Derivation& derivation,
-                std::vector<Point>& points)
-        : table_(table), text_(text), options_(options), made_(derivation), points_(points) {}
+                Work& work)
+        : table_(table), text_(text), options_(options), made_(derivation), work_(work) {}
 
-    /// Looks for a reading of the text by `rule` from `position` to its end. That it gave up says nothing
-    /// about the text.
+    /// Looks for a reading of the text by `rule` from `position` to its end.
     Outcome run(std::uint16_t rule, std::uint32_t position);
+    /// Where there is none: the furthest end that a reading has; KnownReadings::kNone where there is none at
+    /// all.
+    std::uint32_t furthestEnd() const { return furthestEnd_; }
 
-    /// Where a search that gave up can be taken up by another one: a choice from which on no reading was
-    /// found yet, while all that stand ahead of it in written order have failed. The derivation is cut there.
-    /// Null where so little was read ahead of it that it isn't worth that.
-    const Place* resting() const { return rests_ ? &place_ : nullptr; }
-
-    std::uint64_t steps() const { return steps_; }
+    std::uint64_t steps() const { return steps_ + (known_ != nullptr ? known_->steps() : 0); }
     /// What the search has to remember, as Options::maxMemo counts it.
-    std::size_t remembered() const { return made_.parts.size() + made_.choices.size() / 16 + points_.size(); }
+    std::size_t remembered() const {
+        return made_.parts.size() + made_.choices.size() / 16 + work_.points.size() +
+               (known_ != nullptr ? known_->bytes() / kMemoBytes : 0);
+    }
 
  private:
-    Outcome giveUp();
+    /// What Options::maxMemo reckons with for each thing that a search remembers.
+    static constexpr std::size_t kMemoBytes = 32;
+
+    Outcome runRemembering();
+    template <bool kRemembers>
     bool follow();
     bool turnBack();
+    bool turnBackRemembering();
+    void takeAgain(Point& point);
+    void goBackTo(const Point& point);
+    template <bool kRemembers>
+    void addPoint(const Place& place, std::uint32_t left);
     std::uint16_t take(const NodeRow& choice, std::uint32_t branch);
+    template <bool kRemembers>
     bool call(Place& place);
+    template <bool kRemembers>
     bool comeBack(Place& place);
+    bool visit(const Place& place);
+    bool useKnown(Place& place, std::uint32_t call);
+    bool comeBackWith(Place& place, std::uint32_t end);
 
     const ParserTable& table_;
     TextIndex& text_;
     const Options& options_;
     Derivation& made_;
-    std::vector<Point>& points_;
+    Work& work_;
     Place place_{};
-    bool rests_ = false;
+    std::uint32_t furthestEnd_ = KnownReadings::kNone;
+    KnownReadings* known_ = nullptr;  ///< while it remembers
+    std::uint32_t deepest_ = 0;
     std::uint64_t steps_ = 0;
-    bool tooDeep_ = false;
+    bool tooDeep_ = false, gaveUp_ = false;
 };
 
 }  // namespace zr::engine

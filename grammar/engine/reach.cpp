@@ -43,14 +43,12 @@ bool Reach::comesBack(std::uint16_t call, std::uint32_t position) const {
 
 // ---- forward
 
-bool Reach::goOn(std::uint16_t rule, std::uint16_t node, std::uint32_t position,
-                 std::span<const Called> inside, std::size_t most) {
+bool Reach::follow(std::uint16_t rule, std::uint32_t position, std::size_t most) {
     rule_ = rule;
     from_ = position;
     end_ = text_->count();
-    nodes_ = searchedFrom(*table_, table_->rules[rule].entry) < table_->statementStops
-                 ? table_->statementStops
-                 : table_->stops;
+    const std::uint16_t entry = searchedFrom(*table_, table_->rules[rule].entry);
+    nodes_ = entry < table_->statementStops ? table_->statementStops : table_->stops;
     words_ = (nodes_ + 63) / 64;
     met_.assign(words_, 0);
     open_.clear();  // a search that memory ran out for leaves some
@@ -66,8 +64,7 @@ bool Reach::goOn(std::uint16_t rule, std::uint16_t node, std::uint32_t position,
     kept_.clear();
     skips_.clear();
     ends_.clear();
-    for (const Called& each : inside) meetCall(each.call, each.position);
-    meet(node);
+    meet(entry);
     for (std::uint32_t p = position; p <= end_; ++p) {
         const std::size_t ahead = stepsFrom_.empty() ? 0 : stepsFrom_.back();
         beginPosition();
@@ -132,16 +129,6 @@ void Reach::pass(std::uint16_t at, std::uint32_t p) {
     }
 }
 
-/// Notes that a call is met: behind it everything goes on that its rule ends with from there on.
-void Reach::meetCall(std::uint16_t at, std::uint32_t p) {
-    if (metAt_[at] == kNone) {
-        const std::uint16_t rule = table_->nodes[at].arg;
-        callBefore_[at] = called_[rule];
-        called_[rule] = at;
-    }
-    metAt_[at] = p;
-}
-
 void Reach::passCall(std::uint16_t at, std::uint32_t p) {
     const NodeRow& call = table_->nodes[at];
     if (mayRecover(call, p)) {
@@ -149,7 +136,12 @@ void Reach::passCall(std::uint16_t at, std::uint32_t p) {
         if (recovery_.to == p) meet(call.run);
     }
     if (!mayCall(call, p)) return;
-    if (metAt_[at] == kNone) meetCall(at, p);
+    // Behind it everything goes on that its rule ends with from here on.
+    if (metAt_[at] == kNone) {
+        metAt_[at] = p;
+        callBefore_[at] = called_[call.arg];
+        called_[call.arg] = at;
+    }
     if (endedAt_[call.arg] == p && comesBack(at, p)) lead(endOf_[call.arg], call.run);
     // Whether a call leads on that need not take a token depends on what is behind it at the same position,
     // too.

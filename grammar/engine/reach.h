@@ -30,19 +30,8 @@ class Reach {
     /// Makes ready for a text; the table and the index must outlive what is done with them.
     void start(const ParserTable& table, TextIndex& text, const Recovery& recovery);
 
-    /// A call at work, and where it stands.
-    struct Called {
-        std::uint16_t call;
-        std::uint32_t position;
-        std::uint32_t part;  ///< of a derivation; for whoever asks
-    };
     /// Finds what `rule` can pass from `position` on; false where that takes more bytes than `most`.
-    bool follow(std::uint16_t rule, std::uint32_t position, std::size_t most) {
-        return goOn(rule, searchedFrom(*table_, table_->rules[rule].entry), position, {}, most);
-    }
-    /// The same from a node on inside calls, the innermost first, that `rule` came to ahead of `position`.
-    bool goOn(std::uint16_t rule, std::uint16_t node, std::uint32_t position, std::span<const Called> inside,
-              std::size_t most);
+    bool follow(std::uint16_t rule, std::uint32_t position, std::size_t most);
     /// Where the followed rule could end, in ascending order.
     const std::vector<std::uint32_t>& ends() const { return ends_; }
     /// Keeps what can lead to an end of the followed rule from `first` to `last`.
@@ -106,7 +95,6 @@ class Reach {
     }
     void pass(std::uint16_t node, std::uint32_t position);
     void passCall(std::uint16_t call, std::uint32_t position);
-    void meetCall(std::uint16_t call, std::uint32_t position);
     bool mayCall(const NodeRow& call, std::uint32_t position);
     bool mayBeEmpty(const NodeRow& call) const;
     bool comesBack(std::uint16_t call, std::uint32_t position) const;

@@ -22,8 +22,8 @@ Recogniser::~Recogniser() {
 
 std::size_t Recogniser::Work::bytes() const {
     return derivation.parts.capacity() * sizeof(Derivation::Part) +
-           derivation.choices.capacity() * sizeof(std::uint16_t) +
-           points.capacity() * sizeof(QuickSearch::Point) + (full ? full->capacity() : 0);
+           derivation.choices.capacity() * sizeof(std::uint16_t) + quick.capacity() +
+           (full ? full->capacity() : 0);
 }
 
 std::unique_ptr<Recogniser::Work>& Recogniser::spare() {
@@ -37,10 +37,16 @@ FullSearch& Recogniser::fullWork() {
 }
 
 Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
-    FullSearch::Outcome outcome = quickSearch(rule, position);
-    if (outcome == FullSearch::Outcome::NotFound) outcome = complete();
-    if (outcome == FullSearch::Outcome::NotFound) return fullSearch(rule, position, {});
-    return resultOf(outcome, text_.count());
+    using Quick = QuickSearch::Outcome;
+    QuickRun quick = quickSearch(rule, position);
+    if (quick.outcome == Quick::NotFound) {
+        if (quick.furthestEnd == KnownReadings::kNone) return {};
+        text_.cutAt(quick.furthestEnd);
+        quick = quickSearch(rule, position);
+    }
+    if (quick.outcome == Quick::Found) return resultOf(FullSearch::Outcome::Found, text_.count());
+    if (quick.outcome == Quick::TooDeep) return resultOf(FullSearch::Outcome::TooDeep, 0);
+    return fullSearch(rule, position, {});
 }
 
 Recogniser::Result Recogniser::resultOf(FullSearch::Outcome outcome, std::uint32_t end) {
@@ -52,27 +58,12 @@ Recogniser::Result Recogniser::resultOf(FullSearch::Outcome outcome, std::uint32
     return result;
 }
 
-/// Reads the text to its end, or doesn't find out how.
-FullSearch::Outcome Recogniser::quickSearch(std::uint16_t rule, std::uint32_t position) {
-    QuickSearch quick(*table_, text_, *options_, work_->derivation, work_->points);
-    const QuickSearch::Outcome outcome = quick.run(rule, position);
+Recogniser::QuickRun Recogniser::quickSearch(std::uint16_t rule, std::uint32_t position) {
+    QuickSearch quick(*table_, text_, *options_, work_->derivation, work_->quick);
+    const QuickRun run{quick.run(rule, position), quick.furthestEnd()};
     steps_ += quick.steps();
     remembered_ = std::max(remembered_, quick.remembered());
-    rests_ = {};
-    if (const QuickSearch::Place* const at = quick.resting()) rests_ = {at->part, at->node, at->low};
-    if (outcome == QuickSearch::Outcome::Found) return FullSearch::Outcome::Found;
-    return outcome == QuickSearch::Outcome::TooDeep ? FullSearch::Outcome::TooDeep
-                                                    : FullSearch::Outcome::NotFound;
-}
-
-/// What the quick search has read ahead of the place where it rests stands if it can be completed at all.
-FullSearch::Outcome Recogniser::complete() {
-    if (rests_.part == 0) return FullSearch::Outcome::NotFound;
-    FullSearch& full = fullWork();
-    const FullSearch::Outcome outcome = full.complete(*table_, text_, *options_, rests_, work_->derivation);
-    steps_ += full.steps();
-    remembered_ = std::max(remembered_, full.remembered());
-    return outcome == FullSearch::Outcome::OverBudget ? FullSearch::Outcome::NotFound : outcome;
+    return run;
 }
 
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
@@ -94,7 +85,8 @@ Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t posi
             if (full.furthest() < text_.count() && recovery.place == Reach::kNone) {
                 // What can't be read whole is often read quickly up to where that ends.
                 text_.cutAt(full.furthest());
-                outcome = quickSearch(rule, position);
+                if (quickSearch(rule, position).outcome == QuickSearch::Outcome::Found)
+                    outcome = FullSearch::Outcome::Found;
             }
         }
         std::uint32_t end = text_.count();

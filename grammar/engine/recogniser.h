@@ -50,7 +50,7 @@ class Recogniser {
     /// Gives back what only a search needs. Nothing can be run from here on; the derivation stays.
     void finish() {
         text_.release();
-        giveBack(work_->points);
+        giveBack(work_->quick.points);
     }
 
     /// Work done so far, in search steps; a benchmark figure.
@@ -63,7 +63,7 @@ class Recogniser {
     /// fresh memory for each text costs more than the search of a short one.
     struct Work {
         Derivation derivation;
-        std::vector<QuickSearch::Point> points;
+        QuickSearch::Work quick;
         std::unique_ptr<FullSearch> full;  ///< null until a text needs it
         std::size_t bytes() const;
     };
@@ -71,15 +71,17 @@ class Recogniser {
     static std::unique_ptr<Work>& spare();
 
     static Result resultOf(FullSearch::Outcome outcome, std::uint32_t end);
-    FullSearch::Outcome quickSearch(std::uint16_t rule, std::uint32_t position);
-    FullSearch::Outcome complete();
+    struct QuickRun {
+        QuickSearch::Outcome outcome;
+        std::uint32_t furthestEnd;
+    };
+    QuickRun quickSearch(std::uint16_t rule, std::uint32_t position);
     Result fullSearch(std::uint16_t rule, std::uint32_t position, const Reach::Recovery& recovery);
 
     const ParserTable* table_;
     const Options* options_;
     TextIndex text_;
     std::unique_ptr<Work> work_;
-    FullSearch::Place rests_{};  ///< where the quick search rests, if in a part
     std::uint64_t steps_ = 0;
     std::size_t remembered_ = 0;
 };

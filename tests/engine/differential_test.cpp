@@ -8,6 +8,7 @@
 #include <filesystem>
 #include <fstream>
 #include <tuple>
+#include <utility>
 
 #include "tests/engine/reference_recogniser.h"
 #include "tests/engine/sentence_source.h"
@@ -45,9 +46,10 @@ void compare(const Grammar& grammar, const std::u16string& text, Counts& counts,
         ++counts.recovered;
     else if (expected.taken == tokens.size())
         ++counts.whole;
-    for (const std::uint32_t quickSteps : {0, 1, 16})
-        EXPECT_EQ(grammar.readHandedOn(text, quickSteps).flat(), expected.tree.flat())
-            << quickSteps << " " << quoteJson(text);
+    // The full search alone; a quick one that remembers all, that remembers nothing, that soon gives up.
+    for (const auto& [quickSteps, rememberingSteps] : {std::pair{0, 0}, {1, 1000}, {16, 0}, {1, 1}})
+        EXPECT_EQ(grammar.readBounded(text, quickSteps, rememberingSteps).flat(), expected.tree.flat())
+            << quickSteps << " " << rememberingSteps << " " << quoteJson(text);
     EXPECT_EQ(found.statement.flat(), expected.tree.flat()) << quoteJson(text);
     if (expected.found && !expected.recovered) {
         EXPECT_EQ(found.taken, expected.taken) << quoteJson(text);

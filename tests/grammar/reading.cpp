@@ -202,18 +202,19 @@ const engine::GrammarTable& tables() {
 }
 
 template <typename G>
-SyntaxDump readHandedOn(std::u16string_view text, std::uint32_t quickSteps) {
+SyntaxDump readBounded(std::u16string_view text, std::uint32_t quickSteps, std::uint32_t rememberingSteps) {
     Reading reading;
     Pipeline<G> pipeline(text);
     engine::Options& options = optionsOf(pipeline.parser());
     options.quickSteps = quickSteps;
+    options.rememberingSteps = rememberingSteps;
     copyTree(pipeline.parser()->start_rule(pipeline.parser()).tree, reading);
     return reading.statement;
 }
 
 template <typename G>
 constexpr Grammar grammar(std::string_view corpus, const char* (*tokenName)(int)) {
-    return {corpus, tokenName, &lex<G>, &read<G>, &readAgain<G>, &tables<G>, &readHandedOn<G>};
+    return {corpus, tokenName, &lex<G>, &read<G>, &readAgain<G>, &tables<G>, &readBounded<G>};
 }
 
 #define ZR_GRAMMAR(NAME, CORPUS, STATEMENT_RULE)                                          \

@@ -43,9 +43,10 @@ struct Grammar {
     /// The same, with lexer, token stream and parser asked twice: what the second call returns.
     Reading (*readAgain)(std::u16string_view text);
     const engine::GrammarTable& (*tables)();
-    /// The statement's tree alone, with a quick search that gives up after so few steps: what hard texts come
-    /// to. With none the full search reads the whole; with a few it completes what the quick one has read.
-    SyntaxDump (*readHandedOn)(std::u16string_view text, std::uint32_t quickSteps);
+    /// The statement's tree alone, with these bounds on the quick search: what hard texts come to. With none
+    /// the full search reads the whole.
+    SyntaxDump (*readBounded)(std::u16string_view text, std::uint32_t quickSteps,
+                              std::uint32_t rememberingSteps);
 };
 
 /// Every test that is about all grammars goes over this list.
