@@ -86,6 +86,11 @@ void KnownReadings::use(std::uint32_t end, Derivation& derivation, std::uint32_t
 }
 
 void KnownReadings::fillIn(Derivation& derivation) {
+    // Nothing is looked up any more.
+    giveBack(visits_);
+    giveBack(calledAt_);
+    giveBack(called_);
+    giveBack(open_);
     Derivation filled;
     filled.rule = derivation.rule;
     // How much had come in ahead of each part.

@@ -17,6 +17,25 @@ LexedText::LexedText(const LexerTable& table, std::u16string_view text, const Op
         reportTooLong();
 }
 
+/// Up to here positions and indexes were the same.
+void LexedText::startHidden() {
+    hasHidden_ = true;
+    seen_.reserve(types_.capacity());
+    seen_.resize(count());
+    std::iota(seen_.begin(), seen_.end(), 0u);
+}
+
+inline void LexedText::add(const LexedToken& token) {
+    if (table_->rules[token.rule].hidden == 0) {
+        if (hasHidden_) seen_.push_back(count());
+        types_.push_back(token.type);
+    } else if (!hasHidden_) {
+        startHidden();
+    }
+    growSlowly(tokens_);
+    tokens_.push_back(token);
+}
+
 void LexedText::read(const Options& options) {
     // A guess that text as people write it rarely exceeds.
     constexpr std::size_t kUnitsOfToken = 5;
@@ -39,20 +58,6 @@ void LexedText::read(const Options& options) {
         add({offset(start), offset(match.end), table.rules[match.rule].token, match.rule});
         start = match.end;
     }
-}
-
-void LexedText::add(const LexedToken& token) {
-    if (table_->rules[token.rule].hidden == 0) {
-        if (hasHidden_) seen_.push_back(count());
-        types_.push_back(token.type);
-    } else if (!hasHidden_) {
-        // Up to here positions and indexes were the same.
-        hasHidden_ = true;
-        seen_.resize(count());
-        std::iota(seen_.begin(), seen_.end(), 0u);
-    }
-    growSlowly(tokens_);
-    tokens_.push_back(token);
 }
 
 std::u16string_view LexedText::textOf(std::uint32_t index) const {

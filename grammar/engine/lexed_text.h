@@ -48,6 +48,7 @@ class LexedText {
  private:
     void read(const Options& options);
     void add(const LexedToken& token);
+    void startHidden();
 
     const LexerTable* table_;
     std::u16string_view text_;

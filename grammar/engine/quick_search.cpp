@@ -51,6 +51,7 @@ QuickSearch::Outcome QuickSearch::runRemembering() {
         if (!turnBackRemembering()) return Outcome::NotFound;
     }
     made_.end(0, place_.low, place_.high);
+    giveBack(work_.points);
     known.fillIn(made_);
     return Outcome::Found;
 }

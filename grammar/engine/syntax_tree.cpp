@@ -14,11 +14,7 @@ class SyntaxTreeGrowth {
  public:
     using Node = SyntaxTree::Node;
 
-    explicit SyntaxTreeGrowth(const LexedText& text) : text_(text) {
-        // Most texts have one to two nodes for a token.
-        nodes_.reserve(text.seenCount() * std::size_t{7} / 4 + 8);
-        nodes_.resize(1);  // the place of the root
-    }
+    explicit SyntaxTreeGrowth(const LexedText& text) : text_(text) {}
 
     Node token(std::uint32_t position) const {
         return make(SyntaxTree::Kind::Token, text_.types()[position], text_.indexOf(position));
@@ -31,6 +27,7 @@ class SyntaxTreeGrowth {
         return make(SyntaxTree::Kind::Error, 0, 0);
     }
     void adopt(Node& root, const Node* children, std::uint32_t count) {
+        if (nodes_.empty()) start();
         root.firstChild = static_cast<SyntaxNode>(nodes_.size());
         root.childCount = count;
         growSlowly(nodes_, count);
@@ -43,11 +40,18 @@ class SyntaxTreeGrowth {
 
     /// All nodes of the tree; no more can be made then.
     std::vector<Node> whole(const Node& root) {
+        if (nodes_.empty()) start();
         nodes_[SyntaxTree::root()] = root;
         return std::move(nodes_);
     }
 
  private:
+    /// Takes memory with the first nodes: while a reading is looked for there are none.
+    void start() {
+        // Most texts have one to two nodes for a token.
+        nodes_.reserve(text_.seenCount() * std::size_t{7} / 4 + 8);
+        nodes_.resize(1);  // the place of the root
+    }
     static Node make(SyntaxTree::Kind kind, std::uint16_t type, std::uint32_t token) {
         return {token, 0, 0, 0, 0, type, kind};
     }
