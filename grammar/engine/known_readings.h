@@ -76,6 +76,8 @@ class KnownReadings {
     /// there before.
     bool visit(std::uint32_t inside, std::uint16_t node, std::uint32_t low, std::uint32_t high);
 
+    /// Whether calls have so many ends that to look at all readings at once costs less.
+    bool isManifold() const { return ends_.size() > kManyEnds * (called_.size() + kManyEnds); }
     /// What copying and comparing took so far, as search steps.
     std::uint64_t steps() const { return work_ / kItemsAStep; }
     /// The bytes that it needs, and those that it keeps.
@@ -101,6 +103,8 @@ class KnownReadings {
     };
     /// Copying so many items of a derivation, or comparing so many ends, takes as long as a step.
     static constexpr std::uint64_t kItemsAStep = 16;
+
+    static constexpr std::size_t kManyEnds = 8;
 
     bool insert(const Visit& visit);
     void copyOwn(const Derivation& derivation, std::uint32_t part, std::uint32_t low, std::uint32_t high);

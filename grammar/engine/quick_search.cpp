@@ -46,7 +46,8 @@ QuickSearch::Outcome QuickSearch::runRemembering() {
     work_.callsAt.assign(work_.points.size(), 0);
     while (!follow<true>()) {
         if (tooDeep_) return Outcome::TooDeep;
-        if (gaveUp_ || ++steps_ + known.steps() > bound || remembered() > options_.maxMemo)
+        if (gaveUp_ || known.isManifold() || ++steps_ + known.steps() > bound ||
+            remembered() > options_.maxMemo)
             return Outcome::GaveUp;
         if (!turnBackRemembering()) return Outcome::NotFound;
     }
@@ -168,8 +169,12 @@ inline bool QuickSearch::call(Place& place) {
 /// The rule at work is over: its caller goes on.
 template <bool kRemembers>
 inline bool QuickSearch::comeBack(Place& place) {
-    // What its caller does with an end is the same the second time.
-    if (kRemembers && !known_->addEnd(made_, place.part, place.low, place.high)) return false;
+    if constexpr (kRemembers) {
+        // Each of many levels can have many ends.
+        ++steps_;
+        // What its caller does with an end is the same the second time.
+        if (!known_->addEnd(made_, place.part, place.low, place.high)) return false;
+    }
     const Derivation::Part& part = made_.parts[place.part];
     const NodeRow& node = table_.nodes[part.node];
     if (place.high == part.position && (node.flags & kNonEmpty)) return false;
