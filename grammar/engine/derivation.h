@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <vector>
 
@@ -7,6 +8,9 @@
 
 /// How a derivation is written down: what a search leaves and the tree builder reads.
 namespace zr::engine {
+
+/// What a search has come to.
+enum class SearchOutcome { Found, NotFound, TooDeep, OverBudget };
 
 /// The choices and calls of a derivation, both in the order in which somebody who follows it from the first
 /// token on comes to them. All else is in the grammar.
@@ -25,6 +29,11 @@ struct Derivation {
     std::uint16_t rule = 0;              ///< of the whole
     std::vector<std::uint16_t> choices;  ///< the branch that is taken, see BranchRow
     std::vector<Part> parts;
+
+    /// The bytes of memory that it keeps.
+    std::size_t capacity() const {
+        return parts.capacity() * sizeof(Part) + choices.capacity() * sizeof(std::uint16_t);
+    }
 
     void start(std::uint16_t startRule, std::uint32_t position) {
         rule = startRule;

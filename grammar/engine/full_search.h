@@ -23,7 +23,7 @@ namespace zr::engine {
 
 class FullSearch {
  public:
-    enum class Outcome { Found, NotFound, TooDeep, OverBudget };
+    using Outcome = SearchOutcome;
 
     /// Looks how far `rule` can be read from `position`; false past the options' bounds. What the search
     /// remembers is kept for the next one. The table, the index and the options must outlive what follows.

@@ -17,10 +17,14 @@ void KnownReadings::start(std::size_t positions, std::size_t parts) {
     choices_.clear();
     parts_.clear();
     notes_.assign(parts, PartNote());
+    forgetVisits();
+    work_ = 0;
+}
+
+void KnownReadings::forgetVisits() {
     if (visits_.size() > kFewVisits) giveBack(visits_);
     visits_.assign(kFewVisits, Visit());
     visitCount_ = 0;
-    work_ = 0;
 }
 
 void KnownReadings::note(std::size_t part, const PartNote& note) {
@@ -85,8 +89,13 @@ void KnownReadings::use(std::uint32_t end, Derivation& derivation, std::uint32_t
     derivation.end(part, ends_[end].low, ends_[end].high);
 }
 
+void KnownReadings::startAgain() {
+    complete(0);
+    notes_.assign(1, PartNote());
+    forgetVisits();
+}
+
 void KnownReadings::fillIn(Derivation& derivation) {
-    // Nothing is looked up any more.
     giveBack(visits_);
     giveBack(calledAt_);
     giveBack(called_);

@@ -69,7 +69,9 @@ class KnownReadings {
     /// The number of the call that a part is, kNone where nothing is known of it.
     std::uint32_t callOf(std::uint32_t part) const { return notes_[part].call; }
 
-    /// Writes down what is in the parts that were used.
+    /// Another derivation is written down from here on, and what was tried may be tried again.
+    void startAgain();
+    /// Writes down what is in the parts that were used. Nothing can be looked up from here on.
     void fillIn(Derivation& derivation);
 
     /// Notes that a search stands at a node with several ways on, inside a call; false where it has been
@@ -106,6 +108,7 @@ class KnownReadings {
 
     static constexpr std::size_t kManyEnds = 8;
 
+    void forgetVisits();
     bool insert(const Visit& visit);
     void copyOwn(const Derivation& derivation, std::uint32_t part, std::uint32_t low, std::uint32_t high);
     void note(std::size_t part, const PartNote& note);

@@ -6,58 +6,89 @@
 #include "grammar/engine/grow.h"
 
 namespace zr::engine {
-
 std::size_t QuickSearch::Work::capacity() const {
     return points.capacity() * sizeof(Point) + (known ? known->capacity() : 0) +
            callsAt.capacity() * sizeof(std::uint32_t);
 }
 
 QuickSearch::Outcome QuickSearch::run(std::uint16_t rule, std::uint32_t position) {
-    if (options_.quickSteps == 0) return Outcome::GaveUp;
-    made_.start(rule, position);
-    work_.points.clear();
-    place_ = {position, position, 0, 1, searchedFrom(table_, table_.rules[rule].entry)};
+    if (options_.quickSteps == 0) return Outcome::OverBudget;
+    rule_ = rule;
+    from_ = position;
+    goal_ = text_.count();
+    start();
     std::uint32_t furthest = position;
     std::uint64_t bound = options_.quickSteps;
-    while (!follow<false>()) {
+    while (!follow<false>() || !isWhole()) {
         if (tooDeep_) return Outcome::TooDeep;
         // A way that fails is followed by one that gets further, or there is more wrong.
         if (place_.low > furthest) {
             furthest = place_.low;
             bound = steps_ + options_.quickSteps;
         }
-        if (remembered() > options_.maxMemo) return Outcome::GaveUp;
-        if (!turnBack()) return Outcome::NotFound;
+        if (remembered() > options_.maxMemo) return Outcome::OverBudget;
+        if (!turnBack()) return readAgain();
         if (++steps_ > bound) return runRemembering();
     }
-    if (remembered() > options_.maxMemo) return Outcome::GaveUp;
-    made_.end(0, place_.low, place_.high);
-    return Outcome::Found;
+    return remembered() > options_.maxMemo ? Outcome::OverBudget : writeEnd();
+}
+
+void QuickSearch::start() {
+    made_.start(rule_, from_);
+    work_.points.clear();
+    place_ = {from_, from_, 0, 1, searchedFrom(table_, table_.rules[rule_].entry)};
+}
+
+/// Whether a reading gets to its goal; notes where it ends instead.
+bool QuickSearch::isWhole() {
+    if (place_.high != goal_) {
+        end_ = hasEnd_ ? std::max(end_, place_.high) : place_.high;
+        hasEnd_ = true;
+    }
+    return place_.high == goal_;
 }
 
 /// Goes on from where the search stands.
 QuickSearch::Outcome QuickSearch::runRemembering() {
     const std::uint64_t bound = steps_ + options_.rememberingSteps * (std::uint64_t{text_.count()} + 16);
-    if (bound == steps_) return Outcome::GaveUp;
+    if (bound == steps_) return Outcome::OverBudget;
     if (!work_.known) work_.known = std::make_unique<KnownReadings>();
     KnownReadings& known = *work_.known;
     known_ = &known;
     known.start(std::size_t{text_.count()} + 1, made_.parts.size());
     work_.callsAt.assign(work_.points.size(), 0);
-    while (!follow<true>()) {
+    while (!follow<true>() || !isWhole()) {
         if (tooDeep_) return Outcome::TooDeep;
         if (gaveUp_ || known.isManifold() || ++steps_ + known.steps() > bound ||
             remembered() > options_.maxMemo)
-            return Outcome::GaveUp;
-        if (!turnBackRemembering()) return Outcome::NotFound;
+            return Outcome::OverBudget;
+        if (!turnBackRemembering()) return readAgain();
     }
+    return writeEnd();
+}
+
+/// No reading gets to the goal, so that is now where one got to that got furthest. What was known of the text
+/// still is.
+QuickSearch::Outcome QuickSearch::readAgain() {
+    if (!hasEnd_) return Outcome::NotFound;
+    goal_ = end_;
+    start();
+    work_.callsAt.clear();
+    if (known_ != nullptr) known_->startAgain();
+    while (known_ == nullptr ? !follow<false>() || !isWhole() : !follow<true>() || !isWhole())
+        if (gaveUp_ || !(known_ == nullptr ? turnBack() : turnBackRemembering())) return Outcome::OverBudget;
+    return writeEnd();
+}
+
+/// What was found is written down to its end.
+QuickSearch::Outcome QuickSearch::writeEnd() {
     made_.end(0, place_.low, place_.high);
     giveBack(work_.points);
-    known.fillIn(made_);
+    if (known_ != nullptr) known_->fillIn(made_);
     return Outcome::Found;
 }
 
-/// Goes on until the whole is read, which gives true, or a way fails.
+/// Goes on until the whole rule is over, which gives true, or a way fails.
 template <bool kRemembers>
 bool QuickSearch::follow() {
     Place here = place_;
@@ -85,9 +116,7 @@ bool QuickSearch::follow() {
             case Op::End:
                 if (here.part == 0) {
                     place_ = here;
-                    if (furthestEnd_ == KnownReadings::kNone || here.high > furthestEnd_)
-                        furthestEnd_ = here.high;
-                    return here.high == text_.count();
+                    return true;
                 }
                 goesOn = comeBack<kRemembers>(here);
                 break;

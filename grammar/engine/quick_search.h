@@ -40,23 +40,19 @@ class QuickSearch {
         std::size_t capacity() const;
     };
 
-    enum class Outcome {
-        Found,
-        NotFound,  ///< there is none
-        GaveUp,    ///< says nothing about the text
-        TooDeep
-    };
+    /// NotFound where the rule can't be read from there; OverBudget says nothing about the text.
+    using Outcome = SearchOutcome;
 
     /// The table, the index, the derivation that is to be filled and the memory must outlive this object.
     QuickSearch(const ParserTable& table, TextIndex& text, const Options& options, Derivation& derivation,
                 Work& work)
         : table_(table), text_(text), options_(options), made_(derivation), work_(work) {}
 
-    /// Looks for a reading of the text by `rule` from `position` to its end.
+    /// Looks for the reading of the text by `rule` from `position` that gets furthest, and writes its
+    /// derivation down.
     Outcome run(std::uint16_t rule, std::uint32_t position);
-    /// Where there is none: the furthest end that a reading has; KnownReadings::kNone where there is none at
-    /// all.
-    std::uint32_t furthestEnd() const { return furthestEnd_; }
+    /// Where what was found ends.
+    std::uint32_t end() const { return goal_; }
 
     std::uint64_t steps() const { return steps_ + (known_ != nullptr ? known_->steps() : 0); }
     /// What the search has to remember, as Options::maxMemo counts it.
@@ -70,6 +66,10 @@ class QuickSearch {
     static constexpr std::size_t kMemoBytes = 32;
 
     Outcome runRemembering();
+    Outcome readAgain();
+    Outcome writeEnd();
+    void start();
+    bool isWhole();
     template <bool kRemembers>
     bool follow();
     bool turnBack();
@@ -93,7 +93,11 @@ class QuickSearch {
     Derivation& made_;
     Work& work_;
     Place place_{};
-    std::uint32_t furthestEnd_ = KnownReadings::kNone;
+    std::uint16_t rule_ = 0;
+    std::uint32_t from_ = 0, goal_ = 0;  ///< where a reading starts and must end
+    /// The furthest end ahead of the goal, and whether there was one.
+    std::uint32_t end_ = 0;
+    bool hasEnd_ = false;
     KnownReadings* known_ = nullptr;  ///< while it remembers
     std::uint32_t deepest_ = 0;
     std::uint64_t steps_ = 0;

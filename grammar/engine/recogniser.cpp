@@ -21,9 +21,7 @@ Recogniser::~Recogniser() {
 }
 
 std::size_t Recogniser::Work::bytes() const {
-    return derivation.parts.capacity() * sizeof(Derivation::Part) +
-           derivation.choices.capacity() * sizeof(std::uint16_t) + quick.capacity() +
-           (full ? full->capacity() : 0);
+    return derivation.capacity() + quick.capacity() + (full ? full->capacity() : 0);
 }
 
 std::unique_ptr<Recogniser::Work>& Recogniser::spare() {
@@ -37,33 +35,26 @@ FullSearch& Recogniser::fullWork() {
 }
 
 Recogniser::Result Recogniser::run(std::uint16_t rule, std::uint32_t position) {
-    using Quick = QuickSearch::Outcome;
-    QuickRun quick = quickSearch(rule, position);
-    if (quick.outcome == Quick::NotFound) {
-        if (quick.furthestEnd == KnownReadings::kNone) return {};
-        text_.cutAt(quick.furthestEnd);
-        quick = quickSearch(rule, position);
-    }
-    if (quick.outcome == Quick::Found) return resultOf(FullSearch::Outcome::Found, text_.count());
-    if (quick.outcome == Quick::TooDeep) return resultOf(FullSearch::Outcome::TooDeep, 0);
-    return fullSearch(rule, position, {});
+    const QuickRun quick = quickSearch(rule, position);
+    return quick.outcome == SearchOutcome::OverBudget ? fullSearch(rule, position, {})
+                                                      : resultOf(quick.outcome, quick.end);
 }
 
-Recogniser::Result Recogniser::resultOf(FullSearch::Outcome outcome, std::uint32_t end) {
+Recogniser::Result Recogniser::resultOf(SearchOutcome outcome, std::uint32_t end) {
     Result result;
-    result.overLimit = outcome == FullSearch::Outcome::TooDeep;
-    result.overBudget = outcome == FullSearch::Outcome::OverBudget;
-    result.found = outcome == FullSearch::Outcome::Found;
+    result.overLimit = outcome == SearchOutcome::TooDeep;
+    result.overBudget = outcome == SearchOutcome::OverBudget;
+    result.found = outcome == SearchOutcome::Found;
     if (result.found) result.high = end;
     return result;
 }
 
 Recogniser::QuickRun Recogniser::quickSearch(std::uint16_t rule, std::uint32_t position) {
     QuickSearch quick(*table_, text_, *options_, work_->derivation, work_->quick);
-    const QuickRun run{quick.run(rule, position), quick.furthestEnd()};
+    const SearchOutcome outcome = quick.run(rule, position);
     steps_ += quick.steps();
     remembered_ = std::max(remembered_, quick.remembered());
-    return run;
+    return {outcome, quick.end()};
 }
 
 Recogniser::Result Recogniser::recover(std::uint16_t rule, std::uint32_t position) {
@@ -79,24 +70,27 @@ Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t posi
     FullSearch& full = fullWork();
     bool overBudget = false;
     for (;;) {
-        FullSearch::Outcome outcome = FullSearch::Outcome::OverBudget;
+        SearchOutcome outcome = SearchOutcome::OverBudget;
+        std::uint32_t end = text_.count();
         if (full.look(*table_, text_, *options_, recovery, rule, position)) {
-            outcome = FullSearch::Outcome::NotFound;
+            outcome = SearchOutcome::NotFound;
             if (full.furthest() < text_.count() && recovery.place == Reach::kNone) {
                 // What can't be read whole is often read quickly up to where that ends.
                 text_.cutAt(full.furthest());
-                if (quickSearch(rule, position).outcome == QuickSearch::Outcome::Found)
-                    outcome = FullSearch::Outcome::Found;
+                const QuickRun quick = quickSearch(rule, position);
+                if (quick.outcome == SearchOutcome::Found) {
+                    outcome = SearchOutcome::Found;
+                    end = quick.end;
+                }
             }
         }
-        std::uint32_t end = text_.count();
-        if (outcome == FullSearch::Outcome::NotFound) {
+        if (outcome == SearchOutcome::NotFound) {
             outcome = full.read(rule, position, work_->derivation);
             end = full.reached();
         }
         steps_ += full.steps();
         remembered_ = std::max(remembered_, full.remembered());
-        if (outcome == FullSearch::Outcome::OverBudget && text_.count() > position) {
+        if (outcome == SearchOutcome::OverBudget && text_.count() > position) {
             overBudget = true;
             text_.cutAt(position + (text_.count() - position) / 2);
             continue;

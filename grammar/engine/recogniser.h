@@ -6,7 +6,6 @@
 
 #include "grammar/engine/derivation.h"
 #include "grammar/engine/full_search.h"
-#include "grammar/engine/grow.h"
 #include "grammar/engine/options.h"
 #include "grammar/engine/quick_search.h"
 #include "grammar/engine/tables.h"
@@ -48,10 +47,7 @@ class Recogniser {
     const Derivation& derivation() const { return work_->derivation; }
 
     /// Gives back what only a search needs. Nothing can be run from here on; the derivation stays.
-    void finish() {
-        text_.release();
-        giveBack(work_->quick.points);
-    }
+    void finish() { text_.release(); }
 
     /// Work done so far, in search steps; a benchmark figure.
     std::uint64_t steps() const { return steps_; }
@@ -70,10 +66,10 @@ class Recogniser {
     FullSearch& fullWork();
     static std::unique_ptr<Work>& spare();
 
-    static Result resultOf(FullSearch::Outcome outcome, std::uint32_t end);
+    static Result resultOf(SearchOutcome outcome, std::uint32_t end);
     struct QuickRun {
-        QuickSearch::Outcome outcome;
-        std::uint32_t furthestEnd;
+        SearchOutcome outcome;
+        std::uint32_t end;
     };
     QuickRun quickSearch(std::uint16_t rule, std::uint32_t position);
     Result fullSearch(std::uint16_t rule, std::uint32_t position, const Reach::Recovery& recovery);
