@@ -58,10 +58,28 @@ class LexerDeadEnds {
     std::uint32_t count_ = 0, noted_ = 0;
 };
 
+/// The longest match where the automaton stops behind a whole token after a few units, as it nearly always
+/// does: no place that it passes on its way needs to be noted. No rule else.
+inline LexerMatch shortMatch(const LexerTable& table, const char16_t* at, const char16_t* end) {
+    constexpr std::ptrdiff_t kFewUnits = 32;
+    const char16_t* const start = at;
+    const char16_t* const few = end - at > kFewUnits ? at + kFewUnits : end;
+    const std::uint16_t* const next = table.next;
+    const std::size_t classes = table.classes;
+    std::uint16_t state = 0;
+    for (; at < few; ++at) {
+        const std::uint16_t to = next[state * classes + lexerClassOf(table, *at)];
+        if (to == kNone16) return {at == start ? kNone16 : table.accept[state], at};
+        state = to;
+    }
+    return {at == end && at != start ? table.accept[state] : kNone16, at};
+}
+
 /// The longest match over all rules at `at`, the first rule of equal ones. The dead ends are those of the
 /// text.
 inline LexerMatch longestMatch(const LexerTable& table, const char16_t* at, const char16_t* end,
                                LexerDeadEnds& deadEnds) {
+    if (const LexerMatch match = shortMatch(table, at, end); match.rule != kNone16) return match;
     LexerMatch best{kNone16, at};
     const char16_t* const start = at;
     const std::uint16_t* const next = table.next;

@@ -36,6 +36,7 @@ QuickSearch::Outcome QuickSearch::run(std::uint16_t rule, std::uint32_t position
 void QuickSearch::start() {
     made_.start(rule_, from_);
     work_.points.clear();
+    work_.points.reserve(text_.count() - from_ + std::size_t{8});
     place_ = {from_, from_, 0, 1, searchedFrom(table_, table_.rules[rule_].entry)};
 }
 
