@@ -3,6 +3,8 @@
 #include <zrparsersql/recognizers/MSAccessSQL_v3_tokens.h>
 
 #include <algorithm>
+#include <array>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -173,7 +175,16 @@ void MSAccessSQL_v3StateSelectQuery::collectTable(CZRSQLTree* node) {
 
 CString MSAccessSQL_v3StateSelectQuery::fieldKey(const CFieldObject& field) const {
     // A column may stand twice: as what an AS names, and plain.
-    return field.m_table + field.m_field + (field.m_aliasTarget ? u"_1" : u"_0");
+    const std::u16string_view suffix = field.m_aliasTarget ? u"_1" : u"_0";
+    const std::u16string_view table = field.m_table.View(), name = field.m_field.View();
+    // Every column comes here twice: one string is made of the three, not two.
+    std::array<char16_t, 128> units;
+    if (table.size() + name.size() + suffix.size() > units.size())
+        return field.m_table + field.m_field + suffix;
+    char16_t* end = units.data();
+    for (const std::u16string_view each : {table, name, suffix})
+        end = std::copy(each.begin(), each.end(), end);
+    return CString(std::u16string_view(units.data(), static_cast<std::size_t>(end - units.data())));
 }
 
 // --------------------------------------------------------------------------------------------------- clauses
