@@ -6,6 +6,7 @@
 #include "grammar/engine/grow.h"
 
 namespace zr::engine {
+
 std::size_t QuickSearch::Work::capacity() const {
     return points.capacity() * sizeof(Point) + (known ? known->capacity() : 0) +
            callsAt.capacity() * sizeof(std::uint32_t);
@@ -36,7 +37,9 @@ QuickSearch::Outcome QuickSearch::run(std::uint16_t rule, std::uint32_t position
 void QuickSearch::start() {
     made_.start(rule_, from_);
     work_.points.clear();
-    work_.points.reserve(text_.count() - from_ + std::size_t{8});
+    // A short text takes memory once; a long one may need little of what its length tells.
+    constexpr std::uint32_t kShortText = 256;
+    work_.points.reserve(std::min(text_.count() - from_, kShortText) + std::size_t{8});
     place_ = {from_, from_, 0, 1, searchedFrom(table_, table_.rules[rule_].entry)};
 }
 
@@ -76,8 +79,9 @@ QuickSearch::Outcome QuickSearch::readAgain() {
     start();
     work_.callsAt.clear();
     if (known_ != nullptr) known_->startAgain();
-    while (known_ == nullptr ? !follow<false>() || !isWhole() : !follow<true>() || !isWhole())
-        if (gaveUp_ || !(known_ == nullptr ? turnBack() : turnBackRemembering())) return Outcome::OverBudget;
+    const bool remembers = known_ != nullptr;
+    while (!(remembers ? follow<true>() : follow<false>()) || !isWhole())
+        if (gaveUp_ || !(remembers ? turnBackRemembering() : turnBack())) return Outcome::OverBudget;
     return writeEnd();
 }
 

@@ -99,9 +99,10 @@ class QuickSearch {
     std::uint32_t end_ = 0;
     bool hasEnd_ = false;
     KnownReadings* known_ = nullptr;  ///< while it remembers
-    std::uint32_t deepest_ = 0;
+    std::uint32_t deepest_ = 0;       ///< call that it remembers
     std::uint64_t steps_ = 0;
-    bool tooDeep_ = false, gaveUp_ = false;
+    bool tooDeep_ = false;
+    bool gaveUp_ = false;  ///< what it remembers may be too deep where it is to be used
 };
 
 }  // namespace zr::engine

@@ -78,10 +78,8 @@ Recogniser::Result Recogniser::fullSearch(std::uint16_t rule, std::uint32_t posi
                 // What can't be read whole is often read quickly up to where that ends.
                 text_.cutAt(full.furthest());
                 const QuickRun quick = quickSearch(rule, position);
-                if (quick.outcome == SearchOutcome::Found) {
-                    outcome = SearchOutcome::Found;
-                    end = quick.end;
-                }
+                if (quick.outcome != SearchOutcome::OverBudget) outcome = quick.outcome;
+                end = quick.end;
             }
         }
         if (outcome == SearchOutcome::NotFound) {

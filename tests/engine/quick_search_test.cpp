@@ -74,6 +74,8 @@ TEST(QuickSearch, TakesStepsInProportionToTheText) {
     const auto text = [](std::size_t items) {
         return u"SELECT a" + repeated(u", t.b x, ABS(c) y", items) + u" FROM t WHERE a = 1 x";
     };
+    EXPECT_EQ(readQuickly("mssql", text(50), rememberingAtOnce(0)).outcome, SearchOutcome::OverBudget)
+        << "nothing to remember";
     const QuickReading few = readQuickly("mssql", text(50), rememberingAtOnce(1000));
     const QuickReading many = readQuickly("mssql", text(5000), rememberingAtOnce(1000));
     EXPECT_EQ(few.outcome, SearchOutcome::Found);
