@@ -1,192 +1,148 @@
 #include "grammar/engine/known_readings.h"
 
-#include "grammar/engine/grow.h"
+#include <algorithm>
+#include <bit>
 
 namespace zr::engine {
 namespace {
 
-constexpr std::size_t kFewVisits = 64;
+/// Places where a search has been, to begin with, for each token; more only where it has been at more.
+constexpr std::size_t kVisitsAToken = 1;
+constexpr std::size_t kFewVisits = 4096;
 
 }  // namespace
 
-void KnownReadings::start(std::size_t positions, std::size_t parts) {
+void KnownReadings::start(std::size_t positions) {
     calledAt_.assign(positions, kNone);
     called_.clear();
     open_.clear();
     ends_.clear();
-    choices_.clear();
-    parts_.clear();
-    notes_.assign(parts, PartNote());
+    olderEnds_.clear();
+    stepCount_ = 1;
     forgetVisits();
-    work_ = 0;
+    compared_ = 0;
 }
 
 void KnownReadings::forgetVisits() {
-    if (visits_.size() > kFewVisits) giveBack(visits_);
-    visits_.assign(kFewVisits, Visit());
+    const std::size_t size = std::bit_ceil(std::min(calledAt_.size() * kVisitsAToken, kFewVisits));
+    if (visits_.size() > size) giveBack(visits_);
+    visits_.assign(size, Visit());
     visitCount_ = 0;
 }
 
-void KnownReadings::note(std::size_t part, const PartNote& note) {
-    notes_.resize(part);  // those of parts that are gone
-    notes_.push_back(note);
-}
-
-void KnownReadings::add(const Derivation& derivation, std::uint16_t rule, std::uint32_t depth) {
-    const std::size_t part = derivation.parts.size() - 1;
+std::uint32_t KnownReadings::add(std::uint16_t rule, std::uint32_t position, const Caller& caller,
+                                 std::uint32_t depth) {
     const std::uint32_t number = calledCount();
-    std::uint32_t& latest = calledAt_[derivation.parts[part].position];
-    note(part, {number, kNone, static_cast<std::uint32_t>(derivation.choices.size()), false});
+    std::uint32_t& latest = calledAt_[position];
+    growSlowly(called_);
+    called_.push_back({caller, position, kNone, kNone, latest, depth, 0, rule, false});
     open_.push_back(number);
-    called_.push_back({kNone, kNone, latest, depth, rule, false});
     latest = number;
+    return number;
 }
 
-bool KnownReadings::addEnd(const Derivation& derivation, std::uint32_t part, std::uint32_t low,
-                           std::uint32_t high) {
-    PartNote& note = notes_[part];
-    if (note.call == kNone) return true;
-    Called& called = called_[note.call];
-    for (std::uint32_t end = called.firstEnd; end != kNone; end = ends_[end].next, ++work_)
-        if (ends_[end].low == low && ends_[end].high == high) return false;
-    note.end = static_cast<std::uint32_t>(ends_.size());
-    (called.lastEnd == kNone ? called.firstEnd : ends_[called.lastEnd].next) = note.end;
-    called.lastEnd = note.end;
-    copyOwn(derivation, part, low, high);
-    return true;
-}
-
-/// Keeps a part's own choices, those in between the parts that it calls, and the ends of these.
-void KnownReadings::copyOwn(const Derivation& derivation, std::uint32_t part, std::uint32_t low,
-                            std::uint32_t high) {
-    const auto firstChoice = static_cast<std::uint32_t>(choices_.size());
-    const auto firstPart = static_cast<std::uint32_t>(parts_.size());
-    const auto choiceCount = static_cast<std::uint32_t>(derivation.choices.size());
-    const auto partCount = static_cast<std::uint32_t>(derivation.parts.size());
-    std::uint32_t choice = notes_[part].choices;
-    for (std::uint32_t i = part + 1;;) {
-        const std::uint32_t to = i < partCount ? notes_[i].choices : choiceCount;
-        for (; choice < to; ++choice) choices_.push_back(derivation.choices[choice]);
-        if (i >= partCount) break;
-        const Derivation::Part& inner = derivation.parts[i];
-        parts_.push_back({notes_[i].end, inner.position,
-                          static_cast<std::uint32_t>(choices_.size()) - firstChoice, inner.node});
-        choice = inner.choices;
-        i = inner.parts;
-    }
-    const auto choices = static_cast<std::uint32_t>(choices_.size()) - firstChoice;
-    const auto parts = static_cast<std::uint32_t>(parts_.size()) - firstPart;
-    ends_.push_back({low, high, kNone, firstChoice, choices, firstPart, parts});
-    work_ += choices + parts;
-}
-
-void KnownReadings::use(std::uint32_t end, Derivation& derivation, std::uint32_t outer, std::uint16_t node,
-                        std::uint32_t position) {
-    const auto part = static_cast<std::uint32_t>(derivation.parts.size());
-    note(part, {kNone, end, static_cast<std::uint32_t>(derivation.choices.size()), true});
-    growSlowly(derivation.parts);
-    derivation.parts.push_back({outer, position, 0, 0, 0, 0, node, false});
-    derivation.end(part, ends_[end].low, ends_[end].high);
+std::uint32_t KnownReadings::addEnd(std::uint32_t call, std::uint32_t low, std::uint32_t high,
+                                    std::uint32_t last) {
+    Called& called = called_[call];
+    const std::uint32_t seen = std::uint32_t{1} << (low % 32);
+    if (called.endsSeen & seen)
+        for (std::uint32_t end = called.firstEnd; end != kNone; end = ends_[end].next, ++compared_)
+            if (ends_[end].low == low && ends_[end].high == high) return kNone;
+    called.endsSeen |= seen;
+    const auto number = static_cast<std::uint32_t>(ends_.size());
+    (called.lastEnd == kNone ? called.firstEnd : ends_[called.lastEnd].next) = number;
+    called.lastEnd = number;
+    growSlowly(ends_);
+    ends_.push_back({called.position, low, high, kNone, last});
+    return number;
 }
 
 void KnownReadings::startAgain() {
     complete(0);
-    notes_.assign(1, PartNote());
     forgetVisits();
 }
 
-void KnownReadings::fillIn(Derivation& derivation) {
+void KnownReadings::write(std::uint32_t last, std::uint32_t part, Derivation& derivation) {
     giveBack(visits_);
     giveBack(calledAt_);
     giveBack(called_);
     giveBack(open_);
-    Derivation filled;
-    filled.rule = derivation.rule;
-    // How much had come in ahead of each part.
-    std::vector<std::uint32_t> partsIn{0}, choicesIn{0};
-    std::uint32_t choice = 0;
-    for (std::uint32_t i = 0; i < derivation.parts.size(); ++i) {
-        Derivation::Part part = derivation.parts[i];
-        part.outer += partsIn[part.outer];
-        filled.parts.push_back(part);
-        if (notes_[i].isKnown) {
-            filled.choices.insert(filled.choices.end(), derivation.choices.begin() + choice,
-                                  derivation.choices.begin() + notes_[i].choices);
-            choice = notes_[i].choices;
-            fillIn(notes_[i].end, static_cast<std::uint32_t>(filled.parts.size()) - 1, filled);
-        }
-        partsIn.push_back(static_cast<std::uint32_t>(filled.parts.size()) - i - 1);
-        choicesIn.push_back(static_cast<std::uint32_t>(filled.choices.size()) - choice);
-    }
-    filled.choices.insert(filled.choices.end(), derivation.choices.begin() + choice,
-                          derivation.choices.end());
-    for (std::uint32_t i = 0; i < derivation.parts.size(); ++i) {
-        Derivation::Part& part = filled.parts[i + partsIn[i]];
-        const std::uint32_t behind = derivation.parts[i].parts;
-        part.parts = behind + partsIn[behind];
-        part.choices = derivation.parts[i].choices + choicesIn[behind];
-    }
-    derivation.choices.swap(filled.choices);
-    derivation.parts.swap(filled.parts);
-}
-
-/// Writes down what is in a part that was written down last.
-void KnownReadings::fillIn(std::uint32_t number, std::uint32_t part, Derivation& derivation) {
-    filled_.assign(1, {number, part, 0, 0});
-    while (!filled_.empty()) {
-        Filled& at = filled_.back();
-        const End& end = ends_[at.end];
-        const bool isLast = at.nextPart == end.parts;
-        const std::uint32_t to = isLast ? end.choices : parts_[end.firstPart + at.nextPart].choices;
-        const auto choices = choices_.begin() + end.firstChoice;
-        derivation.choices.insert(derivation.choices.end(), choices + at.nextChoice, choices + to);
-        at.nextChoice = to;
-        if (isLast) {
-            derivation.end(at.part, end.low, end.high);
-            filled_.pop_back();
+    toWrite_.clear();
+    addToWrite(last);
+    const auto endPart = [&](std::uint32_t low, std::uint32_t high) {
+        derivation.end(part, low, high);
+        part = derivation.parts[part].outer;
+    };
+    while (!toWrite_.empty()) {
+        const std::uint32_t next = toWrite_.back();
+        toWrite_.pop_back();
+        if (next & kPartEnds) {
+            const End& end = ends_[next & ~kPartEnds];
+            endPart(end.low, end.high);
             continue;
         }
-        const Part& inner = parts_[end.firstPart + at.nextPart++];
-        const auto next = static_cast<std::uint32_t>(derivation.parts.size());
-        derivation.parts.push_back({at.part, inner.position, 0, 0, 0, 0, inner.node, false});
-        filled_.push_back({inner.end, next, 0, 0});
+        const std::uint32_t value = steps_[next] & ~kWord;
+        switch (steps_[next] & kWord) {
+            case kChoice:
+                derivation.choices.push_back(static_cast<std::uint16_t>(value));
+                break;
+            case kEndOfOlder:
+                endPart(olderEnds_[value].low, olderEnds_[value].high);
+                break;
+            default: {
+                const std::uint32_t number = steps_[next - 1];
+                const End& end = ends_[number];
+                growSlowly(derivation.parts);
+                derivation.parts.push_back(
+                    {part, end.position, 0, 0, 0, 0, static_cast<std::uint16_t>(value), false});
+                part = static_cast<std::uint32_t>(derivation.parts.size() - 1);
+                toWrite_.push_back(kPartEnds | number);
+                addToWrite(end.last);
+            }
+        }
     }
+    giveBack(toWrite_);
 }
 
-bool KnownReadings::visit(std::uint32_t inside, std::uint16_t node, std::uint32_t low, std::uint32_t high) {
-    if (!insert({inside, low, high, node})) return false;
-    if (++visitCount_ * 2 <= visits_.size()) return true;
+/// The first step of a way comes to stand behind all others.
+void KnownReadings::addToWrite(std::uint32_t last) {
+    for (std::uint32_t step = last; step != kNone; step = stepBefore(step)) toWrite_.push_back(step);
+}
+
+void KnownReadings::growSteps() {
+    growSlowly(steps_, kStepWords);
+    steps_.resize(steps_.capacity());
+}
+
+void KnownReadings::growVisits() {
     std::vector<Visit> old(visits_.size() * 2);
     old.swap(visits_);
     for (const Visit& each : old)
-        if (each.inside != kNone) insert(each);
-    return true;
+        if (each != Visit()) insert(each);
 }
 
 bool KnownReadings::insert(const Visit& visit) {
     // Multiplicative hashing (Knuth, The Art of Computer Programming 3, 6.4).
-    std::uint64_t hash = (std::uint64_t{visit.inside} << 32 | visit.low) * 0x9E3779B97F4A7C15u;
-    hash = (hash ^ (std::uint64_t{visit.high - visit.low} << 16 | visit.node)) * 0x9E3779B97F4A7C15u;
+    std::uint64_t hash = visit.where * 0x9E3779B97F4A7C15u;
+    hash = (hash ^ visit.what) * 0x9E3779B97F4A7C15u;
     const std::size_t mask = visits_.size() - 1;
     for (std::size_t at = (hash >> 32) & mask;; at = (at + 1) & mask) {
         if (visits_[at] == visit) return false;
-        if (visits_[at].inside != kNone) continue;
+        if (visits_[at] != Visit()) continue;
         visits_[at] = visit;
         return true;
     }
 }
 
 std::size_t KnownReadings::bytes() const {
-    return called_.size() * sizeof(Called) + ends_.size() * sizeof(End) +
-           choices_.size() * sizeof(std::uint16_t) + parts_.size() * sizeof(Part) +
-           notes_.size() * sizeof(PartNote) + visits_.size() * sizeof(Visit);
+    return called_.size() * sizeof(Called) + ends_.size() * sizeof(End) + stepCount_ * sizeof(std::uint32_t) +
+           olderEnds_.size() * sizeof(OlderEnd) + visits_.size() * sizeof(Visit);
 }
 
 std::size_t KnownReadings::capacity() const {
-    return (calledAt_.capacity() + open_.capacity()) * sizeof(std::uint32_t) +
+    return (calledAt_.capacity() + open_.capacity() + toWrite_.capacity()) * sizeof(std::uint32_t) +
            called_.capacity() * sizeof(Called) + ends_.capacity() * sizeof(End) +
-           choices_.capacity() * sizeof(std::uint16_t) + parts_.capacity() * sizeof(Part) +
-           notes_.capacity() * sizeof(PartNote) + filled_.capacity() * sizeof(Filled) +
+           olderEnds_.capacity() * sizeof(OlderEnd) + steps_.capacity() * sizeof(std::uint32_t) +
            visits_.capacity() * sizeof(Visit);
 }
 

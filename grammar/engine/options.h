@@ -11,10 +11,10 @@ struct Options {
     /// Rules at work inside each other. A parenthesis costs about four, a sub-query about ten.
     std::uint32_t maxDepth = 200000;
     /// Rules called and ways that failed, in the search that tries one reading behind the other, since it
-    /// last got further; past them it begins to remember. 0 leaves that search out.
-    std::uint32_t quickSteps = 64;
-    /// Steps for each token of the text that it may take then.
-    std::uint32_t rememberingSteps = 64;
+    /// last got further; past them one takes over that remembers. 0 leaves both out.
+    std::uint32_t quickSteps = 16;
+    /// Steps for each token of the text that this one may take.
+    std::uint32_t rememberingSteps = 48;
     /// Steps of the search that takes over then: a fixed part and a part for each token. Most text needs less
     /// than a tenth of it. Where that isn't enough, only a first part of the text is read, and a notice goes
     /// to the diagnostics.

@@ -5,38 +5,24 @@
 #include <vector>
 
 #include "grammar/engine/derivation.h"
-#include "grammar/engine/known_readings.h"
+#include "grammar/engine/follow.h"
 #include "grammar/engine/options.h"
+#include "grammar/engine/remembering_search.h"
 #include "grammar/engine/tables.h"
 #include "grammar/engine/text_index.h"
 
 /// The search for plain text: it follows the first reading in written order and turns back to the last choice
-/// where that fails. At first it remembers nothing of what failed, so it costs little a token as long as it
-/// seldom turns back. Where it goes astray it goes on in the same way, but remembers what each rule that it
-/// calls can come to. Where that takes many steps as well, it gives up; the full search gives the same
-/// derivation then.
+/// where that fails. It remembers nothing of what failed, so it costs little a token as long as it seldom
+/// turns back. Where it goes astray a search that remembers goes on from there, in the same order. Where that
+/// takes many steps as well, it gives up; the full search gives the same derivation then.
 namespace zr::engine {
 
 class QuickSearch {
  public:
-    /// Where the search stands.
-    struct Place {
-        std::uint32_t low, high;
-        std::uint32_t part, depth;
-        std::uint16_t node;
-    };
-    /// A choice that has branches left, and how much had been written down there; or a call that has known
-    /// ends left, and the next of them.
-    struct Point {
-        Place place;
-        std::uint32_t mask, choices, parts;
-    };
-
     /// What it needs memory for that grows with the text.
     struct Work {
-        std::vector<Point> points;
-        std::unique_ptr<KnownReadings> known;  ///< null until a text needs it
-        std::vector<std::uint32_t> callsAt;    ///< by point: calls known when it was come to
+        std::vector<OpenChoice> points;
+        std::unique_ptr<RememberingSearch::Work> remembering;  ///< null until a text needs it
         std::size_t capacity() const;
     };
 
@@ -52,40 +38,31 @@ class QuickSearch {
     /// derivation down.
     Outcome run(std::uint16_t rule, std::uint32_t position);
     /// Where what was found ends.
-    std::uint32_t end() const { return goal_; }
+    std::uint32_t end() const { return end_.goal; }
 
-    std::uint64_t steps() const { return steps_ + (known_ != nullptr ? known_->steps() : 0); }
+    std::uint64_t steps() const { return steps_; }
     /// What the search has to remember, as Options::maxMemo counts it.
     std::size_t remembered() const {
-        return made_.parts.size() + made_.choices.size() / 16 + work_.points.size() +
-               (known_ != nullptr ? known_->bytes() / kMemoBytes : 0);
+        const std::size_t now = made_.parts.size() + made_.choices.size() / 16 + work_.points.size();
+        return now > rememberedFurther_ ? now : rememberedFurther_;
     }
 
  private:
-    /// What Options::maxMemo reckons with for each thing that a search remembers.
-    static constexpr std::size_t kMemoBytes = 32;
+    using Place = OpenChoice::Place;
+    template <class Search, class Place>
+    friend bool follow(Search& search, Place& place);
 
-    Outcome runRemembering();
-    Outcome readAgain();
-    Outcome writeEnd();
-    void start();
-    bool isWhole();
-    template <bool kRemembers>
-    bool follow();
+    void start(std::uint16_t rule, std::uint32_t position);
+    bool findsEnd();
     bool turnBack();
-    bool turnBackRemembering();
-    void takeAgain(Point& point);
-    void goBackTo(const Point& point);
-    template <bool kRemembers>
-    void addPoint(const Place& place, std::uint32_t left);
-    std::uint16_t take(const NodeRow& choice, std::uint32_t branch);
-    template <bool kRemembers>
-    bool call(Place& place);
-    template <bool kRemembers>
+    Outcome remember();
+    Outcome writeEnd();
+
+    bool choose(Place& place, const NodeRow& node, std::uint32_t branches);
+    bool call(Place& place, const NodeRow& node);
+    bool isOver(const Place& place) const { return place.part == 0; }
     bool comeBack(Place& place);
-    bool visit(const Place& place);
-    bool useKnown(Place& place, std::uint32_t call);
-    bool comeBackWith(Place& place, std::uint32_t end);
+    std::uint16_t take(const NodeRow& choice, std::uint32_t branch);
 
     const ParserTable& table_;
     TextIndex& text_;
@@ -93,16 +70,10 @@ class QuickSearch {
     Derivation& made_;
     Work& work_;
     Place place_{};
-    std::uint16_t rule_ = 0;
-    std::uint32_t from_ = 0, goal_ = 0;  ///< where a reading starts and must end
-    /// The furthest end ahead of the goal, and whether there was one.
-    std::uint32_t end_ = 0;
-    bool hasEnd_ = false;
-    KnownReadings* known_ = nullptr;  ///< while it remembers
-    std::uint32_t deepest_ = 0;       ///< call that it remembers
+    ReadingEnd end_;
     std::uint64_t steps_ = 0;
+    std::size_t rememberedFurther_ = 0;
     bool tooDeep_ = false;
-    bool gaveUp_ = false;  ///< what it remembers may be too deep where it is to be used
 };
 
 }  // namespace zr::engine

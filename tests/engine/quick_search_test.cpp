@@ -66,7 +66,7 @@ TEST(QuickSearch, ReadsConditionsFullOfParentheses) {
             const QuickReading reading = readQuickly("msaccess", accessCondition(depth, terms));
             EXPECT_EQ(reading.outcome, SearchOutcome::Found) << depth << " " << terms;
             EXPECT_EQ(reading.end, reading.tokens) << depth << " " << terms;
-            EXPECT_LT(reading.stepsPerToken, 64) << depth << " " << terms;
+            EXPECT_LT(reading.stepsPerToken, 48) << depth << " " << terms;
         }
 }
 
@@ -90,7 +90,7 @@ TEST(QuickSearch, WithoutMemoryGivesUpConditionsFullOfParentheses) {
 }
 
 TEST(QuickSearch, FindsTheFurthestEndOfTextThatCantBeReadWhole) {
-    const std::u16string readable = accessCondition(2, 3);
+    const std::u16string readable = accessCondition(1, 3);
     const std::uint32_t end = readQuickly("msaccess", readable).tokens;
     for (const std::u16string_view tail : {u" ; SELECT", u" OVER ( x )"}) {
         const QuickReading reading = readQuickly("msaccess", readable + std::u16string(tail));
