@@ -11,12 +11,19 @@
 #include <zrparsersql/sql_parsers.h>
 
 #include <cstdio>
+#include <cstdlib>
 #include <string>
 
 #include "bench/queries.h"
 #include "bench/timing.h"
 #include "grammar/engine/lexed_text.h"
 #include "parser/grammars.h"
+
+/// What a profiler is told to look at: valgrind --toggle-collect='measuredRun*'.
+__attribute__((noinline)) void measuredRun(std::size_t (*stage)(const std::u16string&),
+                                           const std::u16string& text) {
+    stage(text);
+}
 
 namespace {
 
@@ -95,6 +102,20 @@ void printGrowth() {
     }
 }
 
+/// One run over a shape at a size, for growth.sh; says how many tokens that is. False where there is no such
+/// shape.
+bool runOnce(const std::string& shape, const std::string& stage, int n) {
+    for (const auto& family : zr::bench::families()) {
+        if (family.name != shape) continue;
+        const std::u16string text = wide(family.text(n > 0 ? n : family.n));
+        const auto run = stage == "analyse" ? &analyse : &parse;
+        measuredRun(run, text);
+        std::printf("%zu tokens\n", lex(text));
+        return true;
+    }
+    return false;
+}
+
 void registerAll() {
     for (const int blocks : {1, 4, 16, 48}) {
         const std::string query = zr::bench::plainQuery(blocks);
@@ -113,11 +134,16 @@ void registerAll() {
 }  // namespace
 
 int main(int argc, char** argv) {
-    const bool growth = argc > 1 && std::string(argv[1]) == "--growth";
-    if (growth) {
+    const std::string word = argc > 1 ? argv[1] : "";
+    if (word == "--growth") {
         printGrowth();
         return 0;
     }
+    if (word == "--shapes") {
+        for (const auto& family : zr::bench::families()) std::printf("%s %d\n", family.name, family.n);
+        return 0;
+    }
+    if (word == "--once" && argc == 5) return runOnce(argv[2], argv[3], std::atoi(argv[4])) ? 0 : 1;
     registerAll();
     benchmark::Initialize(&argc, argv);
     benchmark::RunSpecifiedBenchmarks();
