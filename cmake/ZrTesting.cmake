@@ -18,7 +18,7 @@ function(zr_add_test name)
   # A test's own code runs once: compiling it fast is worth more than running it fast.
   target_compile_options(${name} PRIVATE $<$<CONFIG:Release>:-O1>)
   set_target_properties(${name} PROPERTIES RUNTIME_OUTPUT_DIRECTORY "${PROJECT_BINARY_DIR}/bin/tests")
-  gtest_discover_tests(${name} TEST_PREFIX "${name}." DISCOVERY_TIMEOUT 60
+  gtest_discover_tests(${name} TEST_PREFIX "${name}." NO_PRETTY_VALUES DISCOVERY_TIMEOUT 60
                        PROPERTIES TIMEOUT ${arg_TIMEOUT} LABELS "${arg_LABELS}")
 endfunction()
 
