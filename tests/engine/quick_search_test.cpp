@@ -6,6 +6,8 @@
 
 #include <string>
 #include <string_view>
+#include <tuple>
+#include <utility>
 #include <vector>
 
 #include "grammar/engine/lexed_text.h"
@@ -21,6 +23,7 @@ struct QuickReading {
     SearchOutcome outcome;
     std::uint32_t end, tokens;
     double stepsPerToken;
+    engine::Derivation derivation;
 };
 
 QuickReading readQuickly(std::string_view corpus, const std::u16string& text,
@@ -36,7 +39,7 @@ QuickReading readQuickly(std::string_view corpus, const std::u16string& text,
     engine::QuickSearch search(parser, index, options, derivation, work);
     const SearchOutcome outcome = search.run(parser.statementRule, 0);
     return {outcome, search.end(), index.count(),
-            static_cast<double>(search.steps()) / static_cast<double>(index.count())};
+            static_cast<double>(search.steps()) / static_cast<double>(index.count()), derivation};
 }
 
 /// No step without remembering.
@@ -119,6 +122,41 @@ TEST(QuickSearch, GivesUpWhereItMayRememberNothing) {
     engine::Options options = rememberingAtOnce(1000);
     options.maxMemo = 1;
     EXPECT_EQ(readQuickly("msaccess", accessCondition(2, 3), options).outcome, SearchOutcome::OverBudget);
+}
+
+void expectSame(const engine::Derivation& one, const engine::Derivation& other, const std::string& about) {
+    EXPECT_EQ(one.choices, other.choices) << about;
+    ASSERT_EQ(one.parts.size(), other.parts.size()) << about;
+    for (std::size_t i = 0; i < one.parts.size(); ++i) {
+        const engine::Derivation::Part &a = one.parts[i], &b = other.parts[i];
+        EXPECT_EQ(std::tie(a.outer, a.position, a.low, a.high, a.choices, a.parts, a.node),
+                  std::tie(b.outer, b.position, b.low, b.high, b.choices, b.parts, b.node))
+            << about << ", part " << i;
+    }
+}
+
+TEST(QuickSearch, ComesToTheSameWhereverTheOneThatRemembersTakesOver) {
+    const std::vector<std::pair<const char*, std::u16string>> texts{
+        {"msaccess", accessCondition(2, 2)},
+        {"msaccess", accessCondition(1, 2) + u" OVER ( x )"},
+        {"mssql", u"SELECT a, b FROM t WHERE a IN (SELECT MAX(b) FROM u GROUP BY c x) AND b = 1"},
+        {"mssql", u"SELECT MAX(a), MIN(b) c FROM t x JOIN u y ON x.a = y.b"},
+        {"oracle", u"SELECT a, (SELECT b FROM u WHERE c = 1 OR d) FROM t"},
+        {"postgresql", u"SELECT (a + b) * c, CASE WHEN x THEN y END FROM t, (SELECT 1) z"}};
+    for (const auto& [grammar, text] : texts) {
+        engine::Options options;
+        options.rememberingSteps = 1U << 20;
+        options.quickSteps = 1U << 20;
+        const QuickReading plain = readQuickly(grammar, text, options);
+        ASSERT_EQ(plain.outcome, SearchOutcome::Found) << grammar;
+        for (options.quickSteps = 1; options.quickSteps < 150; ++options.quickSteps) {
+            const QuickReading reading = readQuickly(grammar, text, options);
+            const std::string about = std::string(grammar) + " behind " + std::to_string(options.quickSteps);
+            ASSERT_EQ(reading.outcome, SearchOutcome::Found) << about;
+            EXPECT_EQ(reading.end, plain.end) << about;
+            expectSame(reading.derivation, plain.derivation, about);
+        }
+    }
 }
 
 TEST(QuickSearch, NestsAsDeepWhenItRemembersAsWhenItDoesNot) {
