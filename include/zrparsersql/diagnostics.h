@@ -51,7 +51,9 @@ enum {
    `user` are not changed in one step. */
 ZR_API void zrSetDiagnostics(uint32_t parts, ZRDiagnostics* diagnostics);
 
-/* The functions below are part of the host: only zrSetDiagnostics is the library's. */
+/* The functions below are part of the host: only zrSetDiagnostics is the library's. They are C as well, which
+   has no nullptr. */
+/* NOLINTBEGIN(modernize-use-nullptr) */
 #ifdef __cplusplus
 #define ZR_IN_HEADER inline
 #else
@@ -77,6 +79,7 @@ ZR_IN_HEADER ZRMessageBoxFunction zrSetMessageBoxFunction(ZRMessageBoxFunction f
     return diagnostics.box;
 }
 
+/* NOLINTEND(modernize-use-nullptr) */
 #undef ZR_IN_HEADER
 
 #ifdef __cplusplus
