@@ -119,6 +119,7 @@ constexpr int kRunsATurn = 16;
 std::vector<Time> measure(const std::vector<Reader>& readers, Text& text, int rounds) {
     std::vector<std::vector<double>> turns(readers.size());
     std::vector<bool> reads;
+    reads.reserve(readers.size());
     for (const Reader& reader : readers) reads.push_back(reader.refusal(text).empty());
     for (int round = 0; round < rounds; ++round) {
         for (std::size_t i = 0; i < readers.size(); ++i) {
@@ -256,6 +257,7 @@ int main(int argc, char** argv) {
         }
         const std::vector<Reader> readers = readersOf(dialect, schema);
         std::vector<std::vector<Time>> times;
+        times.reserve(texts.size());
         for (Text& text : texts) times.push_back(measure(readers, text, rounds));
         std::printf("%s\n", dialect.name);
         if (folder.empty() || isEachTold) tellRefusals(readers, texts);

@@ -162,7 +162,7 @@ std::string CatalogUrl::text() const {
     std::string text = scheme + std::string(kAfterScheme) + authority + "/" + database;
     char before = '?';
     for (const auto& [name, value] : parameters) {
-        text += before + name + "=" + value;
+        text.append(1, before).append(name).append("=").append(value);
         before = '&';
     }
     return text;

@@ -52,8 +52,7 @@ void DescriptorReaper::take(SelectItem* item) {
 
 void DescriptorReaper::take(CList<SelectItem*>& items) {
     // Whoever is asked for the list meanwhile finds it empty.
-    const CList<SelectItem*> taken = std::move(items);
-    items.RemoveAll();
+    const CList<SelectItem*> taken = std::exchange(items, CList<SelectItem*>());
     for (SelectItem* item : taken) take(item);
 }
 

@@ -81,7 +81,8 @@ class Inlining {
         std::map<int, int> copyOf;
         for (int i : body) {
             copyOf[i] = static_cast<int>(p_.nodes.size());
-            p_.nodes.push_back(Node(p_.nodes[index(i)]));  // a copy, since the vector moves
+            const Node copy = p_.nodes[index(i)];  // since the vector moves
+            p_.nodes.push_back(copy);
             guarded_.push_back(guarded_[index(i)]);
         }
         for (int i : body) {
