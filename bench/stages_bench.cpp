@@ -103,13 +103,13 @@ void printGrowth() {
 }
 
 /// One run over a shape at a size, for growth.sh; says how many tokens that is. False where there is no such
-/// shape.
+/// shape or stage.
 bool runOnce(const std::string& shape, const std::string& stage, int n) {
     for (const auto& family : zr::bench::families()) {
         if (family.name != shape) continue;
-        const std::u16string text = wide(family.text(n > 0 ? n : family.n));
-        const auto run = stage == "analyse" ? &analyse : &parse;
-        measuredRun(run, text);
+        const std::u16string text = wide(family.text(n));
+        if (stage != "analyse" && stage != "parse") return false;
+        measuredRun(stage == "analyse" ? &analyse : &parse, text);
         std::printf("%zu tokens\n", lex(text));
         return true;
     }
@@ -143,7 +143,11 @@ int main(int argc, char** argv) {
         for (const auto& family : zr::bench::families()) std::printf("%s %d\n", family.name, family.n);
         return 0;
     }
-    if (word == "--once" && argc == 5) return runOnce(argv[2], argv[3], std::atoi(argv[4])) ? 0 : 1;
+    if (word == "--once") {
+        if (argc == 5 && runOnce(argv[2], argv[3], std::atoi(argv[4]))) return 0;
+        std::fprintf(stderr, "stages_bench --once SHAPE parse|analyse N; --shapes lists the shapes\n");
+        return 1;
+    }
     registerAll();
     benchmark::Initialize(&argc, argv);
     benchmark::RunSpecifiedBenchmarks();

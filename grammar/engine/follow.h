@@ -62,6 +62,13 @@ inline bool follow(Search& search, Place& place) {
     return false;
 }
 
+/// The first of these branches, which isn't among them any more.
+inline std::uint32_t takeFirst(std::uint32_t& branches) {
+    const auto branch = static_cast<std::uint32_t>(std::countr_zero(branches));
+    branches &= branches - 1;
+    return branch;
+}
+
 /// A choice that has branches left, and how much of the derivation had been written down there.
 struct OpenChoice {
     struct Place {
@@ -77,11 +84,6 @@ struct OpenChoice {
         derivation.choices.resize(choices);
         derivation.parts.resize(parts);
         return place;
-    }
-    std::uint32_t nextBranch() {
-        const auto branch = static_cast<std::uint32_t>(std::countr_zero(branches));
-        branches &= branches - 1;
-        return branch;
     }
 };
 

@@ -6,8 +6,7 @@
 namespace zr::engine {
 namespace {
 
-/// Places where a search has been, to begin with, for each token; more only where it has been at more.
-constexpr std::size_t kVisitsAToken = 1;
+/// Room for the places where a search has been, to begin with: one for each token, but no more than so many.
 constexpr std::size_t kFewVisits = 4096;
 
 }  // namespace
@@ -24,7 +23,7 @@ void KnownReadings::start(std::size_t positions) {
 }
 
 void KnownReadings::forgetVisits() {
-    const std::size_t size = std::bit_ceil(std::min(calledAt_.size() * kVisitsAToken, kFewVisits));
+    const std::size_t size = std::bit_ceil(std::min(calledAt_.size(), kFewVisits));
     if (visits_.size() > size) giveBack(visits_);
     visits_.assign(size, Visit());
     visitCount_ = 0;
@@ -63,6 +62,8 @@ void KnownReadings::startAgain() {
 }
 
 void KnownReadings::write(std::uint32_t last, std::uint32_t part, Derivation& derivation) {
+    // The derivation grows while the ways are still needed: what isn't needed goes ahead of it. The rest
+    // stays for the thread's next text.
     giveBack(visits_);
     giveBack(calledAt_);
     giveBack(called_);

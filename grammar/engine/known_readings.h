@@ -20,7 +20,7 @@ class KnownReadings {
 
     /// Who called a rule: the rule at work there, what it had come by, and its Call.
     struct Caller {
-        std::uint32_t caller, last;
+        std::uint32_t atWork, last;
         std::uint16_t node;
     };
     /// A rule that was called somewhere, and what is known of it.
@@ -75,7 +75,7 @@ class KnownReadings {
     }
     std::uint32_t addCall(std::uint32_t before, std::uint32_t end, std::uint16_t node) {
         goOnBehind(before);
-        addWord(kChoice, end);
+        steps_[stepCount_++] = end;
         return addWord(kCall, node);
     }
     /// The end of a part of which only the derivation knows where it started.

@@ -1,7 +1,6 @@
 #include "grammar/engine/quick_search.h"
 
 #include <algorithm>
-#include <bit>
 
 #include "grammar/engine/grow.h"
 
@@ -58,7 +57,7 @@ bool QuickSearch::turnBack() {
     OpenChoice& point = work_.points.back();
     place_ = point.backIn(made_);
     const NodeRow& node = table_.nodes[place_.node];
-    place_.node = take(node, point.nextBranch());
+    place_.node = take(node, takeFirst(point.branches));
     if (point.branches == 0) work_.points.pop_back();
     return true;
 }
@@ -84,13 +83,13 @@ QuickSearch::Outcome QuickSearch::writeEnd() {
 // ---- along a reading
 
 inline bool QuickSearch::choose(Place& place, const NodeRow& node, std::uint32_t branches) {
-    const std::uint32_t left = branches & (branches - 1);
-    if (left != 0) {
+    const std::uint32_t branch = takeFirst(branches);
+    if (branches != 0) {
         growSlowly(work_.points);
-        work_.points.push_back({place, left, static_cast<std::uint32_t>(made_.choices.size()),
+        work_.points.push_back({place, branches, static_cast<std::uint32_t>(made_.choices.size()),
                                 static_cast<std::uint32_t>(made_.parts.size())});
     }
-    place.node = take(node, static_cast<std::uint32_t>(std::countr_zero(branches)));
+    place.node = take(node, branch);
     return true;
 }
 

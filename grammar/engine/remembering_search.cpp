@@ -1,7 +1,6 @@
 #include "grammar/engine/remembering_search.h"
 
 #include <algorithm>
-#include <bit>
 
 #include "grammar/engine/grow.h"
 
@@ -71,17 +70,15 @@ bool RememberingSearch::turnBack(std::vector<OpenChoice>& older) {
             if (takeNextEnd()) return true;
             continue;
         }
-        const auto branch = static_cast<std::uint32_t>(std::countr_zero(point.left));
-        point.left &= point.left - 1;
+        takeBranch(place_, node, takeFirst(point.left));
         if (point.left == 0) points_.pop_back();
-        takeBranch(node, branch);
         return true;
     }
     known_.complete(0);
     if (older.empty()) return false;
     OpenChoice& point = older.back();
     goOnAt(point.backIn(made_));
-    takeBranch(table_.nodes[place_.node], point.nextBranch());
+    takeBranch(place_, table_.nodes[place_.node], takeFirst(point.branches));
     if (point.branches == 0) older.pop_back();
     return true;
 }
@@ -95,25 +92,22 @@ bool RememberingSearch::takeNextEnd() {
     return comeBackWith(place_, end);
 }
 
-void RememberingSearch::takeBranch(const NodeRow& choice, std::uint32_t branch) {
+inline void RememberingSearch::takeBranch(Place& place, const NodeRow& choice, std::uint32_t branch) {
     const std::uint16_t taken = branchOf(table_, choice, branch);
-    place_.last = known_.addChoice(place_.last, taken);
-    place_.node = table_.branches[taken].stop;
+    place.last = known_.addChoice(place.last, taken);
+    place.node = table_.branches[taken].stop;
 }
 
 // ---- along a reading
 
 inline bool RememberingSearch::choose(Place& place, const NodeRow& node, std::uint32_t branches) {
-    const std::uint32_t left = branches & (branches - 1);
-    if (left != 0) {
+    const std::uint32_t branch = takeFirst(branches);
+    if (branches != 0) {
         // Each other time it comes to what it came to the first time.
-        if (!known_.visit(place.caller, place.node, place.low, place.high)) return false;
-        points_.push_back({place, left, known_.calledCount()});
+        if (!known_.visit(place.atWork, place.node, place.low, place.high)) return false;
+        points_.push_back({place, branches, known_.calledCount()});
     }
-    const std::uint16_t taken =
-        branchOf(table_, node, static_cast<std::uint32_t>(std::countr_zero(branches)));
-    place.last = known_.addChoice(place.last, taken);
-    place.node = table_.branches[taken].stop;
+    takeBranch(place, node, branch);
     return true;
 }
 
@@ -124,7 +118,7 @@ inline bool RememberingSearch::call(Place& place, const NodeRow& node) {
     if (tooDeep_) return false;
     ++steps_;
     deepest_ = std::max(deepest_, place.depth);
-    place.caller = known_.add(node.arg, place.low, {place.caller, place.last, place.node}, place.depth);
+    place.atWork = known_.add(node.arg, place.low, {place.atWork, place.last, place.node}, place.depth);
     place.last = KnownReadings::kNone;
     place.node = searchedFrom(table_, table_.rules[node.arg].entry);
     return true;
@@ -134,23 +128,23 @@ inline bool RememberingSearch::call(Place& place, const NodeRow& node) {
 inline bool RememberingSearch::comeBack(Place& place) {
     // Each of many levels can have many ends.
     ++steps_;
-    const bool isOlder = (place.caller & kOlder) != 0;
+    const bool isOlder = (place.atWork & kOlder) != 0;
     if (isOlder) {
-        if (!known_.visit(place.caller, place.node, place.low, place.high)) return false;
-        const Derivation::Part& part = made_.parts[place.caller & ~kOlder];
+        if (!known_.visit(place.atWork, place.node, place.low, place.high)) return false;
+        const Derivation::Part& part = made_.parts[place.atWork & ~kOlder];
         const NodeRow& node = table_.nodes[part.node];
         if (place.high == part.position && (node.flags & kNonEmpty)) return false;
         place.last = known_.addEndOfOlder(place.last, place.low, place.high);
-        place.caller = kOlder | part.outer;
+        place.atWork = kOlder | part.outer;
         place.node = node.run;
     } else {
-        const std::uint32_t end = known_.addEnd(place.caller, place.low, place.high, place.last);
+        const std::uint32_t end = known_.addEnd(place.atWork, place.low, place.high, place.last);
         if (end == KnownReadings::kNone) return false;
-        const KnownReadings::Called& called = known_.called(place.caller);
+        const KnownReadings::Called& called = known_.called(place.atWork);
         const NodeRow& node = table_.nodes[called.caller.node];
         if (place.high == called.position && (node.flags & kNonEmpty)) return false;
         place.last = known_.addCall(called.caller.last, end, called.caller.node);
-        place.caller = called.caller.caller;
+        place.atWork = called.caller.atWork;
         place.node = node.run;
     }
     --place.depth;
@@ -166,7 +160,7 @@ bool RememberingSearch::useKnown(Place& place, std::uint32_t call) {
     if (gaveUp_) return false;
     const std::uint32_t next = known_.end(known.firstEnd).next;
     if (next != KnownReadings::kNone) {
-        if (!known_.visit(place.caller, place.node, place.low, place.high)) return false;
+        if (!known_.visit(place.atWork, place.node, place.low, place.high)) return false;
         points_.push_back({place, next, known_.calledCount()});
     }
     return comeBackWith(place, known.firstEnd);

@@ -19,7 +19,7 @@ class RememberingSearch {
  public:
     struct Place {
         std::uint32_t low, high;
-        std::uint32_t caller;  ///< the rule at work: a call that is known, or an older part
+        std::uint32_t atWork;  ///< the rule at work: a call that is known, or an older part
         std::uint32_t last;    ///< step of the way inside it
         std::uint32_t depth;
         std::uint16_t node;
@@ -58,7 +58,7 @@ class RememberingSearch {
  private:
     /// What Options::maxMemo reckons with for each thing that a search remembers.
     static constexpr std::size_t kMemoBytes = 32;
-    /// A caller that is a part of the derivation from before anything was remembered.
+    /// At work is a part of the derivation from before anything was remembered.
     static constexpr std::uint32_t kOlder = 0x80000000;
 
     template <class Search, class Place>
@@ -70,11 +70,11 @@ class RememberingSearch {
     bool readAgain(ReadingEnd& end);
     bool turnBack(std::vector<OpenChoice>& older);
     bool takeNextEnd();
-    void takeBranch(const NodeRow& choice, std::uint32_t branch);
+    void takeBranch(Place& place, const NodeRow& choice, std::uint32_t branch);
 
     bool choose(Place& place, const NodeRow& node, std::uint32_t branches);
     bool call(Place& place, const NodeRow& node);
-    bool isOver(const Place& place) const { return place.caller == kOlder; }
+    bool isOver(const Place& place) const { return place.atWork == kOlder; }
     bool comeBack(Place& place);
     bool useKnown(Place& place, std::uint32_t call);
     bool comeBackWith(Place& place, std::uint32_t end);
