@@ -23,14 +23,16 @@ void compile(const Inputs& inputs, const Output& output, std::ostream* report) {
             program.opener = found->second;
     analyse(program, grammar, facts, vocabulary.maxNumber);
     findBranches(program);
+    dropCovered(program, grammar);
+    findOutline(program, grammar);
     numberNodes(program, facts, grammar);
     lookAhead(program);
     if (report)
         *report << grammar.name << ": " << grammar.rules.size() << " rules, " << program.nodes.size()
                 << " nodes, " << program.classes << " token classes, " << program.guards.size() << " guards, "
-                << program.lookahead.size() << " rows of lookahead, " << lexerProgram.accept.size()
-                << " lexer states, closer " << closer << (why.empty() ? "" : "; refused as closer:" + why)
-                << "\n";
+                << program.lookahead.size() << " rows of lookahead, " << program.outline.next.size()
+                << " states of the outline, " << lexerProgram.accept.size() << " lexer states, closer "
+                << closer << (why.empty() ? "" : "; refused as closer:" + why) << "\n";
     if (!output.sourceFile.empty())
         emit(vocabulary, lexerGrammar, lexerProgram, grammar, facts, program, output);
 }

@@ -299,6 +299,8 @@ class Emitter {
         array(o, "std::uint16_t", "guardBefore", before, [&](int set) { o << set; });
         array(o, "GuardRow", "guards", guards,
               [&](const auto& g) { o << "{" << g[0] << ", " << g[1] << ", " << g[2] << "}"; });
+        std::size_t outlineColumns = 0;
+        const int outlineStart = outline(o, outlineColumns);
         const auto number = [&](const char* name) {
             const auto found = vocabulary_.numberOf.find(name);
             return found == vocabulary_.numberOf.end() ? 0 : found->second;
@@ -312,7 +314,32 @@ class Emitter {
           << ", guardBefore, " << std::max(program_.closer, 0) << ", " << parser_.start << ", "
           << parser_.statement << ", " << (parser_.recoverRule < 0 ? 0xFFFF : parser_.recoverRule) << ", "
           << left << ", " << right << ", " << parser_.keepTail << ", " << program_.stops << ", "
-          << program_.statementStops << "};\n\n";
+          << program_.statementStops << ", outlineNext, outlineColumn, " << outlineColumns << ", "
+          << outlineStart << "};\n\n";
+    }
+
+    /// The outline's states by columns, each with whether it accepts in its lowest bit; where it starts.
+    int outline(std::ostream& o, std::size_t& columns) const {
+        const Outline& outline = program_.outline;
+        const std::size_t classes = outline.next.empty() ? 0 : index(program_.classes);
+        std::map<std::vector<int>, std::size_t> columnOf;
+        std::vector<std::size_t> columnOfClass;
+        std::vector<std::size_t> classOfColumn;
+        for (std::size_t c = 0; c < classes; ++c) {
+            std::vector<int> column;
+            for (const auto& row : outline.next) column.push_back(row[c]);
+            const auto [found, fresh] = columnOf.emplace(std::move(column), columnOf.size());
+            if (fresh) classOfColumn.push_back(c);
+            columnOfClass.push_back(found->second);
+        }
+        const auto told = [&](int state) { return state * 2 + (outline.accepts[index(state)] ? 1 : 0); };
+        std::vector<int> next;
+        for (const auto& row : outline.next)
+            for (std::size_t c : classOfColumn) next.push_back(told(row[c]));
+        columns = classOfColumn.size();
+        array(o, "std::uint16_t", "outlineNext", next, [&](int state) { o << state; });
+        array(o, "std::uint8_t", "outlineColumn", columnOfClass, [&](std::size_t column) { o << column; });
+        return outline.next.empty() ? 0 : told(outline.start);
     }
 
     void contexts(std::ostream& o) const {

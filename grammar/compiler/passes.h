@@ -57,6 +57,12 @@ void analyse(Program& program, const ParserGrammar& grammar, const Facts& facts,
 /// one node the first stays.
 void findBranches(Program& program);
 
+/// Leaves out the branches that read nothing which earlier ones of the same choice don't read.
+void dropCovered(Program& program, const ParserGrammar& grammar);
+
+/// Finds what a statement can look like from its front.
+void findOutline(Program& program, const ParserGrammar& grammar);
+
 /// Finds what can stand in front of the last token of what a guard waits for the end of.
 void lastPairs(Program& program, const Facts& facts);
 

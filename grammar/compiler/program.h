@@ -63,6 +63,14 @@ struct Guard {
     bool operator==(const Guard&) const = default;
 };
 
+/// An automaton that takes all that the statement can read, and more, by class of each token; state 0 is
+/// where nothing can come any more. No states where a grammar would need too many.
+struct Outline {
+    int start = 0;
+    std::vector<std::vector<int>> next;
+    std::vector<bool> accepts;
+};
+
 struct Program {
     std::vector<Node> nodes;
     int stops = 0;           ///< nodes that a search stops at: they stand first, see numberNodes()
@@ -75,6 +83,7 @@ struct Program {
     static constexpr std::uint32_t kMore = 0x80000000u;
     static constexpr std::size_t kTargets = 31;  ///< of a Choice at most, one bit each beside kMore
     static constexpr int kLookahead = 4;         ///< tokens that decide at a Choice at most
+    Outline outline;
     int closer = -1;
     int opener = -1;  ///< the left parenthesis
     std::set<int> recoverFollow;

@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "grammar/engine/grow.h"
+#include "grammar/engine/outline.h"
 
 namespace zr::engine {
 
@@ -13,11 +14,22 @@ std::size_t QuickSearch::Work::capacity() const {
 QuickSearch::Outcome QuickSearch::run(std::uint16_t rule, std::uint32_t position) {
     if (options_.quickSteps == 0) return Outcome::OverBudget;
     end_.goal = text_.count();
-    start(rule, position);
-    std::uint32_t furthest = position;
-    std::uint64_t bound = options_.quickSteps;
+    isOutlined_ = rule != table_.statementRule || position != 0;
+    std::uint32_t furthest = 0;
+    std::uint64_t bound = 0;
+    const auto begin = [&] {
+        start(rule, position);
+        furthest = position;
+        bound = steps_ + options_.quickSteps;
+    };
+    begin();
     while (!findsEnd()) {
         if (tooDeep_) return Outcome::TooDeep;
+        if (end_.hasFurthest && !isOutlined_) {
+            // The first reading of a whole statement ends ahead of the text: often no other gets further.
+            outline();
+            if (place_.high == end_.goal) break;
+        }
         // A way that fails is followed by one that gets further, or there is more wrong.
         if (place_.low > furthest) {
             furthest = place_.low;
@@ -28,11 +40,13 @@ QuickSearch::Outcome QuickSearch::run(std::uint16_t rule, std::uint32_t position
             // No reading gets to the goal, so that is now where one got to that got furthest.
             if (!end_.hasFurthest) return Outcome::NotFound;
             end_.goal = end_.furthest;
-            start(rule, position);
-            furthest = position;
-            bound = steps_ + options_.quickSteps;
+            begin();
         } else if (++steps_ > bound) {
-            return remember();
+            if (!outline()) return Outcome::NotFound;
+            if (end_.goal == text_.count()) return remember();
+            // What can't belong to the statement leads nobody astray once it is cut off.
+            text_.cutAt(end_.goal);
+            begin();
         }
     }
     return remembered() > options_.maxMemo ? Outcome::OverBudget : writeEnd();
@@ -45,6 +59,16 @@ void QuickSearch::start(std::uint16_t rule, std::uint32_t position) {
     constexpr std::uint32_t kShortText = 256;
     work_.points.reserve(std::min(text_.count() - position, kShortText) + std::size_t{8});
     place_ = {position, position, 0, 1, searchedFrom(table_, table_.rules[rule].entry)};
+}
+
+/// Looks where the statement can end at most; false where nothing can be one.
+bool QuickSearch::outline() {
+    if (isOutlined_) return true;
+    isOutlined_ = true;
+    const std::uint32_t end = furthestEndByOutline(table_, text_);
+    if (end == TextIndex::kNone) return false;
+    end_.goal = end;
+    return true;
 }
 
 bool QuickSearch::findsEnd() {

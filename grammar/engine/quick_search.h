@@ -54,6 +54,7 @@ class QuickSearch {
 
     void start(std::uint16_t rule, std::uint32_t position);
     bool findsEnd();
+    bool outline();
     bool turnBack();
     Outcome remember();
     Outcome writeEnd();
@@ -74,6 +75,7 @@ class QuickSearch {
     std::uint64_t steps_ = 0;
     std::size_t rememberedFurther_ = 0;
     bool tooDeep_ = false;
+    bool isOutlined_ = false;  ///< the goal is where the statement can end at most
 };
 
 }  // namespace zr::engine

@@ -7,7 +7,7 @@
 /// engine never runs tables of another layout.
 namespace zr::engine {
 
-constexpr std::uint32_t kTableVersion = 9;
+constexpr std::uint32_t kTableVersion = 10;
 
 constexpr std::uint16_t kNone16 = 0xFFFF;
 
@@ -150,6 +150,13 @@ struct ParserTable {
     /// token in between.
     std::uint32_t stops;
     std::uint32_t statementStops;  ///< those, in front, that the statement rule can come to
+    /// [state * outlineColumns + outlineColumn[class]]: an automaton that takes all that the statement can
+    /// read, and more. Twice the next state, and one more where the statement can end there; 0 where nothing
+    /// can come any more.
+    const std::uint16_t* outlineNext;
+    const std::uint8_t* outlineColumn;
+    std::uint32_t outlineColumns;  ///< 0: there is no outline
+    std::uint16_t outlineStart;
 };
 
 constexpr std::uint32_t kMoreTokens = 0x80000000u;

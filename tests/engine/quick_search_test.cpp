@@ -38,8 +38,8 @@ QuickReading readQuickly(std::string_view corpus, const std::u16string& text,
     engine::QuickSearch::Work work;
     engine::QuickSearch search(parser, index, options, derivation, work);
     const SearchOutcome outcome = search.run(parser.statementRule, 0);
-    return {outcome, search.end(), index.count(),
-            static_cast<double>(search.steps()) / static_cast<double>(index.count()), derivation};
+    return {outcome, search.end(), index.fullCount(),
+            static_cast<double>(search.steps()) / static_cast<double>(index.fullCount()), derivation};
 }
 
 /// No step without remembering.
@@ -101,6 +101,18 @@ TEST(QuickSearch, FindsTheFurthestEndOfTextThatCantBeReadWhole) {
         EXPECT_EQ(reading.end, end);
         EXPECT_GT(reading.tokens, end);
     }
+}
+
+TEST(QuickSearch, LooksForNothingBehindTextThatCantGoOn) {
+    const std::u16string plain = u"SELECT a, b AS c, t.total FROM t WHERE a = 1 AND t.name = 2 AND c > t.id";
+    for (const char* grammar : {"mssql", "mysql", "oracle", "postgresql", "msaccess"})
+        for (const std::u16string_view tail : {u" WHERE", u" ORDER x"}) {
+            const QuickReading whole = readQuickly(grammar, plain);
+            const QuickReading reading = readQuickly(grammar, plain + std::u16string(tail));
+            EXPECT_EQ(reading.end, whole.tokens) << grammar;
+            EXPECT_LT(reading.end, reading.tokens) << grammar;
+            EXPECT_LT(reading.stepsPerToken, whole.stepsPerToken * 1.5) << grammar;
+        }
 }
 
 TEST(QuickSearch, TellsThatNothingCanBeRead) {
