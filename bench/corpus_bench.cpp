@@ -2,7 +2,10 @@
 /// "sql" on each line: the median over the queries that are read to their end, and over the others.
 ///
 ///     corpus_bench [--rounds N] [--dialect NAME] [FOLDER]
-///     corpus_bench --once --dialect NAME --stage NAME [FOLDER]     for a profiler: one stage, no clock
+///     corpus_bench --once [--part] --dialect NAME --stage NAME [FOLDER]
+///
+/// --once is for a profiler: one stage, no clock, of the queries that are read to their end, or with --part of
+/// the others.
 ///
 /// Without a folder the queries of bench/plain_queries.jsonl are taken. What goes by "tree" has lexing and
 /// recognising in it, "facade" has "tree" in it, and "analyse" all.
@@ -120,7 +123,7 @@ __attribute__((noinline)) void measuredRun(const std::function<void()>& run) {
 
 int main(int argc, char** argv) {
     int rounds = 20;
-    bool once = false;
+    bool once = false, part = false;
     std::string only, stageName, folder;
     for (int i = 1; i < argc; ++i) {
         const std::string word = argv[i];
@@ -128,6 +131,8 @@ int main(int argc, char** argv) {
             rounds = std::atoi(argv[++i]);
         else if (word == "--once")
             once = true;
+        else if (word == "--part")
+            part = true;
         else if (word == "--dialect" && i + 1 < argc)
             only = argv[++i];
         else if (word == "--stage" && i + 1 < argc)
@@ -149,7 +154,7 @@ int main(int argc, char** argv) {
         for (const Stage& stage : stages()) {
             if (stageName != stage.name) continue;
             for (Query& query : queries) {
-                if (!query.isReadToEnd) continue;
+                if (query.isReadToEnd == part) continue;
                 const auto run = stage.prepare(dialect, query);
                 run();  // what a thread keeps for its next text is there
                 measuredRun(run);

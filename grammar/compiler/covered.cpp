@@ -18,21 +18,24 @@
 namespace zr::gc {
 namespace {
 
-/// Calls inside each other that are gone into; places of the others that are looked at for one branch, and
-/// for all of a grammar. Past these a branch is kept.
+/// Calls inside each other that are gone into.
 constexpr int kDeepest = 12;
-constexpr std::size_t kManyPlaces = 200'000;
-constexpr std::size_t kManyPlacesInAll = 100'000'000;
+/// Places of the others that are looked at for one branch: few for all branches, then more for those that
+/// are left. And for all of a grammar, for each of its nodes. Past these a branch is kept.
+constexpr std::size_t kPlacesABranch[] = {100'000, 1'000'000, 3'000'000};
+constexpr std::size_t kPlacesANode = 20'000;
 
 class Coverage {
  public:
-    Coverage(const Program& program, int recoverRule) : p_(program), recoverRule_(recoverRule) {}
+    Coverage(const Program& program, int recoverRule) : p_(program), recoverRule_(recoverRule) {
+        findKinds();
+    }
 
     /// Whether `earlier` come to every end that `branch` comes to.
-    bool covers(const std::vector<int>& earlier, int branch) {
+    bool covers(const std::vector<int>& earlier, int branch, std::size_t most) {
         met_.clear();
         open_.clear();
-        bound_ = std::min(looked_ + kManyPlaces, kManyPlacesInAll);
+        bound_ = std::min(looked_ + most, p_.nodes.size() * kPlacesANode);
         Places start;
         for (int node : earlier) start.push_back(place(node, kRuleEnds));
         if (!meet(place(branch, kRuleEnds), std::move(start))) return false;
@@ -50,6 +53,22 @@ class Coverage {
         int node, around;
         int depth;  ///< of calls
     };
+
+    /// Tokens that no node tells apart. The tables' classes are coarser: they only tell what is looked ahead
+    /// for.
+    void findKinds() {
+        std::set<int> alone;
+        for (const Node& n : p_.nodes)
+            if (n.op == Op::Token) alone.insert(n.arg);
+        std::map<std::vector<bool>, int> kinds;
+        for (int token = 0; token < static_cast<int>(p_.classOf.size()); ++token) {
+            std::vector<bool> tells;
+            for (const std::set<int>& set : p_.sets) tells.push_back(set.count(token) != 0);
+            const bool isAlone = alone.count(token) != 0;
+            const int next = static_cast<int>(kinds.size());
+            kindOf_.push_back(isAlone ? -token - 1 : kinds.emplace(std::move(tells), next).first->second);
+        }
+    }
 
     int place(int node, int around) {
         const auto [found, fresh] =
@@ -114,11 +133,8 @@ class Coverage {
                                    [&](int target) { return meet(place(target, around(at)), others); });
             case Op::Token:
                 return take(at, n.arg, others);
-            case Op::Set: {
-                const std::set<int>& tokens = p_.sets[index(n.arg)];
-                return std::all_of(tokens.begin(), tokens.end(),
-                                   [&](int token) { return take(at, token, others); });
-            }
+            case Op::Set:
+                return takeEach(at, others);
             case Op::Call:
                 return call(at, others);
             case Op::End:
@@ -138,6 +154,17 @@ class Coverage {
             return (o.op == Op::Token && o.arg == token) ||
                    (o.op == Op::Set && p_.sets[index(o.arg)].count(token) != 0);
         });
+    }
+
+    /// Each token of a set; of each kind one stands for all.
+    bool takeEach(int at, const Places& others) {
+        Places takers;
+        for (int other : others)
+            if (node(other).op == Op::Token || node(other).op == Op::Set) takers.push_back(other);
+        std::set<int> kinds;
+        for (int token : p_.sets[index(node(at).arg)])
+            if (kinds.insert(kindOf_[index(token)]).second && !take(at, token, takers)) return false;
+        return true;
     }
 
     bool call(int at, const Places& others) {
@@ -165,6 +192,7 @@ class Coverage {
 
     const Program& p_;
     const int recoverRule_;
+    std::vector<int> kindOf_;  ///< by token number
     std::vector<Place> places_;
     std::map<std::pair<int, int>, int> numberOf_;
     std::vector<std::size_t> metBy_;  ///< by place: the turn of closed() that met it last
@@ -179,15 +207,17 @@ class Coverage {
 
 void dropCovered(Program& program, const ParserGrammar& grammar) {
     Coverage coverage(program, grammar.recoverRule);
-    for (Node& n : program.nodes) {
-        std::vector<Branch> kept;
-        std::vector<int> stops;
-        for (Branch& branch : n.branches) {
-            if (!stops.empty() && coverage.covers(stops, branch.stop)) continue;
-            stops.push_back(branch.stop);
-            kept.push_back(std::move(branch));
+    for (const std::size_t most : kPlacesABranch) {
+        for (Node& n : program.nodes) {
+            std::vector<Branch> kept;
+            std::vector<int> stops;
+            for (Branch& branch : n.branches) {
+                if (!stops.empty() && coverage.covers(stops, branch.stop, most)) continue;
+                stops.push_back(branch.stop);
+                kept.push_back(std::move(branch));
+            }
+            n.branches = std::move(kept);
         }
-        n.branches = std::move(kept);
     }
 }
 
