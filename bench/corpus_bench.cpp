@@ -4,8 +4,8 @@
 ///     corpus_bench [--rounds N] [--dialect NAME] [FOLDER]
 ///     corpus_bench --once [--part] --dialect NAME --stage NAME [FOLDER]
 ///
-/// --once is for a profiler: one stage, no clock, of the queries that are read to their end, or with --part of
-/// the others.
+/// --once is for a profiler: one stage, no clock, of the queries that are read to their end, or with --part
+/// of the others.
 ///
 /// Without a folder the queries of bench/plain_queries.jsonl are taken. What goes by "tree" has lexing and
 /// recognising in it, "facade" has "tree" in it, and "analyse" all.
