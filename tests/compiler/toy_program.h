@@ -1,5 +1,8 @@
 #pragma once
 
+#include <gtest/gtest.h>
+#include <unistd.h>
+
 #include <filesystem>
 #include <fstream>
 #include <string>
@@ -20,8 +23,9 @@ struct Toy {
 /// Of these rules, the first of which is `statement`, and these directives. Its tokens are A, B, C, COMMA,
 /// PLUS, LEFT and RIGHT.
 inline Toy toy(const std::string& rules, const std::string& directives = {}) {
-    const std::filesystem::path folder = std::filesystem::path(testing::TempDir()) /
-                                         testing::UnitTest::GetInstance()->current_test_info()->name();
+    // Of this process alone: several builds may be tested at the same time.
+    const std::filesystem::path folder =
+        std::filesystem::path(testing::TempDir()) / ("zr_toy_" + std::to_string(getpid()));
     std::filesystem::create_directories(folder);
     std::ofstream(folder / "toy.tokens") << "A=4\nB=5\nC=6\nCOMMA=7\nPLUS=8\nLEFT=9\nRIGHT=10\n";
     std::ofstream(folder / "toy.grammar") << "parser Toy;\nstart start_rule;\n"
